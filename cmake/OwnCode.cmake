@@ -1,0 +1,15 @@
+# What holds for the code of this project and never for that of a user: its warnings, and the sanitizers of a test build.
+function(mcobnqrt_own_code target)
+  if(NOT PROJECT_IS_TOP_LEVEL)
+    return()
+  endif()
+  target_compile_options(${target} PRIVATE -Wall -Wextra -Wpedantic -Wconversion -Wshadow)
+  if(MCOBNQRT_WERROR)
+    target_compile_options(${target} PRIVATE -Werror)
+  endif()
+  if(MCOBNQRT_SANITIZE)
+    target_compile_options(${target} PRIVATE -fsanitize=${MCOBNQRT_SANITIZE} -fno-sanitize-recover=all
+                                             -fno-omit-frame-pointer)
+    target_link_options(${target} PRIVATE -fsanitize=${MCOBNQRT_SANITIZE})
+  endif()
+endfunction()

@@ -1,0 +1,110 @@
+#ifndef MCOBNQRT_BINALGORITHM_H
+#define MCOBNQRT_BINALGORITHM_H
+
+#include "binning/binbinmerge.h"
+#include "binning/binningdriver.h"
+
+#include <mcobnqrt/binoutput.h>
+#include <mcobnqrt/binsettings.h>
+#include <mcobnqrt/ibinalgorithm.h>
+
+#include <iosfwd>
+#include <set>
+#include <vector>
+
+/// The driver of supervised runs: has the records read once, takes each pair of attribute and target in turn, has its cut
+/// points found, and stores what was found.
+///
+/// The run is in binalgorithm.cpp, the bins of one attribute are in attributebinning.cpp, and the split that finds the cut
+/// points is in entropysplit.cpp. These shapes go through the last two, all of doubles, K being the number of the target's
+/// categories:
+///
+///     value table   R rows of K cells, one row for each interval of values in rising order: weight by target code
+///     row values    R borders, one for each row: its right border if that is closed, else its left border
+///     count vector  K + 1 cells: the total weight, then the weight by target code
+///     cell table    one count vector for each bin of the result
+class BINAlgorithm : public BinningDriver<IBINAlgorithm, BINSettings, BINOutput>
+{
+public:
+    BINAlgorithm(const BINSettings& settings, const BINVarList& varList, Platform* platform = SystemPlatform());
+    ~BINAlgorithm() override;
+
+    MCBinning::MCStatus Run(IBINRecordSource* source, const std::vector<int>* attributes,
+                            const std::vector<int>* targets) override;
+    void Display(std::ostream& os) override;
+
+    /// Bins the current pair with each distinct value of the attribute as a row.
+    ///
+    /// The cut points and the cell table arrive empty, the model entropy as not found. Without a cut point there is one bin,
+    /// with the warning BINStatusNoCutPoints. If the tuples don't fit the rows (a value beyond the largest finite double),
+    /// the warning BINStatusBadBinTable comes back, and nothing is filled.
+    MCBinning::MCStatus BinAttributeDirect(const std::vector<BINSortTuple>* tuples, std::set<double>& cutPoints,
+                                           std::vector<double>& cells, double& modelEntropy);
+
+    /// The same with the bins of an equal-frequency cut list as rows. The list is worked on in place.
+    MCBinning::MCStatus BinAttributePreBinned(const std::vector<BINSortTuple>* tuples, std::vector<double>& cuts,
+                                              std::set<double>& cutPoints, std::vector<double>& cells,
+                                              double& modelEntropy);
+
+    /// Adds the cut points of the rows `first` to `last`, both inclusive, to `cutPoints`.
+    ///
+    /// \return OK, or the error BINStatusBadBinTable, with the set untouched, if there is no table, or it has not one row for
+    ///         each of the row values.
+    MCBinning::MCStatus FindCutPoints(const std::vector<double>* values, const std::vector<double>* table, int first,
+                                      int last, std::set<double>& cutPoints) const;
+
+private:
+    friend class BINAlgorithmPeer; // the unit tests' way in
+
+    using CountVector = std::vector<double>;
+    static constexpr int kNoRow = -1;
+
+    /// What is stored of one pair.
+    struct PairResult
+    {
+        MCBinning::MCStatus fStatus;
+        std::set<double> fCutPoints;
+        std::vector<double> fCells;
+        unsigned int fNumDistinct = 0;
+        double fTotalWeight = 0.0;
+        double fTotalWeightWithMissing = 0.0;
+        double fMinimum = 0.0;
+        double fMaximum = 0.0;
+        double fModelEntropy = 0.0;
+    };
+
+    bool CheckAttributeTargetPairs(const std::vector<int>* attributes, const std::vector<int>* targets);
+    MCBinning::MCStatus CheckPair(int attribute, int target) const;
+    MCBinning::MCStatus CheckAttribute(int attribute) const;
+    MCBinning::MCStatus BinAllAttributes(const std::vector<int>* attributes, const std::vector<int>* targets);
+    MCBinning::MCStatus BinAttributeTargetPair(int attribute, int target);
+    PairResult BinCurrentPair(int attribute, int target);
+    void BinTuples(PairResult& result);
+    void Store(const PairResult& result, int attribute, int target);
+
+    MCBinning::MCStatus BinRows(std::vector<double>& borders, std::set<double>& cutPoints, std::vector<double>& cells,
+                                double& modelEntropy);
+    void FillCells(const std::vector<double>& values, const std::vector<double>& table,
+                   const std::set<double>& cutPoints, std::vector<double>& cells) const;
+    std::vector<BINBinMerge> FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const;
+    void MergeSmallBins(std::vector<double>& cells, std::set<double>& cutPoints) const;
+    void ComputeModelEntropy(const std::vector<double>& cells, double& modelEntropy) const;
+
+    static double Entropy(const CountVector& counts);
+    static double PartitionEntropy(const CountVector& left, const CountVector& right);
+    static double MDLDelta(const CountVector& left, const CountVector& right, double entropy);
+    int FindAcceptedCut(const std::vector<double>& table, int first, int last, CountVector& left,
+                        CountVector& right) const;
+    int FindBestCut(const std::vector<double>& table, int first, int last, CountVector& left, CountVector& right) const;
+    bool IsSamePurePair(const std::vector<double>& table, int row) const;
+    int LastLeftRow(int row) const;
+
+    std::size_t NumCategories() const { return fNumTargetCategories; }
+
+    unsigned int fNumTargetCategories = 1;        ///< K of the current pair
+    std::vector<MCBinning::MCStatus> fPairStatus; ///< a verdict for each entry of the last list
+    int fTargetIndex;                             ///< the list's target, -1 without one
+    std::vector<BINSortTuple>* fTuples = nullptr; ///< the reader's, for the current pair
+};
+
+#endif

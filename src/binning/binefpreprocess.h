@@ -1,0 +1,44 @@
+#ifndef MCOBNQRT_BINEFPREPROCESS_H
+#define MCOBNQRT_BINEFPREPROCESS_H
+
+#include "data/binsorttuple.h"
+#include "data/binvaluetuple.h"
+
+#include <vector>
+
+/// Cuts one attribute's sorted, weighted values into bins of about equal total weight: bin i ends where the share
+/// (i + 1) / numberOfBins of the weight is reached. Equal values are never torn apart, so bins can end up heavier than
+/// their share, and there can be fewer of them than asked for.
+///
+/// One object serves the attributes of a run one after the other and keeps nothing of one for the next. Tuples are only
+/// read; their first `numTuples` elements are the attribute's, in rising order of value.
+class BINEFPreProcess
+{
+public:
+    BINEFPreProcess(int numberOfBins, bool rightBorderClosed);
+    virtual ~BINEFPreProcess();
+
+    /// The cut list for pre-binning: at most numberOfBins - 1 values in rising order, the value at an end of the data among
+    /// them where that value alone holds a share. `cuts` arrives empty, `counts` stays as it is.
+    ///
+    /// \return false, with nothing changed, without tuples, bins or a total weight above 0.
+    bool PreBinEqualFrequency(const std::vector<BINSortTuple>* tuples, unsigned int numTuples,
+                              std::vector<double>& cuts, std::vector<double>& counts, double totalWeight);
+
+    /// The bins themselves: cut points in rising order, and the weight of each bin, none of them 0, one more than there are
+    /// cuts. Both lists arrive empty. \return as above.
+    bool BinEqualFrequency(const std::vector<BINValueTuple>* tuples, unsigned int numTuples, std::vector<double>& cuts,
+                           std::vector<double>& counts, double totalWeight);
+
+private:
+    bool FindEFCutPoints(std::vector<double>& cuts, std::vector<double>& counts, double totalWeight) const;
+
+    bool fRightBorderClosed;
+    int fNumberOfBins;
+    const std::vector<BINValueTuple>* fValueTuples = nullptr; ///< not owned; read in preference to the other
+    const std::vector<BINSortTuple>* fTargetTuples = nullptr; ///< not owned
+    unsigned int fNumValueTuples = 0;
+    unsigned int fNumTargetTuples = 0;
+};
+
+#endif

@@ -1,0 +1,161 @@
+#ifndef MCOBNQRT_BINNINGDRIVER_H
+#define MCOBNQRT_BINNINGDRIVER_H
+
+#include "data/binattributereader.h"
+#include "entry/bincancelmonitor.h"
+#include "entry/makestatus.h"
+#include "metadata/bindatapreparator.h"
+#include "platform/platform.h"
+
+#include <mcobnqrt/binvarlist.h>
+#include <mcobnqrt/ibinrecordsource.h>
+#include <mcobnqrt/mcstatus.h>
+
+#include <algorithm>
+#include <memory>
+#include <ostream>
+#include <string>
+#include <utility>
+#include <vector>
+
+class BINEFPreProcess;
+
+/// What the two drivers share: the copies that they work on, the one preparation of the data, and how statuses travel from
+/// an attribute to the end of a run. `Interface` is the abstract class that the host knows.
+template<class Interface, class Settings, class Output>
+class BinningDriver : public Interface
+{
+public:
+    std::string GetVersionString() override
+    {
+        return "Supervised Binning Component Ver. 1.0 (MCOBNQRT " MCOBNQRT_VERSION ")";
+    }
+    void SetCancelPointer(MCQueryCancel* query) override { fCancelMonitor.SetCancelPointer(query); }
+    void Cancel() override { fCancelMonitor.Cancel(); }
+    void SetProgressListener(ProgressListener* listener) override { fSettings.SetProgressListener(listener); }
+    Output* GetOutput() override { return &fOutput; }
+
+    MCBinning::MCStatus GetStatus() override
+    {
+        NoteCancel(fStatus);
+        return fStatus;
+    }
+
+    Settings* GetSettings() override { return &fSettings; }
+
+    /// The algorithm's own copy of the variable list.
+    virtual BINVarList* GetVarList() { return &fVarList; }
+
+protected:
+    BinningDriver(const Settings& settings, const BINVarList& varList, Platform* platform)
+        : fSettings(settings), fVarList(varList), fCancelMonitor(settings.GetCancelPointer()),
+          fWeightIndex(fVarList.GetWeightIndex()), fPlatform(platform)
+    {
+    }
+
+    BinningDriver(const BinningDriver&) = delete;
+    BinningDriver& operator=(const BinningDriver&) = delete;
+
+    /// Reads and spools the records in the first call that finds one, and gives the outcome of that again in later calls.
+    /// `threshold` is the number of distinct values above which an attribute is pre-binned, 0 for none.
+    MCBinning::MCStatus PrepareOnce(IBINRecordSource* source, TupleKind kind, unsigned int threshold)
+    {
+        if (fDataPreparator != nullptr)
+            return fPreparationStatus;
+        if (source == nullptr || !source->HasNext())
+            return MakeError(MCBinning::BINStatusNoRecords);
+        auto preparator = std::make_unique<BINDataPreparator>(&fVarList, &fCancelMonitor, fSettings.GetTempDirName(),
+                                                              fSettings.GetProgressListener(),
+                                                              fSettings.GetNSkippedCasesReports(), fPlatform);
+        auto reader = std::make_unique<BINAttributeReader>(source, preparator.get(), kind);
+        reader->SetNumDistinctValueThreshold(threshold);
+        fDataPreparator = std::move(preparator);
+        fAttributeReader = std::move(reader);
+
+        // An exception of the host ends the preparation as if there were no record.
+        fPreparationStatus = MakeError(MCBinning::BINStatusNoRecords);
+        fPreparationStatus = fAttributeReader->ReadRecords();
+        fRightBorderClosed = fSettings.IsRightBorderClosed();
+        return fPreparationStatus;
+    }
+
+    /// The end of the work on one attribute or pair: its status reaches the algorithm's.
+    MCBinning::MCStatus CloseStep(MCBinning::MCStatus status)
+    {
+        if (!status.IsOK())
+            fStatus = status;
+        NoteCancel(status);
+        return status;
+    }
+
+    /// The end of a run that wasn't stopped before its first attribute.
+    MCBinning::MCStatus CloseRun(MCBinning::MCStatus status)
+    {
+        if (!fStatus.IsOK())
+            status = MakeWarning(MCBinning::BINStatusSomeResultsFlagged);
+        NoteCancel(status);
+        return status;
+    }
+
+    static bool IsAnyOK(const std::vector<MCBinning::MCStatus>& verdicts)
+    {
+        return std::any_of(verdicts.begin(), verdicts.end(),
+                           [](const MCBinning::MCStatus& verdict) { return verdict.IsOK(); });
+    }
+
+    bool HasVariable(int index) const { return index >= 0 && index < GetNumVariables(); }
+    int GetNumVariables() const { return static_cast<int>(fVarList.Size()); }
+
+    void DisplayAs(const char* className, std::ostream& os) const
+    {
+        os << std::endl << "Start of " << className << " display" << std::endl;
+        os << "Record count: " << fRecordCount << std::endl;
+        os << "out result: ";
+        if (fDataPreparator != nullptr)
+            fDataPreparator->Display(os);
+        fOutput.Display(os);
+        os << "End of " << className << " display" << std::endl;
+    }
+
+private:
+    /// A cancel replaces a status and the algorithm's with it.
+    void NoteCancel(MCBinning::MCStatus& status)
+    {
+        if (fCancelMonitor.IsCancelled())
+            fStatus = status = MakeError(MCBinning::BINStatusCancelled);
+    }
+
+protected:
+    unsigned int fRecordCount = 0; ///< tuples of the attribute or pair treated last
+    bool fRightBorderClosed = true;
+    int fNumberOfBins = 0;
+    Settings fSettings;
+    BINVarList fVarList;
+    MCBinning::MCStatus fStatus; ///< the last of an attribute or pair that was not OK, or cancelled; never OK again
+    BINCancelMonitor fCancelMonitor;
+    MCBinning::MCStatus fPreparationStatus; ///< of the one reading of the source
+    // In this order: the reader closes its files before the preparator removes them.
+    std::unique_ptr<BINDataPreparator> fDataPreparator;
+    std::unique_ptr<BINAttributeReader> fAttributeReader;
+    BINEFPreProcess* fPreProcess = nullptr; ///< alive during the loop over the attributes
+    int fWeightIndex;
+    Output fOutput;
+    Platform* fPlatform;
+};
+
+/// Lends an object to a member for as long as a scope lasts.
+template<class Object>
+class Lend
+{
+public:
+    Lend(Object*& member, Object& object) : fMember(member), fFormer(member) { fMember = &object; }
+    Lend(const Lend&) = delete;
+    Lend& operator=(const Lend&) = delete;
+    ~Lend() { fMember = fFormer; }
+
+private:
+    Object*& fMember;
+    Object* fFormer; ///< not null where the host runs the algorithm again from one of its callbacks
+};
+
+#endif

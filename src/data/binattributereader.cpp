@@ -1,0 +1,247 @@
+#include "data/binattributereader.h"
+
+#include "data/tuplesort.h"
+#include "entry/makestatus.h"
+#include "metadata/bindatapreparator.h"
+
+#include <mcobnqrt/binvarlist.h>
+
+#include <exception>
+
+using MCBinning::BinaryRecordIterator;
+using MCBinning::MCStatus;
+using MCMV::gMissingValue;
+
+namespace
+{
+
+/// Null if there is not the memory.
+template<class Tuple>
+std::unique_ptr<std::vector<Tuple>> MakeTuples(unsigned int count)
+{
+    try
+    {
+        return std::make_unique<std::vector<Tuple>>(count);
+    }
+    catch (const std::exception&)
+    {
+        return nullptr; // the caller's status says so
+    }
+}
+
+} // namespace
+
+BINAttributeReader::BINAttributeReader(IBINRecordSource* source, BINDataPreparator* preparator, TupleKind kind)
+    : fRecordSource(source), fPreparator(preparator), fTupleKind(kind)
+{
+}
+
+BINAttributeReader::~BINAttributeReader() = default;
+
+void BINAttributeReader::SetNumDistinctValueThreshold(unsigned int threshold)
+{
+    if (threshold == 0)
+        return;
+    fUseThreshold = true;
+    fNumDistinctValueThreshold = threshold;
+}
+
+MCStatus BINAttributeReader::ReadRecords()
+{
+    const MCStatus status = fPreparator->PrepareData(fRecordSource);
+    if (status.IsError())
+        return status;
+    const BINVarList& list = *fPreparator->GetVarList();
+    const bool listHasTarget = list.GetTargetIndex() >= 0;
+    fHasWeight = list.GetWeightIndex() >= 0;
+    fHasTarget = fTupleKind == TupleKind::kWithTarget || (fTupleKind == TupleKind::kByList && listHasTarget);
+    fNumRecords = fPreparator->GetNumRecords();
+    fFileNames = fPreparator->GetFileNames();
+
+    if (fHasTarget)
+        fTargetTuples = MakeTuples<BINSortTuple>(fNumRecords);
+    else
+        fValueTuples = MakeTuples<BINValueTuple>(fNumRecords);
+    if (fTargetTuples == nullptr && fValueTuples == nullptr)
+        return MakeError(MCBinning::BINStatusOutOfMemory);
+
+    fVariableIndex = &fPreparator->GetVariableIndex();
+    if (fHasTarget && listHasTarget)
+        fTargetIterator = OpenPosition(fTargetPosition);
+    if (fHasWeight)
+    {
+        fWeightPosition = PositionOf(list.GetWeightIndex());
+        fWeightIterator = OpenPosition(fWeightPosition);
+    }
+    return status; // a file that didn't open is tried again at each read, and fails that read alone
+}
+
+MCStatus BINAttributeReader::IsVariableUsable(int variable, bool* usable) const
+{
+    if (variable < 0)
+        return MakeError(MCBinning::BINStatusTargetUnusable);
+    return fPreparator->IsVariableUsable(PositionOf(variable), usable);
+}
+
+MCStatus BINAttributeReader::GetAttributeTargetData(int attribute, int target, std::vector<BINSortTuple>** tuples)
+{
+    *tuples = nullptr;
+    if (fTargetTuples == nullptr)
+        return MakeError(MCBinning::BINStatusNoRecords);
+    bool isUsable = false;
+    if (IsVariableUsable(target, &isUsable).IsError() || !isUsable)
+        return MakeError(MCBinning::BINStatusTargetUnusable);
+
+    const int targetPosition = PositionOf(target);
+    fNumTargetCats =
+        static_cast<unsigned int>(fPreparator->GetMaxCodes()[static_cast<std::size_t>(targetPosition)]) + 1;
+    if (!PutOn(targetPosition, fTargetIterator, fTargetPosition))
+        return MakeError(MCBinning::BINStatusCannotOpenTempFile);
+    const MCStatus status = LoadVariable(attribute);
+    if (status.IsError())
+        return status;
+    SortAndMeasure(*fTargetTuples);
+    fUseEFAsPreprocess = fUseThreshold && fNumDistinct > fNumDistinctValueThreshold;
+    *tuples = fTargetTuples.get();
+    return status;
+}
+
+MCStatus BINAttributeReader::GetAttributeData(int attribute, std::vector<BINValueTuple>** tuples)
+{
+    *tuples = nullptr;
+    if (fValueTuples == nullptr)
+        return MakeError(MCBinning::BINStatusNoRecords);
+    const MCStatus status = LoadVariable(attribute);
+    if (status.IsError())
+        return status;
+    SortAndMeasure(*fValueTuples);
+    *tuples = fValueTuples.get();
+    return status;
+}
+
+MCStatus BINAttributeReader::TallyBins(const std::vector<double>* cuts, bool rightBorderClosed,
+                                       std::vector<double>& table) const
+{
+    const MCStatus badTable = MakeWarning(MCBinning::BINStatusBadBinTable);
+    if (cuts == nullptr || cuts->empty())
+        return badTable;
+    const std::size_t numBins = cuts->size() - 1;
+    table.assign(numBins * fNumTargetCats, 0.0);
+    std::size_t bin = 0;
+    for (unsigned int i = 0; i < fNumTuples; ++i)
+    {
+        const BINSortTuple& tuple = (*fTargetTuples)[i];
+        // Asked this way round, so that a border that is not a number belongs to no bin.
+        while (bin < numBins &&
+               !(rightBorderClosed ? tuple.fValue <= (*cuts)[bin + 1] : tuple.fValue < (*cuts)[bin + 1]))
+            ++bin;
+        if (bin == numBins)
+            return badTable;
+        table[bin * fNumTargetCats + tuple.fTargetCode] += tuple.fWeight;
+    }
+    return bin + 1 == numBins ? MCStatus() : badTable;
+}
+
+/// -1 for a variable that there is not.
+int BINAttributeReader::PositionOf(int variable) const
+{
+    const std::vector<int>& positions = fPreparator->GetVariableIndex();
+    const auto index = static_cast<std::size_t>(variable);
+    return variable >= 0 && index < positions.size() ? positions[index] : -1;
+}
+
+std::unique_ptr<BinaryRecordIterator> BINAttributeReader::OpenPosition(int position) const
+{
+    const auto index = static_cast<std::size_t>(position);
+    return std::make_unique<Iterator>(fFileNames[index], fPreparator->GetPlatform(),
+                                      &fPreparator->GetSpoolFiles()[index].fIdentity);
+}
+
+/// Puts an iterator on the file of `position`. False if that can't be opened, and then all is as it was.
+bool BINAttributeReader::PutOn(int position, std::unique_ptr<Iterator>& iterator, int& iteratorPosition) const
+{
+    if (iterator != nullptr && iterator->HasFile() && iteratorPosition == position)
+        return true;
+    std::unique_ptr<Iterator> opened = OpenPosition(position);
+    if (!opened->HasFile())
+        return false;
+    iterator = std::move(opened);
+    iteratorPosition = position;
+    return true;
+}
+
+MCStatus BINAttributeReader::LoadVariable(int attribute)
+{
+    const int position = PositionOf(attribute);
+    if (position < 0)
+        return MakeError(MCBinning::BINStatusIndexOutOfRange);
+    if (fPreparator->IsCutShort(position))
+        return AboutIndex(MakeError(MCBinning::BINStatusTooManyCategories), attribute);
+    return LoadAttribute(position);
+}
+
+/// Makes the tuples of one position. The same turn of all files belongs to the same record.
+MCStatus BINAttributeReader::LoadAttribute(int position)
+{
+    fNumTuples = 0;
+    fNumDistinct = 0;
+    fTotalWeight = 0.0;
+    fTotalWeightWithMissing = 0.0;
+    if (fHasWeight && !PutOn(fWeightPosition, fWeightIterator, fWeightPosition))
+        return MakeError(MCBinning::BINStatusCannotOpenTempFile);
+    if (fHasWeight)
+        fWeightIterator->Rewind();
+    if (fHasTarget)
+        fTargetIterator->Rewind();
+    const std::unique_ptr<Iterator> attribute = OpenPosition(position);
+
+    for (unsigned int record = 0; record < fNumRecords; ++record)
+    {
+        if (!HasNextInAll(*attribute))
+            return MakeError(MCBinning::BINStatusCannotOpenTempFile);
+        const double target = fHasTarget ? fTargetIterator->Next() : 0.0;
+        const double weight = fHasWeight ? fWeightIterator->Next() : 1.0;
+        const double value = attribute->Next();
+        if (weight == gMissingValue)
+            continue;
+        fTotalWeightWithMissing += weight;
+        if (target == gMissingValue || value == gMissingValue)
+            continue;
+        fTotalWeight += weight;
+        StoreTuple(value, target, weight);
+    }
+    return MCStatus();
+}
+
+bool BINAttributeReader::HasNextInAll(Iterator& attribute) const
+{
+    return attribute.IsOK() && (!fHasTarget || fTargetIterator->IsOK()) && (!fHasWeight || fWeightIterator->IsOK());
+}
+
+void BINAttributeReader::StoreTuple(double value, double target, double weight)
+{
+    if (fHasTarget)
+        (*fTargetTuples)[fNumTuples] = {value, static_cast<std::uint8_t>(target), weight};
+    else
+        (*fValueTuples)[fNumTuples] = {value, weight};
+    ++fNumTuples;
+}
+
+/// Sorts the current tuples and works out the figures that hang on their order.
+template<class Tuple>
+void BINAttributeReader::SortAndMeasure(std::vector<Tuple>& tuples)
+{
+    SortTuples(tuples, fNumTuples);
+    fMinValue = fMaxValue = gMissingValue;
+    fNumDistinct = 0;
+    if (fNumTuples == 0)
+        return;
+    fNumDistinct = 1;
+    for (unsigned int i = 1; i < fNumTuples; ++i)
+    {
+        if (tuples[i].fValue != tuples[i - 1].fValue)
+            ++fNumDistinct;
+    }
+    fMinValue = tuples[0].fValue;
+    fMaxValue = tuples[fNumTuples - 1].fValue;
+}

@@ -1,0 +1,118 @@
+#include <mcobnqrt/binoutput.h>
+
+#include "results/resultparts.h"
+
+#include <cstddef>
+#include <iterator>
+#include <type_traits>
+
+using MCBinning::MCStatus;
+
+namespace
+{
+
+// What is moved in or out below, after the last allocation, must not fail any more.
+static_assert(std::is_nothrow_move_constructible_v<BINAttributeTargetResults>);
+static_assert(std::is_nothrow_move_assignable_v<BINAttributeTargetResults>);
+
+/// Cuts a flat table into `numRows` rows of the same length; what is left over at its end is dropped.
+std::vector<std::vector<double>> SplitIntoRows(const std::vector<double>& cells, std::size_t numRows)
+{
+    const std::size_t rowLength = cells.size() / numRows;
+    std::vector<std::vector<double>> rows;
+    rows.reserve(numRows);
+    auto next = cells.begin();
+    while (rows.size() < numRows)
+    {
+        const auto end = next + static_cast<std::ptrdiff_t>(rowLength);
+        rows.emplace_back(next, end);
+        next = end;
+    }
+    return rows;
+}
+
+bool IsPair(int attribute, int target)
+{
+    return attribute >= 0 && target >= 0 && attribute != target;
+}
+
+} // namespace
+
+BINOutput::BINOutput() = default;
+
+BINOutput::BINOutput(const BINOutput& other) = default;
+
+BINOutput& BINOutput::operator=(const BINOutput& other)
+{
+    BINOutput copy(other);
+    fResults.swap(copy.fResults);
+    fResultIndex.swap(copy.fResultIndex);
+    return *this;
+}
+
+BINOutput::~BINOutput() = default;
+
+MCStatus BINOutput::SetAttributeTargetResults(MCStatus status, const std::set<double>& cutPoints,
+                                              const std::vector<double>& cellCounts, int attribute, int target,
+                                              unsigned int nDistinctValues, double totalWeight,
+                                              double totalWeightWithMissing, double minimum, double maximum,
+                                              double modelEntropy)
+{
+    if (!IsPair(attribute, target))
+        return StoreError(MCBinning::BINStatusIndexOutOfRange);
+
+    BINAttributeTargetResults entry;
+    entry.fStatus = status;
+    entry.fAttributeIndex = attribute;
+    entry.fTargetIndex = target;
+    entry.fCutPoints.assign(cutPoints.begin(), cutPoints.end());
+    entry.fCellCounts = SplitIntoRows(cellCounts, cutPoints.size() + 1);
+    entry.fNDistinctValues = nDistinctValues;
+    entry.fTotalWeight = totalWeight;
+    entry.fTotalWeightWithMissing = totalWeightWithMissing;
+    entry.fMinimum = minimum;
+    entry.fMaximum = maximum;
+    entry.fModelEntropy = modelEntropy;
+
+    // The node of the index is allocated ahead of the entry, and linking it in can't throw: both fields grow, or
+    // neither does. A pair that has an entry already keeps its node, so that its first entry is the one that is found.
+    decltype(fResultIndex) node;
+    node.emplace(std::make_pair(attribute, target), static_cast<int>(fResults.size()));
+    fResults.push_back(std::move(entry));
+    fResultIndex.merge(node);
+    return MCStatus();
+}
+
+MCStatus BINOutput::GetAttributeTargetCutPoints(int attribute, int target, BINAttributeTargetResults& results) const
+{
+    // Only pairs are ever stored, so what is none is not found.
+    const auto found = fResultIndex.find({attribute, target});
+    if (found == fResultIndex.end())
+        return StoreError(MCBinning::BINStatusIndexOutOfRange);
+    return CopyEntry(fResults[static_cast<std::size_t>(found->second)], results);
+}
+
+MCStatus BINOutput::GetAttributeCutPoints(int attribute, std::vector<BINAttributeTargetResults>& results) const
+{
+    std::vector<BINAttributeTargetResults> found;
+    for (const BINAttributeTargetResults& entry : fResults)
+        if (entry.GetAttributeIndex() == attribute)
+            found.push_back(entry);
+    if (found.empty())
+        return StoreError(MCBinning::BINStatusIndexOutOfRange);
+
+    const MCStatus lastStatus = found.back().GetStatus();
+    results.reserve(results.size() + found.size()); // the last allocation
+    std::move(found.begin(), found.end(), std::back_inserter(results));
+    return lastStatus;
+}
+
+MCStatus BINOutput::GetAllCutPoints(std::vector<BINAttributeTargetResults>& results) const
+{
+    return CopyAllEntries(fResults, results);
+}
+
+void BINOutput::Display(std::ostream& os) const
+{
+    DisplayEntries(os, "BINOutput", fResults);
+}
