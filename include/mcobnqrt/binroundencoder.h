@@ -35,8 +35,8 @@ public:
     IBINEncoder* Clone() const override;
     void Display(std::ostream& os) const override;
 
-    /// The rounded weight; halves go up with RoundClosest. MCMV::gMissingValue if the weight is that or user-missing, or
-    /// if it isn't above 0 after rounding.
+    /// The rounded weight; halves go up with RoundClosest. MCMV::gMissingValue if the weight is that or user-missing,
+    /// or if it isn't above 0 after rounding.
     double Encode(double weight) const;
 
 private:

@@ -13,9 +13,9 @@ class IBINEncoder;
 
 /// The host's description of its data: variables in the order of the fields of its records.
 ///
-/// A variable's index, from 0, is its place in the list and its field in a record. The list makes its variables and owns
-/// them; what it hands out by pointer stays its own. The factories copy the list, so an algorithm doesn't see what is
-/// changed afterwards.
+/// A variable's index, from 0, is its place in the list and its field in a record. The list makes its variables and
+/// owns them; what it hands out by pointer stays its own. The factories copy the list, so an algorithm doesn't see
+/// what is changed afterwards.
 ///
 /// Names are unique, compared byte by byte, among all but the weight variable. The list has one target index and one
 /// weight index, -1 where there is none. The role is a property of each variable, and more than one may be a target by
@@ -37,14 +37,15 @@ public:
     /// Appends a categorical variable with this number of categories, the values of which the host encodes later. With
     /// RoleTarget it becomes the list's target, also if there was one.
     ///
-    /// \return its index, or -1, and nothing is added, if the name is empty or taken or the role is RoleFrequencyWeight.
+    /// \return its index, or -1, and nothing is added, if the name is empty or taken or the role is
+    ///         RoleFrequencyWeight.
     /// \throw std::length_error, and nothing is added, if `numberOfCategories` is negative.
     int AddCatVar(const std::string& name, const std::string& label, int numberOfCategories,
                   IBINVariable::MeasureLevel level, IBINVariable::VariableRole role);
 
-    /// Appends a categorical variable of numbers or strings and encodes its values, so that each one's code is its place
-    /// among the distinct ones. The number of categories is that of `values`, repeated ones included. `labels` are in the
-    /// order of the codes.
+    /// Appends a categorical variable of numbers or strings and encodes its values, so that each one's code is its
+    /// place among the distinct ones. The number of categories is that of `values`, repeated ones included. `labels`
+    /// are in the order of the codes.
     ///
     /// \return its index, or -1, and nothing is added, as above or if there are fewer than 2 values.
     int AddCatVar(const std::string& name, const std::string& label, const std::vector<double>& values,
@@ -85,8 +86,8 @@ public:
 
     int GetNumAttributeVars() const;
 
-    /// The number of categories of the first variable of RoleTarget, which need not be the one at the target index; 0 if
-    /// there is none.
+    /// The number of categories of the first variable of RoleTarget, which need not be the one at the target index; 0
+    /// if there is none.
     int GetNTargetCats() const;
 
     /// RoleUndefined if there is no such index.
@@ -104,22 +105,23 @@ public:
     /// Raises each variable's number of categories to what its encoder has seen. \return their sum.
     int UpdateNumbersOfCategories();
 
-    /// Gives the names of all attributes, in order, and that of the last variable of RoleTarget; `target` is left alone if
-    /// there is none.
+    /// Gives the names of all attributes, in order, and that of the last variable of RoleTarget; `target` is left
+    /// alone if there is none.
     void GetVarNames(std::vector<std::string>& attributes, std::string& target) const;
 
-    /// Removes the variable. Every later one moves down by one, and with it the field of the host's record that belongs to
-    /// it; the target and weight indices follow their variables.
+    /// Removes the variable. Every later one moves down by one, and with it the field of the host's record that
+    /// belongs to it; the target and weight indices follow their variables.
     ///
-    /// To remove the target or any variable of RoleTarget leaves the list without a target, even if another variable has
-    /// that role. Pointers to the removed variable dangle, those to the others stay good.
+    /// To remove the target or any variable of RoleTarget leaves the list without a target, even if another variable
+    /// has that role. The counter that goes down is the one that the measure level names. Pointers to the removed
+    /// variable dangle, those to the others stay good.
     ///
     /// \return false, and nothing has changed, if there is no such variable.
     bool RemoveVar(int index);
     bool RemoveVar(std::string name);
 
-    /// Declares one value of the variable to be missing, beside those declared before: a number for any variable but one
-    /// of MeasureStringCategorical, a string for that one only.
+    /// Declares one value of the variable to be missing, beside those declared before: a number for any variable but
+    /// one of MeasureStringCategorical, a string for that one only.
     ///
     /// \return false, and nothing has changed, if there is no such index or the variable doesn't take such a value.
     bool AddDiscreteUserMissing(int index, double value, const std::string& label);
@@ -127,18 +129,18 @@ public:
 
     /// Declares the numbers from `left` to `right`, both included, to be missing, beside the values declared before.
     ///
-    /// \return false, and nothing has changed, if there is no such index, if the variable takes no numbers, or if it has
-    ///         an interval already.
+    /// \return false, and nothing has changed, if there is no such index, if the variable takes no numbers, or if it
+    ///         has an interval already.
     bool SetMissingInterval(int index, double left, double right);
 
     /// Whether the list can be worked with: at least one attribute, and no categorical variable with fewer than 2
-    /// categories. The indices of the latter go into the two lists, what these held before is gone; both are empty for a
-    /// list without an attribute. Raises the numbers of categories first, as UpdateNumbersOfCategories does.
+    /// categories. The indices of the latter go into the two lists, what these held before is gone; both are empty
+    /// for a list without an attribute. Raises the numbers of categories first, as UpdateNumbersOfCategories does.
     bool IsValidList(std::vector<int>& oneCategory, std::vector<int>& noCategories) const;
 
-    /// Whether `other` describes the same variables in the same way: names, labels, roles and levels, and for attributes
-    /// and targets the user-missing values; the categorical ones among these must know as many categories as their
-    /// encoders have seen, on both sides. The categories themselves are not compared.
+    /// Whether `other` describes the same variables in the same way: names, labels, roles and levels, and for
+    /// attributes and targets the user-missing values; the categorical ones among these must know as many categories
+    /// as their encoders have seen, on both sides. The categories themselves are not compared.
     ///
     /// \param badIndex set only if the result is false: to the first variable that differs, or to the smaller size or
     ///        target index if these differ.

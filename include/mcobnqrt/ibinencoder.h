@@ -11,9 +11,9 @@ class IBINUserMissing;
 
 /// Turns a raw value of a variable into the number that stands for it.
 ///
-/// A category becomes a code: 0, 1, 2, ... in the order in which the values are first seen, in a double; -1.0 stands for
-/// a missing category. The host encodes its categories and puts the codes into its records. A weight, which goes into the
-/// record as it is, is rounded when the records are read.
+/// A category becomes a code: 0, 1, 2, ... in the order in which the values are first seen, in a double; -1.0 stands
+/// for a missing category. The host encodes its categories and puts the codes into its records. A weight, which goes
+/// into the record as it is, is rounded when the records are read.
 ///
 /// Encode, EncodeConst and Decode stand on the concrete classes: GetEncoderType tells which class it is.
 class MCOBNQRT_EXPORT IBINEncoder
@@ -48,11 +48,11 @@ public:
     /// The labels in the order of the codes, perhaps too few or too many; null where there are none by nature.
     virtual const std::vector<std::string>* GetValueLabels() const = 0;
 
-    /// Declares the values that count as missing; what was declared before is gone. Null declares that there are none. A
-    /// value that has become a category already keeps its code, but is no longer given it.
+    /// Declares the values that count as missing; what was declared before is gone. Null declares that there are
+    /// none. A value that has become a category already keeps its code, but is no longer given it.
     ///
-    /// The categorical encoders own the object from now on; BINRoundEncoder only borrows it. To hand over the object that
-    /// is held already changes nothing.
+    /// The categorical encoders own the object from now on; BINRoundEncoder only borrows it. To hand over the object
+    /// that is held already changes nothing.
     ///
     /// \return false if the object is of the wrong data type: nothing has changed, and it stays the caller's.
     virtual bool SetUserMissingInfo(IBINUserMissing* userMissing) = 0;

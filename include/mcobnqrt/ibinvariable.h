@@ -55,8 +55,8 @@ public:
     virtual std::string GetVariableLabel() const = 0;
     virtual void SetVariableLabel(const std::string& label) = 0;
 
-    /// How many categories the variable is known to have, which may be fewer than its encoder has seen; 0 for a variable
-    /// that isn't categorical.
+    /// How many categories the variable is known to have, which may be fewer than its encoder has seen; 0 for a
+    /// variable that isn't categorical.
     virtual int GetNumberOfCategories() const = 0;
 
     virtual VariableRole GetVariableRole() const = 0;

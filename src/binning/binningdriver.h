@@ -4,6 +4,7 @@
 #include "data/binattributereader.h"
 #include "entry/bincancelmonitor.h"
 #include "entry/makestatus.h"
+#include "entry/version.h"
 #include "metadata/bindatapreparator.h"
 #include "platform/platform.h"
 
@@ -26,10 +27,7 @@ template<class Interface, class Settings, class Output>
 class BinningDriver : public Interface
 {
 public:
-    std::string GetVersionString() override
-    {
-        return "Supervised Binning Component Ver. 1.0 (MCOBNQRT " MCOBNQRT_VERSION ")";
-    }
+    std::string GetVersionString() override { return GetComponentVersion(); }
     void SetCancelPointer(MCQueryCancel* query) override { fCancelMonitor.SetCancelPointer(query); }
     void Cancel() override { fCancelMonitor.Cancel(); }
     void SetProgressListener(ProgressListener* listener) override { fSettings.SetProgressListener(listener); }

@@ -1,3 +1,5 @@
+// The comparison of two lists, from one pair of variables up to the whole.
+
 #include <mcobnqrt/binvarlist.h>
 
 #include <mcobnqrt/ibinencoder.h>
@@ -5,8 +7,6 @@
 
 #include <algorithm>
 #include <cstddef>
-
-/// The comparison of two lists, from one pair of variables up to the whole.
 
 namespace
 {

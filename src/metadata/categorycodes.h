@@ -10,14 +10,14 @@
 
 class IBINUserMissing;
 
-/// What the two categorical encoders share. Both hold a map from value to code and a table from code to value, and give
-/// the codes 0 to lastCode in the order of first sight.
+// What the two categorical encoders share. Both hold a map from value to code and a table from code to value, and give
+// the codes 0 to lastCode in the order of first sight.
 
 /// The code of a missing category.
 inline constexpr double kMissingCode = -1.0;
 
-/// The code of `value`; a new value gets the next one, and `entryOf` makes its entry of the table from the map's key. If
-/// the memory doesn't suffice, nothing has changed.
+/// The code of `value`; a new value gets the next one, and `entryOf` makes its entry of the table from the map's key.
+/// If the memory doesn't suffice, nothing has changed.
 template<class Value, class Entry, class EntryOf>
 double FindOrAddCode(std::map<Value, int>& codes, std::vector<Entry>& table, int& lastCode, const Value& value,
                      EntryOf entryOf)
@@ -43,7 +43,8 @@ double FindCode(const std::map<Value, int>& codes, const Value& value)
 /// Replaces all labels.
 void ReplaceLabels(std::vector<std::string>& labels, const std::vector<std::string>& replacement);
 
-/// Fills `labels` up to the number of categories with empty ones and sets the one of `code`, if there is such a category.
+/// Fills `labels` up to the number of categories with empty ones and sets the one of `code`, if there is such a
+/// category.
 void StoreLabel(std::vector<std::string>& labels, int numberOfCategories, int code, const std::string& label);
 
 /// Writes an encoder's user-missing object under its heading, nothing without one. The weight's encoder does so too.

@@ -9,7 +9,7 @@
 #include <utility>
 #include <vector>
 
-/// The single values of a user-missing object, numbers or strings, and their labels: two vectors in step.
+// The single values of a user-missing object, numbers or strings, and their labels: two vectors in step.
 
 /// Appends to both, or to none if the memory doesn't suffice. Value and label may be elements of the vectors.
 template<class Value>

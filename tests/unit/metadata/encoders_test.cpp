@@ -93,7 +93,9 @@ TEST(Encoders, KeepTheirUserMissingObjectWhenTheyRefuseAnotherOrGetItAgain)
 
 TEST(CategoricalEncoders, CopiesOutliveAndIgnoreTheirSource)
 {
-    auto source = std::make_unique<BINStringEncoder>(std::vector<std::string>{"z", "a"});
+    // Longer than what a string holds in itself, so that a read of the source's memory shows under AddressSanitizer.
+    const std::string longValue(100, 'a');
+    auto source = std::make_unique<BINStringEncoder>(std::vector<std::string>{"z", longValue});
     source->SetValueLabels({"Z", "A"});
     ASSERT_TRUE(source->SetUserMissingInfo(Missing<BINStringUserMissing>("x").release()));
     BINStringEncoder copy(*source);
@@ -104,7 +106,7 @@ TEST(CategoricalEncoders, CopiesOutliveAndIgnoreTheirSource)
 
     for (BINStringEncoder* encoder : {&copy, &assigned})
     {
-        EXPECT_EQ("a", encoder->Decode(1));
+        EXPECT_EQ(longValue, encoder->Decode(1));
         EXPECT_EQ("A", encoder->GetValueLabels()->at(1));
         EXPECT_EQ(-1.0, encoder->Encode("x"));
         EXPECT_EQ(2.0, encoder->Encode("old"));

@@ -91,6 +91,7 @@ TEST(WeightVar, ItsEncoderBorrowsWhatItOwnsAlsoInACopy)
     for (BINWeightVar* variable : {&copy, &assigned})
     {
         EXPECT_EQ("w", variable->GetVariableName());
+        EXPECT_EQ(MCMV::gMissingValue, EncodedWeight(*variable, 5.0));
         EXPECT_TRUE(variable->SetUserMissingInfo(variable->GetUserMissingInfo()));
         EXPECT_EQ(MCMV::gMissingValue, EncodedWeight(*variable, 5.0));
         EXPECT_EQ(2.0, EncodedWeight(*variable, 2.9));

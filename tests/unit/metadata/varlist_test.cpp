@@ -97,7 +97,10 @@ TEST(VarList, ASecondTargetTakesTheIndexWhenAddedButNotWhenARoleIsSet)
     EXPECT_EQ(std::vector<std::string>{"region"}, attributes);
     EXPECT_EQ("paid", target);
 
-    // No successor, though two variables still have the role.
+    // No successor, though two variables still have the role and the index named one of them.
+    BINVarList shorter(list);
+    ASSERT_TRUE(shorter.RemoveVar(0));
+    EXPECT_EQ(-1, shorter.GetTargetIndex());
     ASSERT_TRUE(list.SetVariableRole(0, kAttribute));
     EXPECT_EQ(-1, list.GetTargetIndex());
     EXPECT_EQ(nullptr, list.GetTargetVariable());

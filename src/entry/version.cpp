@@ -1,0 +1,6 @@
+#include "entry/version.h"
+
+std::string GetComponentVersion()
+{
+    return "Supervised Binning Component Ver. 1.0 (MCOBNQRT " MCOBNQRT_VERSION ")";
+}

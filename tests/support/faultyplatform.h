@@ -1,0 +1,77 @@
+#ifndef MCOBNQRT_TESTS_FAULTYPLATFORM_H
+#define MCOBNQRT_TESTS_FAULTYPLATFORM_H
+
+#include "platform/platform.h"
+
+#include <functional>
+
+/// The real platform, but for the call that a test makes fail: the n-th of all that can fail, counted from 1, and with
+/// `fFromThenOn` every one behind it too. RemoveFile works always: what fails there is nobody's to report.
+class FaultyPlatform : public Platform
+{
+public:
+    int fFailingCall = 0; ///< 0: none
+    bool fFromThenOn = false;
+    int fNumCalls = 0;
+    bool fHasFired = false;
+    std::int64_t fTick = 0; ///< of the clock, if it is not 0
+
+    std::int64_t GetTickCount() override { return fTick != 0 ? fTick : fReal->GetTickCount(); }
+
+    NameState ProbeName(const std::string& path) override
+    {
+        return Fails() ? NameState::kTooManyOpenFiles : fReal->ProbeName(path);
+    }
+
+    NameState CreateNewFile(const std::string& path, std::FILE*& file, FileIdentity& identity) override
+    {
+        return Fails() ? NameState::kFailed : fReal->CreateNewFile(path, file, identity);
+    }
+
+    std::FILE* OpenForAppending(const std::string& path, const FileIdentity& identity, std::uint64_t size) override
+    {
+        return Fails() ? nullptr : fReal->OpenForAppending(path, identity, size);
+    }
+
+    std::FILE* OpenForReading(const std::string& path, const FileIdentity* identity) override
+    {
+        return Fails() ? nullptr : fReal->OpenForReading(path, identity);
+    }
+
+    std::size_t ReadDoubles(double* values, std::size_t count, std::FILE* file) override
+    {
+        return Fails() ? 0 : fReal->ReadDoubles(values, count, file);
+    }
+
+    std::size_t WriteDoubles(const double* values, std::size_t count, std::FILE* file) override
+    {
+        return fReal->WriteDoubles(values, Fails() ? count / 2 : count, file);
+    }
+
+    bool RewindFile(std::FILE* file) override { return !Fails() && fReal->RewindFile(file); }
+
+    /// A close that fails closes the file all the same.
+    bool CloseFile(std::FILE* file) override
+    {
+        const bool isClosed = fReal->CloseFile(file);
+        return !Fails() && isClosed;
+    }
+
+    void RemoveFile(const std::string& path, const FileIdentity& identity) override
+    {
+        fReal->RemoveFile(path, identity);
+    }
+
+private:
+    bool Fails()
+    {
+        ++fNumCalls;
+        const bool fails = fNumCalls == fFailingCall || (fFromThenOn && fFailingCall > 0 && fNumCalls > fFailingCall);
+        fHasFired = fHasFired || fails;
+        return fails;
+    }
+
+    Platform* fReal = SystemPlatform();
+};
+
+#endif

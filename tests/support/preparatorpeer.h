@@ -1,0 +1,58 @@
+#ifndef MCOBNQRT_TESTS_PREPARATORPEER_H
+#define MCOBNQRT_TESTS_PREPARATORPEER_H
+
+#include "data/binaryrecorditerator.h"
+#include "entry/bincancelmonitor.h"
+#include "metadata/bindatapreparator.h"
+#include "support/faultyplatform.h"
+#include "support/hostdata.h"
+#include "support/tempdir.h"
+
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+/// A data preparator in a directory of its own, and the way to what it keeps to itself.
+class BINDataPreparatorPeer
+{
+public:
+    explicit BINDataPreparatorPeer(const BINVarList& list, ProgressListener* listener = nullptr, int interval = 0,
+                                   MCQueryCancel* query = nullptr)
+        : fList(list), fMonitor(query),
+          fPreparator(&fList, &fMonitor, fDirectory.Path(), listener, interval, &fPlatform)
+    {
+    }
+
+    /// What the temporary file of a position holds.
+    std::vector<double> Values(int position) const
+    {
+        std::vector<double> values;
+        MCBinning::BinaryRecordIterator iterator(fPreparator.GetFileNames()[static_cast<std::size_t>(position)]);
+        while (iterator.IsOK()) values.push_back(iterator.Next());
+        return values;
+    }
+
+    bool IsUsable(int position) const
+    {
+        bool isUsable = false;
+        EXPECT_TRUE(fPreparator.IsVariableUsable(position, &isUsable).IsOK());
+        return isUsable;
+    }
+
+    std::vector<int> InputIndices() const { return fPreparator.fInputIndices; }
+    int WeightNewIndex() const { return fPreparator.fWeightNewIndex; }
+
+    BINDataPreparator* operator->() { return &fPreparator; }
+    BINDataPreparator& operator*() { return fPreparator; }
+
+    TempDir fDirectory;
+    FaultyPlatform fPlatform;
+
+private:
+    BINVarList fList;
+    BINCancelMonitor fMonitor;
+    BINDataPreparator fPreparator;
+};
+
+#endif

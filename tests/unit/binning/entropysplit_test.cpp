@@ -1,0 +1,185 @@
+#include "oracle/plainsplit.h"
+#include "support/algorithmpeer.h"
+#include "support/hostdata.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+
+namespace
+{
+
+using Rows = std::vector<std::vector<double>>;
+
+/// The row values 1, 2, 3, ...
+std::vector<double> ValuesFor(const Rows& rows)
+{
+    std::vector<double> values;
+    for (std::size_t row = 0; row < rows.size(); ++row) values.push_back(static_cast<double>(row) + 1.0);
+    return values;
+}
+
+std::set<double> CutPoints(const Rows& rows, bool rightBorderClosed)
+{
+    std::vector<double> table;
+    for (const auto& row : rows) table.insert(table.end(), row.begin(), row.end());
+    return BINAlgorithmPeer(static_cast<int>(rows.front().size()), rightBorderClosed).CutPoints(ValuesFor(rows), table);
+}
+
+std::set<double> PlainCutPoints(const Rows& rows, bool rightBorderClosed)
+{
+    return PlainSplit(ValuesFor(rows), rows, rightBorderClosed).CutPoints();
+}
+
+/// What a random table's cells hold.
+enum class Cells
+{
+    kWhole,
+    kFractional,
+    kTinyTotal, ///< the ranges weigh about 1 to 2
+    kFarApart   ///< of very different magnitude
+};
+
+double RandomWeight(Dice& dice, Cells kind)
+{
+    switch (kind)
+    {
+    case Cells::kWhole:
+        return 1 + dice.Below(6);
+    case Cells::kFractional:
+        return 0.01 + dice.Fraction() * 3;
+    case Cells::kTinyTotal:
+        return 0.25 * (1 + dice.Below(3));
+    case Cells::kFarApart:
+        break;
+    }
+    return std::ldexp(1.0 + dice.Fraction(), dice.Below(120) - 60);
+}
+
+/// Rows that lean to a category which changes now and then, with runs of pure rows and some empty ones.
+Rows RandomRows(Dice& dice, int numRows, int numCategories, Cells kind)
+{
+    Rows rows;
+    int leaning = 0;
+    for (int i = 0; i < numRows; ++i)
+    {
+        if (dice.Below(4) == 0)
+            leaning = dice.Below(numCategories);
+        std::vector<double> row(static_cast<std::size_t>(numCategories), 0.0);
+        if (dice.Below(8) != 0)
+            row[static_cast<std::size_t>(leaning)] = RandomWeight(dice, kind);
+        if (dice.Below(3) == 0)
+            row[static_cast<std::size_t>(dice.Below(numCategories))] += RandomWeight(dice, kind);
+        rows.push_back(row);
+    }
+    return rows;
+}
+
+} // namespace
+
+TEST(EntropySplit, WorkedFiguresOfTheCriterion)
+{
+    struct Case
+    {
+        double fMajor, fMinor, fPartition, fDelta;
+        bool fIsSplit;
+    };
+    // The fourth would pass with the categories counted once: log2(3^2 - 2) in place of log2(3^4 - 2).
+    for (const Case& c : {Case{1, 0, 0.0, 0.807355, true}, Case{10, 0, 0.0, 0.807355, true},
+                          Case{14, 3, 0.672295, 4.992960, true}, Case{13, 3, 0.696212, 5.088630, false}})
+    {
+        SCOPED_TRACE(c.fMajor);
+        const std::vector<double> left{c.fMajor + c.fMinor, c.fMajor, c.fMinor};
+        const std::vector<double> right{c.fMajor + c.fMinor, c.fMinor, c.fMajor};
+        const std::vector<double> both{2 * (c.fMajor + c.fMinor), c.fMajor + c.fMinor, c.fMajor + c.fMinor};
+
+        EXPECT_EQ(1.0, BINAlgorithmPeer::Entropy(both));
+        EXPECT_NEAR(c.fPartition, BINAlgorithmPeer::PartitionEntropy(left, right), 1e-6);
+        EXPECT_NEAR(c.fDelta, BINAlgorithmPeer::MDLDelta(left, right, 1.0), 1e-6);
+        const Rows rows{{c.fMajor, c.fMinor}, {c.fMinor, c.fMajor}};
+        EXPECT_EQ(c.fIsSplit ? std::set<double>{1.0} : std::set<double>{}, CutPoints(rows, true));
+        EXPECT_EQ(c.fIsSplit ? std::set<double>{2.0} : std::set<double>{}, CutPoints(rows, false));
+    }
+}
+
+TEST(EntropySplit, TablesThatGiveNoCut)
+{
+    const std::vector<Rows> tables{
+        {{5, 5}},               // one row
+        {{1000, 0}, {1000, 0}}, // pure in one category
+        {{1, 1}, {2, 2}},       // no information
+        {{7}, {9}, {4}},        // one category
+        {{0.3, 0}, {0, 0.3}},   // lighter than 1: the logarithm of a negative number
+        {{0, 0}, {0, 0}},       // no weight at all
+    };
+    for (const Rows& rows : tables)
+    {
+        SCOPED_TRACE(testing::PrintToString(rows));
+        EXPECT_TRUE(CutPoints(rows, true).empty());
+        EXPECT_TRUE(CutPoints(rows, false).empty());
+    }
+}
+
+TEST(EntropySplit, WeightOfExactlyOneAlwaysPasses)
+{
+    // log2(1 - 1) is minus infinity, and so is the threshold.
+    EXPECT_EQ(std::set<double>{1.0}, CutPoints({{0.5, 0}, {0, 0.5}}, true));
+    EXPECT_EQ(std::set<double>{2.0}, CutPoints({{0.5, 0}, {0, 0.5}}, false));
+}
+
+TEST(EntropySplit, LightRangeWithoutTwoSidesEnds)
+{
+    // An empty pre-bin beside a weight of 1: only the cut in front of all rows is best, and it would bring the range back.
+    EXPECT_TRUE(CutPoints({{0, 0}, {1, 0}}, false).empty());
+    EXPECT_EQ(std::set<double>{1.0}, CutPoints({{0, 0}, {1, 0}}, true));
+}
+
+TEST(EntropySplit, LowestOfEqualRowsIsCut)
+{
+    // The cuts behind the first and behind the second row are mirror images.
+    EXPECT_EQ(*PlainCutPoints({{40, 0}, {20, 20}, {0, 40}}, true).begin(), 1.0);
+    EXPECT_EQ(*CutPoints({{40, 0}, {20, 20}, {0, 40}}, true).begin(), 1.0);
+}
+
+TEST(EntropySplit, MisfittingTablesAreErrors)
+{
+    const BINAlgorithmPeer peer(2, true);
+    const std::vector<double> values{1, 2};
+    const std::vector<double> table{1, 0, 0, 1, 5, 5};
+    std::set<double> cutPoints{42.0};
+    for (const auto& [v, t] :
+         {std::pair(&values, &table), std::pair<decltype(&values), decltype(&table)>(nullptr, &table),
+          std::pair<decltype(&values), decltype(&table)>(&values, nullptr)})
+    {
+        const MCBinning::MCStatus status = peer.Algorithm().FindCutPoints(v, t, 0, 1, cutPoints);
+        EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusBadBinTable, false), status);
+        EXPECT_EQ(std::set<double>{42.0}, cutPoints);
+    }
+}
+
+TEST(EntropySplit, EqualsThePlainFormOnRandomTables)
+{
+    int numWithCuts = 0;
+    int numCases = 0;
+    for (const Cells kind : {Cells::kWhole, Cells::kFractional, Cells::kTinyTotal, Cells::kFarApart})
+    {
+        for (unsigned int seed = 1; seed <= 1000; ++seed)
+        {
+            Dice dice(seed);
+            const int numCategories = seed % 50 == 0 ? 256 : 1 + dice.Below(seed % 5 == 0 ? 20 : 4);
+            const int numRows = kind == Cells::kTinyTotal ? 2 + dice.Below(4) : 2 + dice.Below(60);
+            Rows rows = RandomRows(dice, numRows, numCategories, kind);
+            if (seed % 7 == 0) // a mirror image: every cut has a twin of equal entropy
+                for (int i = numRows - 1; i >= 0; --i) rows.push_back(rows[static_cast<std::size_t>(i)]);
+            for (const bool rightBorderClosed : {true, false})
+            {
+                const std::set<double> plain = PlainCutPoints(rows, rightBorderClosed);
+                ASSERT_EQ(plain, CutPoints(rows, rightBorderClosed))
+                    << "kind " << static_cast<int>(kind) << " seed " << seed << " closed " << rightBorderClosed;
+                numWithCuts += plain.empty() ? 0 : 1;
+                ++numCases;
+            }
+        }
+    }
+    EXPECT_GT(numWithCuts, numCases / 4) << "the tables are too dull to tell anything";
+}

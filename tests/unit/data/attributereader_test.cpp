@@ -1,0 +1,161 @@
+#include "data/binattributereader.h"
+#include "support/preparatorpeer.h"
+
+#include <gtest/gtest.h>
+
+using MCMV::gMissingValue;
+
+namespace
+{
+
+/// A reader over the records, ready for reads.
+class LoadedReader
+{
+public:
+    LoadedReader(const BINVarList& list, RecordTable records, TupleKind kind = TupleKind::kByList)
+        : fRecords(std::move(records)), fPreparator(list), fReader(&fRecords, &*fPreparator, kind)
+    {
+        EXPECT_TRUE(fReader.ReadRecords().IsOK());
+    }
+
+    std::vector<BINSortTuple>& Pair(int attribute, int target)
+    {
+        std::vector<BINSortTuple>* tuples = nullptr;
+        EXPECT_TRUE(fReader.GetAttributeTargetData(attribute, target, &tuples).IsOK());
+        return *tuples;
+    }
+
+    BINAttributeReader* operator->() { return &fReader; }
+
+private:
+    RecordTable fRecords;
+    BINDataPreparatorPeer fPreparator;
+    BINAttributeReader fReader; // before the preparator in destruction: its files are closed when they go
+};
+
+/// Fields of a record: attribute, target, weight, attribute.
+BINVarList FullList()
+{
+    return AVarList().WithAttribute("x").WithTarget("t", 6).WithWeight().WithAttribute("y");
+}
+
+} // namespace
+
+TEST(AttributeReader, JoinsSortsAndLeavesOutWhatIsMissing)
+{
+    LoadedReader reader(FullList(),
+                        {{3, 0, 2, 1}, {1, 5, 1, 1}, {gMissingValue, 0, 4, 1}, {2, -1, 8, 1}, {1, 0, 16, 1}});
+
+    const std::vector<BINSortTuple>& tuples = reader.Pair(0, 1);
+
+    ASSERT_EQ(3U, reader->GetNumTuples());
+    EXPECT_EQ((std::vector<double>{1, 1, 3}),
+              (std::vector<double>{tuples[0].fValue, tuples[1].fValue, tuples[2].fValue}));
+    EXPECT_EQ(2U, reader->GetNumDistinct());
+    EXPECT_EQ(6U, reader->GetNumTargetCats()) << "largest code + 1, whether or not those between occur";
+    EXPECT_EQ(19.0, reader->GetTotalWeight());
+    EXPECT_EQ(31.0, reader->GetTotalWeightWithMissing());
+    EXPECT_EQ(1.0, reader->GetMinValue());
+    EXPECT_EQ(3.0, reader->GetMaxValue());
+}
+
+TEST(AttributeReader, AttributeWithoutAValueHasNoFigures)
+{
+    LoadedReader reader(FullList(), {{gMissingValue, 0, 2, 1}, {gMissingValue, 1, 1, 2}});
+    reader.Pair(3, 1);
+    EXPECT_EQ(2U, reader->GetNumDistinct());
+
+    reader.Pair(0, 1);
+
+    EXPECT_EQ(0U, reader->GetNumTuples());
+    EXPECT_EQ(0U, reader->GetNumDistinct());
+    EXPECT_EQ(0.0, reader->GetTotalWeight());
+    EXPECT_EQ(3.0, reader->GetTotalWeightWithMissing());
+    EXPECT_EQ(gMissingValue, reader->GetMinValue());
+    EXPECT_EQ(gMissingValue, reader->GetMaxValue());
+}
+
+TEST(AttributeReader, PreBinningIsEngagedAboveTheThresholdOnly)
+{
+    LoadedReader reader(FullList(), {{1, 0, 1, 1}, {2, 1, 1, 1}, {3, 0, 1, 2}});
+    for (const auto& [threshold, isEngaged] : {std::pair<unsigned int, bool>{0, false}, {3, false}, {2, true}})
+    {
+        reader->SetNumDistinctValueThreshold(threshold);
+        reader.Pair(0, 1);
+        EXPECT_EQ(isEngaged, reader->IsPreBinningEngaged()) << threshold;
+    }
+    reader.Pair(3, 1);
+    EXPECT_FALSE(reader->IsPreBinningEngaged()) << "found out afresh for each attribute";
+}
+
+TEST(AttributeReader, TargetsCanChangeFromReadToRead)
+{
+    LoadedReader reader(AVarList().WithAttribute("x").WithCategorical("c", 3).WithCategorical("d", 4),
+                        {{1, 2, 0}, {2, 0, 3}, {3, -1, 1}}, TupleKind::kWithTarget);
+
+    for (int turn = 0; turn < 2; ++turn)
+    {
+        EXPECT_EQ(2, reader.Pair(0, 1)[0].fTargetCode);
+        EXPECT_EQ(2U, reader->GetNumTuples());
+        EXPECT_EQ(0, reader.Pair(0, 2)[0].fTargetCode);
+        EXPECT_EQ(3U, reader->GetNumTuples());
+        EXPECT_EQ(3, reader.Pair(1, 2)[0].fTargetCode) << "the list's variables are attributes too";
+    }
+}
+
+TEST(AttributeReader, UnusableTargetKeepsTheFiguresOfTheLastRead)
+{
+    LoadedReader reader(AVarList().WithAttribute("x").WithTarget("t", 2).WithCategorical("c", 2),
+                        {{1, 0, 7}, {2, 1, 0}});
+    reader.Pair(0, 1);
+
+    for (const int target : {-1, 2, 99})
+    {
+        std::vector<BINSortTuple> other;
+        std::vector<BINSortTuple>* tuples = &other;
+        EXPECT_EQ(MCBinning::BINStatusTargetUnusable,
+                  reader->GetAttributeTargetData(0, target, &tuples).GetErrorCode());
+        EXPECT_EQ(nullptr, tuples);
+        EXPECT_EQ(2U, reader->GetNumTuples());
+    }
+}
+
+TEST(AttributeReader, AttributeCutShortIsAnErrorThatNamesIt)
+{
+    LoadedReader reader(AVarList().WithAttribute("x").WithTarget("t", 2).WithCategorical("c", 2),
+                        {{1, 0, 300}, {2, 1, 0}});
+    std::vector<BINSortTuple>* tuples = nullptr;
+
+    const MCBinning::MCStatus status = reader->GetAttributeTargetData(2, 1, &tuples);
+
+    EXPECT_TRUE(status.IsError());
+    EXPECT_EQ(MCBinning::BINStatusTooManyCategories, status.GetErrorCode());
+    EXPECT_EQ(2, status.GetDiscreteDatum(0));
+    EXPECT_EQ(nullptr, tuples);
+}
+
+TEST(Tally, PutsValuesOnTheClosedSideOfABorder)
+{
+    LoadedReader reader(AVarList().WithAttribute("x").WithTarget("t", 2), {{1, 0}, {2, 1}, {2, 0}, {4, 1}});
+    reader.Pair(0, 1);
+    const std::vector<double> borders{-100, 1, 2, 3, 5};
+    std::vector<double> table;
+
+    EXPECT_TRUE(reader->TallyBins(&borders, true, table).IsOK());
+    EXPECT_EQ((std::vector<double>{1, 0, 1, 1, 0, 0, 0, 1}), table);
+    EXPECT_TRUE(reader->TallyBins(&borders, false, table).IsOK());
+    EXPECT_EQ((std::vector<double>{0, 0, 1, 0, 1, 1, 0, 1}), table);
+}
+
+TEST(Tally, BordersThatDontFitTheTuplesAreAWarning)
+{
+    LoadedReader reader(AVarList().WithAttribute("x").WithTarget("t", 2), {{1, 0}, {2, 1}});
+    reader.Pair(0, 1);
+    const std::vector<double> none;
+    const std::vector<double> tooLow{-100, 1};
+    const std::vector<double> emptyLast{-100, 2, 3};
+    std::vector<double> table;
+    for (const std::vector<double>* borders :
+         {static_cast<const std::vector<double>*>(nullptr), &none, &tooLow, &emptyLast})
+        EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusBadBinTable, true), reader->TallyBins(borders, true, table));
+}

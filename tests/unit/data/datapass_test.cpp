@@ -1,0 +1,204 @@
+#include "support/preparatorpeer.h"
+
+#include <gtest/gtest.h>
+
+#include <limits>
+
+using MCMV::gMissingValue;
+
+namespace
+{
+
+const double kNaN = std::numeric_limits<double>::quiet_NaN();
+const double kInfinity = std::numeric_limits<double>::infinity();
+
+/// Fields of a record: target, weight, attribute. A second categorical variable stands behind them.
+BINVarList FullList(IBINVariable::BINWRoundingOption option = IBINVariable::RoundClosest)
+{
+    return AVarList().WithTarget("t", 256).WithWeight(option).WithAttribute("x").WithCategorical("c", 256);
+}
+
+const MCBinning::MCStatus kNoRecords(MCBinning::BINStatusNoRecords, false);
+
+} // namespace
+
+TEST(DataPass, RecordsBecomeColumns)
+{
+    BINDataPreparatorPeer preparator(FullList());
+    RecordTable source{{1, 2, 3.5, 0}, {-1, 1, gMissingValue, -1}, {gMissingValue, 1, -7, gMissingValue}, {}};
+
+    EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+
+    EXPECT_EQ(3U, preparator->GetNumRecords());
+    EXPECT_EQ((std::vector<double>{1, gMissingValue, gMissingValue}), preparator.Values(0));
+    EXPECT_EQ((std::vector<double>{2, 1, 1}), preparator.Values(1));
+    EXPECT_EQ((std::vector<double>{3.5, gMissingValue, -7}), preparator.Values(2));
+    EXPECT_EQ((std::vector<double>{0, gMissingValue, gMissingValue}), preparator.Values(3));
+    EXPECT_EQ((std::vector<int>{1, 0, 0, 0}), preparator->GetMaxCodes());
+    EXPECT_EQ(4, source.fNumNext);
+    EXPECT_EQ(5, source.fNumHasNext);
+}
+
+TEST(DataPass, OnlyTheWeightDropsARecord)
+{
+    BINVarList list = FullList(IBINVariable::RoundTruncate);
+    list.AddDiscreteUserMissing(1, 9.0, "");
+    BINDataPreparatorPeer preparator(list);
+    RecordTable source;
+    for (const double weight : {0.0, -1.0, 0.9, gMissingValue, kNaN, 9.0, 2.7}) source.Add({0, weight, 1, 0});
+
+    EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+
+    EXPECT_EQ(std::vector<double>{2}, preparator.Values(1));
+    EXPECT_EQ(1U, preparator->GetNumRecords());
+}
+
+TEST(DataPass, UserMissingAndNaNAreMissingInContinuousAttributes)
+{
+    BINVarList list = AVarList().WithAttribute("x");
+    list.AddDiscreteUserMissing(0, 5.0, "");
+    list.SetMissingInterval(0, 90.0, 99.0);
+    BINDataPreparatorPeer preparator(list);
+    RecordTable source{{5}, {90}, {99}, {kNaN}, {kInfinity}, {6}};
+
+    EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+
+    EXPECT_EQ((std::vector<double>{gMissingValue, gMissingValue, gMissingValue, gMissingValue, kInfinity, 6}),
+              preparator.Values(0));
+}
+
+TEST(DataPass, WhatCountsAsACode)
+{
+    struct Case
+    {
+        double fCode;
+        bool fIsTargetUsable;
+        bool fIsCategoryUsable;
+        double fStoredTarget;
+    };
+    for (const Case& c : {
+             Case{255.9, true, true, 255.9}, Case{256, false, false, 0}, Case{-0.5, true, true, -0.5},
+             Case{-1, true, true, gMissingValue},
+             Case{-1.5, true, false, gMissingValue}, // of a target the whole part counts
+             Case{-2, false, false, 0}, Case{kNaN, false, false, 0}, Case{kInfinity, false, false, 0},
+             Case{4294967295.0, false, false, 0}, // -1, were it cast without a look
+         })
+    {
+        SCOPED_TRACE(c.fCode);
+        BINDataPreparatorPeer preparator(FullList());
+        RecordTable source{{c.fCode, 1, 1, c.fCode}, {0, 1, 1, 0}};
+
+        EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+
+        EXPECT_EQ(c.fIsTargetUsable, preparator.IsUsable(0));
+        EXPECT_EQ(c.fIsCategoryUsable, preparator.IsUsable(3));
+        EXPECT_EQ(!c.fIsCategoryUsable, preparator->IsCutShort(3));
+        if (c.fIsTargetUsable)
+            EXPECT_EQ((std::vector<double>{c.fStoredTarget, 0}), preparator.Values(0));
+        else
+            EXPECT_EQ(std::vector<double>{}, preparator.Values(0)) << "cut short at the first record";
+        EXPECT_EQ(2U, preparator.Values(2).size());
+    }
+}
+
+TEST(DataPass, BadCodeInTheOnlyCategoricalVariableStopsIt)
+{
+    BINDataPreparatorPeer preparator(AVarList().WithAttribute("x").WithTarget("t", 2));
+    RecordTable source{{1, 0}, {2, 300}, {3, 1}};
+
+    const MCBinning::MCStatus status = preparator->PrepareData(&source);
+
+    EXPECT_TRUE(status.IsError());
+    EXPECT_EQ(MCBinning::BINStatusTooManyCategories, status.GetErrorCode());
+    EXPECT_EQ(1, status.GetDiscreteDatum(0)) << "the target's index in the list";
+    EXPECT_TRUE(preparator->GetStatus().IsOK());
+    EXPECT_EQ(2, source.fNumNext);
+}
+
+TEST(DataPass, CodeBeyondTheDeclaredCategoriesExcludesTheVariableAtTheEnd)
+{
+    BINDataPreparatorPeer preparator(AVarList().WithTarget("t", 2).WithCategorical("c", 3));
+    RecordTable source{{1, 3}, {0, 2}};
+
+    EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+
+    EXPECT_TRUE(preparator.IsUsable(0));
+    EXPECT_FALSE(preparator.IsUsable(1));
+    EXPECT_EQ((std::vector<double>{3, 2}), preparator.Values(1)) << "its file is complete";
+    EXPECT_FALSE(preparator->IsCutShort(1));
+}
+
+TEST(DataPass, FlushesWheneverTheBufferIsFull)
+{
+    for (const int numRecords : {9999, 10000, 20001})
+    {
+        BINDataPreparatorPeer preparator(AVarList().WithAttribute("x"));
+        RecordTable source;
+        std::vector<double> expected;
+        for (int i = 0; i < numRecords; ++i)
+        {
+            source.Add({static_cast<double>(i)});
+            expected.push_back(i);
+        }
+        EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+        EXPECT_EQ(expected, preparator.Values(0));
+    }
+}
+
+TEST(DataPass, SourcesWithoutAnAcceptedRecord)
+{
+    for (RecordTable source : {RecordTable{}, RecordTable{{}, {}}, RecordTable{{0, 0, 1, 0}}})
+    {
+        BINDataPreparatorPeer preparator(FullList());
+        EXPECT_EQ(kNoRecords, preparator->PrepareData(&source));
+        EXPECT_EQ(kNoRecords, preparator->GetStatus());
+    }
+}
+
+TEST(DataPass, ShortRecordsAreMissingBehindTheirEnd)
+{
+    BINDataPreparatorPeer preparator(AVarList().WithAttribute("a").WithAttribute("b"));
+    RecordTable source{{1}, {2, 3, 4}};
+
+    EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+
+    EXPECT_EQ((std::vector<double>{gMissingValue, 3}), preparator.Values(1));
+}
+
+TEST(DataPass, ReportsEveryNthTurn)
+{
+    for (const auto& [interval, expected] :
+         {std::pair<int, std::vector<int>>{0, {}}, {1, {1, 2, 2, 3}}, {2, {2, 3}}, {3, {2}}})
+    {
+        ReportLog log;
+        BINDataPreparatorPeer preparator(AVarList().WithAttribute("x"), &log, interval);
+        RecordTable source{{1}, {2}, {}, {3}}; // a turn without a record counts
+        EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
+        EXPECT_EQ(expected, log.fIndices) << "interval " << interval;
+    }
+}
+
+TEST(DataPass, CancelKeepsWhatWasReadButGivesNoData)
+{
+    CancelAfter query(3);
+    BINDataPreparatorPeer preparator(AVarList().WithAttribute("x"), nullptr, 0, &query);
+    RecordTable source{{1}, {2}, {3}};
+
+    EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusCancelled, false), preparator->PrepareData(&source));
+    EXPECT_EQ((std::vector<double>{1, 2}), preparator.Values(0));
+
+    CancelAfter atOnce(1);
+    BINDataPreparatorPeer other(AVarList().WithAttribute("x"), nullptr, 0, &atOnce);
+    EXPECT_EQ(kNoRecords, other->PrepareData(&source));
+}
+
+TEST(DataPass, ListsWithoutAPlaceForEachVariableAreRefused)
+{
+    BINVarList list = AVarList().WithAttribute("x").WithAttribute("y");
+    list.SetVariableRole(1, IBINVariable::RoleUndefined);
+    BINDataPreparatorPeer preparator(list);
+    RecordTable source{{1, 2}};
+
+    EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusInvalidVarList, false), preparator->PrepareData(&source));
+    EXPECT_EQ(0, source.fNumNext);
+}
