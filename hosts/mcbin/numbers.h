@@ -1,0 +1,15 @@
+#ifndef MCBIN_NUMBERS_H
+#define MCBIN_NUMBERS_H
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+/// The number that the whole of `text` spells with a decimal point, such as "-1", "+.5" or "2.5e-3", whatever the locale.
+/// Nothing for all else: other text, even behind a number; a number that is out of a double's range; "inf" and "nan".
+std::optional<double> ParseNumber(std::string_view text);
+
+/// The number in as few digits as read back to the same double.
+std::string FormatNumber(double value);
+
+#endif

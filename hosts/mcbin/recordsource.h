@@ -1,0 +1,50 @@
+#ifndef MCBIN_RECORDSOURCE_H
+#define MCBIN_RECORDSOURCE_H
+
+#include <mcobnqrt/binvarlist.h>
+#include <mcobnqrt/ibinrecordsource.h>
+#include <mcobnqrt/mccommon.h>
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+#include <vector>
+
+class BINStringEncoder;
+class CsvRow;
+class TableReader;
+struct Variables;
+
+/// The rows of a table as records of the variables, read as they are asked for. An empty field is missing.
+///
+/// All operations throw a Failure where a row can't be read or isn't what it was when the variables were made.
+class TableRecordSource : public IBINRecordSource
+{
+public:
+    /// `table` has been read to its end once, and was found to have `nRows` rows. Both `table` and `variables` are the
+    /// caller's and outlive this object.
+    TableRecordSource(TableReader& table, const Variables& variables, long nRows);
+
+    bool HasNext() override;
+
+    /// Null at the end. It is the same record each time.
+    const MCCommon::Record* Next() override;
+
+private:
+    struct Field
+    {
+        std::size_t column;              ///< its place in the table
+        const BINStringEncoder* encoder; ///< null for a number
+    };
+
+    double Convert(const Field& field, std::string_view text);
+
+    TableReader& fTable;
+    std::vector<Field> fFields;   ///< by variable index
+    const CsvRow* fRow = nullptr; ///< what HasNext() has found for Next(); null if it hasn't looked
+    long fRowsLeft;               ///< how many more rows there should be
+    MCCommon::Record fRecord;
+    std::string fCategory; ///< kept for its memory
+};
+
+#endif
