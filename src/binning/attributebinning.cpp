@@ -1,6 +1,7 @@
 // From the sorted tuples of one pair to its bins: rows, tally, split, cell table, merge of small bins, model entropy.
 
 #include "binning/binalgorithm.h"
+#include "binning/entropy.h"
 #include "platform/arithmetic.h"
 
 #include <iterator>

@@ -16,7 +16,7 @@
 /// points found, and stores what was found.
 ///
 /// The run is in binalgorithm.cpp, the bins of one attribute are in attributebinning.cpp, and the split that finds the cut
-/// points is in entropysplit.cpp. These shapes go through the last two, all of doubles, K being the number of the target's
+/// points is in entropysplit.cpp, with the search of one range in CutScan. These shapes go through the last two, all of doubles, K being the number of the target's
 /// categories:
 ///
 ///     value table   R rows of K cells, one row for each interval of values in rising order: weight by target code
@@ -56,9 +56,6 @@ public:
 private:
     friend class BINAlgorithmPeer; // the unit tests' way in
 
-    using CountVector = std::vector<double>;
-    static constexpr int kNoRow = -1;
-
     /// What is stored of one pair.
     struct PairResult
     {
@@ -89,15 +86,6 @@ private:
     std::vector<BINBinMerge> FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const;
     void MergeSmallBins(std::vector<double>& cells, std::set<double>& cutPoints) const;
     void ComputeModelEntropy(const std::vector<double>& cells, double& modelEntropy) const;
-
-    static double Entropy(const CountVector& counts);
-    static double PartitionEntropy(const CountVector& left, const CountVector& right);
-    static double MDLDelta(const CountVector& left, const CountVector& right, double entropy);
-    int FindAcceptedCut(const std::vector<double>& table, int first, int last, CountVector& left,
-                        CountVector& right) const;
-    int FindBestCut(const std::vector<double>& table, int first, int last, CountVector& left, CountVector& right) const;
-    bool IsSamePurePair(const std::vector<double>& table, int row) const;
-    int LastLeftRow(int row) const;
 
     std::size_t NumCategories() const { return fNumTargetCategories; }
 

@@ -3,14 +3,16 @@
 
 #include "platform/platform.h"
 
+#include <cstddef>
 #include <cstdio>
 #include <string>
+#include <vector>
 
 namespace MCBinning
 {
 
-/// Reads a temporary file, a headerless run of doubles, from first to last, as often as wanted. One value is always read
-/// ahead, so that IsOK() can say that a value is left before it is asked for.
+/// Reads a temporary file, a headerless run of doubles, from first to last, as often as wanted. The file is read in blocks,
+/// and always ahead, so that IsOK() can say that a value is left before it is asked for.
 class BinaryRecordIterator final
 {
 public:
@@ -22,7 +24,7 @@ public:
         kFailed = 3 ///< the file couldn't be opened, or not be read
     };
 
-    /// Opens the file and reads the first value ahead. If that fails the object exists all the same, and has no value.
+    /// Opens the file and reads the first values ahead. If that fails the object exists all the same, and has no value.
     /// With an `identity` only that very file is opened. The platform outlives the iterator.
     explicit BinaryRecordIterator(const std::string& path, Platform* platform = SystemPlatform(),
                                   const FileIdentity* identity = nullptr);
@@ -39,6 +41,13 @@ public:
 
     virtual int GetStatus();
 
+    /// The values that are read ahead and how many they are, at least one while IsOK().
+    const double* GetBlock() const { return fBlock.data() + fNextValue; }
+    std::size_t GetBlockSize() const { return fBlockSize - fNextValue; }
+
+    /// Moves behind the first `count` values of the block.
+    void Skip(std::size_t count);
+
     /// Goes back to the first value, after an end or a failed read too. \return the new status; without a file it stays
     /// kFailed.
     virtual int Rewind();
@@ -47,12 +56,12 @@ public:
     bool HasFile() const { return fFile != nullptr; }
 
 private:
-    int ReadNext();
+    int ReadBlock();
 
-    double fCurrent = 0.0;   ///< what Next() hands out
-    double fLookahead = 0.0; ///< the value read ahead
+    std::vector<double> fBlock;
+    std::size_t fBlockSize = 0; ///< values that the block holds
+    std::size_t fNextValue = 0; ///< place in the block of what Next() hands out
     std::FILE* fFile = nullptr;
-    int fFieldsPerRecord = 1; ///< elements per read; fLookahead holds one
     int fRecordStatus = kMoreToCome;
     std::string fFileName;
     Platform* fPlatform;

@@ -6,6 +6,8 @@
 
 #include <mcobnqrt/binvarlist.h>
 
+#include <algorithm>
+#include <cmath>
 #include <exception>
 
 using MCBinning::BinaryRecordIterator;
@@ -27,6 +29,21 @@ std::unique_ptr<std::vector<Tuple>> MakeTuples(unsigned int count)
     {
         return nullptr; // the caller's status says so
     }
+}
+
+template<class Tuple>
+Tuple MakeTuple(double value, double code, double weight);
+
+template<>
+BINSortTuple MakeTuple(double value, double code, double weight)
+{
+    return {value, static_cast<std::uint8_t>(code), weight};
+}
+
+template<>
+BINValueTuple MakeTuple(double value, double, double weight)
+{
+    return {value, weight};
 }
 
 } // namespace
@@ -187,6 +204,7 @@ MCStatus BINAttributeReader::LoadAttribute(int position)
     fNumDistinct = 0;
     fTotalWeight = 0.0;
     fTotalWeightWithMissing = 0.0;
+    fHasFractions = false;
     if (fHasWeight && !PutOn(fWeightPosition, fWeightIterator, fWeightPosition))
         return MakeError(MCBinning::BINStatusCannotOpenTempFile);
     if (fHasWeight)
@@ -195,20 +213,21 @@ MCStatus BINAttributeReader::LoadAttribute(int position)
         fTargetIterator->Rewind();
     const std::unique_ptr<Iterator> attribute = OpenPosition(position);
 
-    for (unsigned int record = 0; record < fNumRecords; ++record)
+    for (std::size_t numLeft = fNumRecords; numLeft > 0;)
     {
         if (!HasNextInAll(*attribute))
             return MakeError(MCBinning::BINStatusCannotOpenTempFile);
-        const double target = fHasTarget ? fTargetIterator->Next() : 0.0;
-        const double weight = fHasWeight ? fWeightIterator->Next() : 1.0;
-        const double value = attribute->Next();
-        if (weight == gMissingValue)
-            continue;
-        fTotalWeightWithMissing += weight;
-        if (target == gMissingValue || value == gMissingValue)
-            continue;
-        fTotalWeight += weight;
-        StoreTuple(value, target, weight);
+        const std::size_t count = std::min(numLeft, CommonBlockSize(*attribute));
+        if (fHasTarget)
+            AddTuples(*fTargetTuples, attribute->GetBlock(), count);
+        else
+            AddTuples(*fValueTuples, attribute->GetBlock(), count);
+        attribute->Skip(count);
+        if (fHasTarget)
+            fTargetIterator->Skip(count);
+        if (fHasWeight)
+            fWeightIterator->Skip(count);
+        numLeft -= count;
     }
     return MCStatus();
 }
@@ -218,20 +237,49 @@ bool BINAttributeReader::HasNextInAll(Iterator& attribute) const
     return attribute.IsOK() && (!fHasTarget || fTargetIterator->IsOK()) && (!fHasWeight || fWeightIterator->IsOK());
 }
 
-void BINAttributeReader::StoreTuple(double value, double target, double weight)
+/// How many records can be joined from what is read ahead of their files.
+std::size_t BINAttributeReader::CommonBlockSize(const Iterator& attribute) const
 {
+    std::size_t size = attribute.GetBlockSize();
     if (fHasTarget)
-        (*fTargetTuples)[fNumTuples] = {value, static_cast<std::uint8_t>(target), weight};
-    else
-        (*fValueTuples)[fNumTuples] = {value, weight};
-    ++fNumTuples;
+        size = std::min(size, fTargetIterator->GetBlockSize());
+    if (fHasWeight)
+        size = std::min(size, fWeightIterator->GetBlockSize());
+    return size;
+}
+
+/// Joins the next `count` records, whose values of the attribute are given. Each sum is in the order of the records.
+template<class Tuple>
+void BINAttributeReader::AddTuples(std::vector<Tuple>& tuples, const double* values, std::size_t count)
+{
+    const double* const targets = fHasTarget ? fTargetIterator->GetBlock() : nullptr;
+    const double* const weights = fHasWeight ? fWeightIterator->GetBlock() : nullptr;
+    for (std::size_t i = 0; i < count; ++i)
+    {
+        const double weight = weights != nullptr ? weights[i] : 1.0;
+        if (weight == gMissingValue)
+            continue;
+        fTotalWeightWithMissing += weight;
+        if ((targets != nullptr && targets[i] == gMissingValue) || values[i] == gMissingValue)
+            continue;
+        fTotalWeight += weight;
+        fHasFractions |= weight != std::floor(weight);
+        tuples[fNumTuples++] = MakeTuple<Tuple>(values[i], targets != nullptr ? targets[i] : 0.0, weight);
+    }
+}
+
+/// Whether every sum of weights is exact, whatever its order: whole numbers that a double holds all of.
+bool BINAttributeReader::AreSumsExact() const
+{
+    constexpr double kLargestWhole = 9007199254740992.0; // 2 to the power of 53
+    return !fHasFractions && fTotalWeight <= kLargestWhole;
 }
 
 /// Sorts the current tuples and works out the figures that hang on their order.
 template<class Tuple>
 void BINAttributeReader::SortAndMeasure(std::vector<Tuple>& tuples)
 {
-    SortTuples(tuples, fNumTuples);
+    SortTuples(tuples, fNumTuples, AreSumsExact() ? TieOrder::kAny : TieOrder::kComplete);
     fMinValue = fMaxValue = gMissingValue;
     fNumDistinct = 0;
     if (fNumTuples == 0)

@@ -6,10 +6,15 @@
 
 #include <vector>
 
-/// Sorts the first `count` tuples in rising order of value. Equal values are ordered too, by all else that a tuple holds
-/// (the negative zero before the other, then the target's code, then the weight): weights with fractions are summed in this
-/// order, and their sums must depend neither on the order of the records nor on the sort.
-void SortTuples(std::vector<BINSortTuple>& tuples, unsigned int count);
-void SortTuples(std::vector<BINValueTuple>& tuples, unsigned int count);
+/// What becomes of tuples of equal value. Sums over them must depend neither on the order of the records nor on the sort.
+enum class TieOrder
+{
+    kAny,     ///< for weights whose sums are exact, so that no order makes a difference
+    kComplete ///< by all else that a tuple holds: the target's code, then the weight
+};
+
+/// Sorts the first `count` tuples in rising order of value; the negative zero comes before the other.
+void SortTuples(std::vector<BINSortTuple>& tuples, unsigned int count, TieOrder ties);
+void SortTuples(std::vector<BINValueTuple>& tuples, unsigned int count, TieOrder ties);
 
 #endif

@@ -17,18 +17,6 @@ public:
         fAlgorithm.fRightBorderClosed = rightBorderClosed;
     }
 
-    static double Entropy(const std::vector<double>& counts) { return BINAlgorithm::Entropy(counts); }
-
-    static double PartitionEntropy(const std::vector<double>& left, const std::vector<double>& right)
-    {
-        return BINAlgorithm::PartitionEntropy(left, right);
-    }
-
-    static double MDLDelta(const std::vector<double>& left, const std::vector<double>& right, double entropy)
-    {
-        return BINAlgorithm::MDLDelta(left, right, entropy);
-    }
-
     std::set<double> CutPoints(const std::vector<double>& values, const std::vector<double>& table) const
     {
         std::set<double> cutPoints;

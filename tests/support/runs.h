@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <utility>
 #include <vector>
 
 inline BINSettings SupervisedSettings()
@@ -22,7 +23,7 @@ inline EFBINSettings EqualFrequencySettings(int numberOfBins)
     return settings;
 }
 
-/// A supervised algorithm made through its factory.
+/// A supervised algorithm, made through its factory unless a test brings its own.
 class Supervised
 {
 public:
@@ -32,6 +33,8 @@ public:
         fAlgorithm.reset(factory.CreateBINAlgorithm(settings, list));
         EXPECT_NE(nullptr, fAlgorithm) << factory.GetStatus().GetErrorCode();
     }
+
+    explicit Supervised(std::unique_ptr<IBINAlgorithm> algorithm) : fAlgorithm(std::move(algorithm)) {}
 
     MCBinning::MCStatus Run(IBINRecordSource& source) { return fAlgorithm->Run(&source, nullptr, nullptr); }
 
@@ -66,7 +69,7 @@ private:
     std::unique_ptr<IBINAlgorithm> fAlgorithm;
 };
 
-/// An equal-frequency algorithm made through its factory.
+/// An equal-frequency algorithm, made through its factory unless a test brings its own.
 class EqualFrequency
 {
 public:
@@ -76,6 +79,8 @@ public:
         fAlgorithm.reset(factory.CreateEFBINAlgorithm(settings, list));
         EXPECT_NE(nullptr, fAlgorithm) << factory.GetStatus().GetErrorCode();
     }
+
+    explicit EqualFrequency(std::unique_ptr<IEFBINAlgorithm> algorithm) : fAlgorithm(std::move(algorithm)) {}
 
     MCBinning::MCStatus Run(IBINRecordSource& source) { return fAlgorithm->Run(&source, nullptr); }
 

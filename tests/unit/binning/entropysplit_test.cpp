@@ -1,3 +1,4 @@
+#include "binning/entropy.h"
 #include "oracle/plainsplit.h"
 #include "support/algorithmpeer.h"
 #include "support/hostdata.h"
@@ -93,9 +94,9 @@ TEST(EntropySplit, WorkedFiguresOfTheCriterion)
         const std::vector<double> right{c.fMajor + c.fMinor, c.fMinor, c.fMajor};
         const std::vector<double> both{2 * (c.fMajor + c.fMinor), c.fMajor + c.fMinor, c.fMajor + c.fMinor};
 
-        EXPECT_EQ(1.0, BINAlgorithmPeer::Entropy(both));
-        EXPECT_NEAR(c.fPartition, BINAlgorithmPeer::PartitionEntropy(left, right), 1e-6);
-        EXPECT_NEAR(c.fDelta, BINAlgorithmPeer::MDLDelta(left, right, 1.0), 1e-6);
+        EXPECT_EQ(1.0, Entropy(both));
+        EXPECT_NEAR(c.fPartition, PartitionEntropy(left, right), 1e-6);
+        EXPECT_NEAR(c.fDelta, MDLDelta(left, right, 1.0), 1e-6);
         const Rows rows{{c.fMajor, c.fMinor}, {c.fMinor, c.fMajor}};
         EXPECT_EQ(c.fIsSplit ? std::set<double>{1.0} : std::set<double>{}, CutPoints(rows, true));
         EXPECT_EQ(c.fIsSplit ? std::set<double>{2.0} : std::set<double>{}, CutPoints(rows, false));
