@@ -4,6 +4,7 @@
 #include "binning/entropy.h"
 #include "platform/arithmetic.h"
 
+#include <algorithm>
 #include <iterator>
 #include <limits>
 
@@ -40,19 +41,38 @@ std::vector<double> Sum(const std::vector<double>& left, const std::vector<doubl
 MCStatus BINAlgorithm::BinAttributeDirect(const std::vector<BINSortTuple>* tuples, std::set<double>& cutPoints,
                                           std::vector<double>& cells, double& modelEntropy)
 {
-    std::vector<double> borders;
+    std::vector<double> values;
+    std::vector<double> table;
+    TallyDistinct(*tuples, values, table);
+    // The value at the open end of all rows is no border: the outer ones are, and they have to take it in.
+    const bool isTooLarge = fRightBorderClosed ? values.back() > kExtreme : values.back() >= kExtreme;
+    if (isTooLarge)
+        return MakeWarning(MCBinning::BINStatusBadBinTable);
+    if (fRightBorderClosed)
+        values.back() = kExtreme;
+    else
+        values.front() = -kExtreme;
+    return BinRows(values, table, cutPoints, cells, modelEntropy);
+}
+
+/// Makes a row of each distinct value, in one walk.
+void BINAlgorithm::TallyDistinct(const std::vector<BINSortTuple>& tuples, std::vector<double>& values,
+                                 std::vector<double>& table) const
+{
+    const std::size_t numDistinct = fAttributeReader->GetNumDistinct();
+    table.assign(numDistinct * NumCategories(), 0.0);
+    values.reserve(numDistinct);
+    double* row = table.data();
     for (unsigned int i = 0; i < fRecordCount; ++i)
     {
-        const double value = (*tuples)[i].fValue;
-        if (borders.empty() || value != borders.back())
-            borders.push_back(value);
+        const BINSortTuple& tuple = tuples[i];
+        if (values.empty() || tuple.fValue != values.back())
+        {
+            row = table.data() + values.size() * NumCategories();
+            values.push_back(tuple.fValue);
+        }
+        row[tuple.fTargetCode] += tuple.fWeight;
     }
-    // The value at the open end of all rows is no inner border: nothing lies beyond it.
-    if (fRightBorderClosed)
-        borders.pop_back();
-    else
-        borders.erase(borders.begin());
-    return BinRows(borders, cutPoints, cells, modelEntropy);
 }
 
 MCStatus BINAlgorithm::BinAttributePreBinned(const std::vector<BINSortTuple>* tuples, std::vector<double>& cuts,
@@ -63,31 +83,30 @@ MCStatus BINAlgorithm::BinAttributePreBinned(const std::vector<BINSortTuple>* tu
         cuts.pop_back();
     else if (!fRightBorderClosed && !cuts.empty() && cuts.front() == tuples->front().fValue)
         cuts.erase(cuts.begin());
-    return BinRows(cuts, cutPoints, cells, modelEntropy);
-}
-
-/// Both ways go on here, with the inner borders of the rows, which are turned into the row values on the way.
-MCStatus BINAlgorithm::BinRows(std::vector<double>& borders, std::set<double>& cutPoints, std::vector<double>& cells,
-                               double& modelEntropy)
-{
-    borders.push_back(kExtreme);
-    borders.insert(borders.begin(), -kExtreme);
+    cuts.push_back(kExtreme);
+    cuts.insert(cuts.begin(), -kExtreme);
     std::vector<double> table;
-    MCStatus status = fAttributeReader->TallyBins(&borders, fRightBorderClosed, table);
+    const MCStatus status = fAttributeReader->TallyBins(&cuts, fRightBorderClosed, table);
     if (!status.IsOK())
         return status;
     if (fRightBorderClosed)
-        borders.erase(borders.begin());
+        cuts.erase(cuts.begin());
     else
-        borders.pop_back();
+        cuts.pop_back();
+    return BinRows(cuts, table, cutPoints, cells, modelEntropy);
+}
 
+/// Both ways go on here, with a value table and its row values.
+MCStatus BINAlgorithm::BinRows(const std::vector<double>& values, const std::vector<double>& table,
+                               std::set<double>& cutPoints, std::vector<double>& cells, double& modelEntropy)
+{
     const int numRows = static_cast<int>(table.size() / NumCategories());
-    status = FindCutPoints(&borders, &table, 0, numRows - 1, cutPoints);
+    MCStatus status = FindCutPoints(&values, &table, 0, numRows - 1, cutPoints);
     if (cutPoints.empty())
         status = MakeWarning(MCBinning::BINStatusNoCutPoints);
     if (status.IsError())
         return status;
-    FillCells(borders, table, cutPoints, cells);
+    FillCells(values, table, cutPoints, cells);
     if (fSettings.GetSmallBinDetectionThreshold() > 0.0 && cutPoints.size() > 1)
         MergeSmallBins(cells, cutPoints);
     ComputeModelEntropy(cells, modelEntropy);
@@ -99,30 +118,26 @@ void BINAlgorithm::FillCells(const std::vector<double>& values, const std::vecto
                              const std::set<double>& cutPoints, std::vector<double>& cells) const
 {
     const std::size_t numCategories = NumCategories();
-    const std::size_t numCells = numCategories + 1;
-    cells.assign((cutPoints.size() + 1) * numCells, 0.0);
+    cells.assign((cutPoints.size() + 1) * (numCategories + 1), 0.0);
+    double* cell = cells.data();
     std::size_t row = 0;
-    auto cut = cutPoints.begin();
-    for (std::size_t bin = 0; bin <= cutPoints.size(); ++bin)
+    const auto fillBin = [&](std::size_t end)
     {
-        // Every cut point is the value of a row, and that row is the first of the next bin, or the last of this one.
-        std::size_t end = values.size();
-        if (cut != cutPoints.end())
+        for (; row < end; ++row)
         {
-            end = row;
-            while (end < values.size() && values[end] != *cut) ++end;
-            if (fRightBorderClosed && end < values.size())
-                ++end;
-            ++cut;
+            for (std::size_t c = 0; c < numCategories; ++c) cell[c + 1] += table[row * numCategories + c];
         }
-        double* const cell = cells.data() + bin * numCells;
-        for (std::size_t category = 0; category < numCategories; ++category)
-        {
-            for (std::size_t i = row; i < end; ++i) cell[category + 1] += table[i * numCategories + category];
-            cell[0] += cell[category + 1];
-        }
-        row = end;
+        for (std::size_t c = 0; c < numCategories; ++c) cell[0] += cell[c + 1];
+        cell += numCategories + 1;
+    };
+    for (const double cutPoint : cutPoints)
+    {
+        // Every cut point is the value of a row, which is the last of this bin or the first of the next.
+        std::size_t end = row;
+        while (end < values.size() && values[end] != cutPoint) ++end;
+        fillBin(std::min(values.size(), end + (fRightBorderClosed ? 1 : 0)));
     }
+    fillBin(values.size());
 }
 
 /// Decides on the merges, all of them on the table as it is: no decision changes the judgement of another bin. Only inner

@@ -16,8 +16,8 @@
 /// points found, and stores what was found.
 ///
 /// The run is in binalgorithm.cpp, the bins of one attribute are in attributebinning.cpp, and the split that finds the cut
-/// points is in entropysplit.cpp, with the search of one range in CutScan. These shapes go through the last two, all of doubles, K being the number of the target's
-/// categories:
+/// points is in entropysplit.cpp, with the search of one range in CutScan. These shapes, all of doubles, go through the last
+/// two, K being the number of the target's categories:
 ///
 ///     value table   R rows of K cells, one row for each interval of values in rising order: weight by target code
 ///     row values    R borders, one for each row: its right border if that is closed, else its left border
@@ -79,8 +79,10 @@ private:
     void BinTuples(PairResult& result);
     void Store(const PairResult& result, int attribute, int target);
 
-    MCBinning::MCStatus BinRows(std::vector<double>& borders, std::set<double>& cutPoints, std::vector<double>& cells,
-                                double& modelEntropy);
+    void TallyDistinct(const std::vector<BINSortTuple>& tuples, std::vector<double>& values,
+                       std::vector<double>& table) const;
+    MCBinning::MCStatus BinRows(const std::vector<double>& values, const std::vector<double>& table,
+                                std::set<double>& cutPoints, std::vector<double>& cells, double& modelEntropy);
     void FillCells(const std::vector<double>& values, const std::vector<double>& table,
                    const std::set<double>& cutPoints, std::vector<double>& cells) const;
     std::vector<BINBinMerge> FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const;

@@ -54,12 +54,27 @@ private:
         void Set(const double* counts, std::size_t size);
     };
 
+    /// The partition entropy, times the weight, of sides that change by a row at a time; only what the row moves is worked out.
+    class Estimate
+    {
+    public:
+        Estimate(const CountVector& left, const CountVector& right);
+        void Update(std::size_t category, double leftCount, double rightCount);
+        double Of(double leftWeight, double rightWeight) const;
+
+    private:
+        std::vector<double> fLeftTerms; ///< by category: count times its logarithm
+        std::vector<double> fRightTerms;
+        double fSum = 0.0;
+    };
+
     const double* Row(int row) const { return fTable.data() + static_cast<std::size_t>(row) * fNumCategories; }
     bool IsSamePurePair(int row) const;
     bool IsCandidate(int row, Range range) const;
     void AddRows(int first, int last, double* categories) const;
     void MoveRows(int first, int last, CountVector& left, CountVector& right) const;
-    void TryRows(Range rows, Range range, int nextRow, CountVector& left, CountVector& right, Best& best) const;
+    void TryRow(int row, const CountVector& left, const CountVector& right, Best& best) const;
+    void TryAllRows(Range range, CountVector& left, CountVector& right, Best& best) const;
 
     void CountBlocks();
     void CountRowsBefore(int row, double* categories) const;
@@ -69,7 +84,8 @@ private:
     void FindStates(Range range, const CountVector& totals);
     std::size_t FindBounds();
     double BoundOf(const Side& left, const Side& right, const Side& nextLeft, const Side& nextRight) const;
-    void TrySegment(std::size_t segment, Range range, Best& best) const;
+    void TrySegment(std::size_t segment, Range range, double margin, Best& best) const;
+    void MoveRow(int row, CountVector& left, CountVector& right, Estimate& estimate) const;
 
     std::size_t NumSegments() const { return fBoundaries.size() - 1; }
     std::size_t StateSize() const { return 2 * (fNumCategories + 1); }

@@ -158,29 +158,69 @@ TEST(EntropySplit, MisfittingTablesAreErrors)
     }
 }
 
-TEST(EntropySplit, EqualsThePlainFormOnRandomTables)
+namespace
+{
+
+/// Compares the real split with the plain one on a random table, in both border modes. \return whether there was a cut.
+bool EqualsThePlainForm(const Rows& rows, const std::string& what)
+{
+    bool hasCut = false;
+    for (const bool rightBorderClosed : {true, false})
+    {
+        const std::set<double> plain = PlainCutPoints(rows, rightBorderClosed);
+        EXPECT_EQ(plain, CutPoints(rows, rightBorderClosed)) << what << " closed " << rightBorderClosed;
+        hasCut = hasCut || !plain.empty();
+    }
+    return hasCut;
+}
+
+/// A mirror image behind the rows: every cut has a twin of equal entropy.
+void Mirror(Rows& rows)
+{
+    for (std::size_t row = rows.size(); row > 0; --row) rows.push_back(rows[row - 1]);
+}
+
+std::string CaseName(Cells kind, unsigned int seed)
+{
+    return "kind " + std::to_string(static_cast<int>(kind)) + " seed " + std::to_string(seed);
+}
+
+} // namespace
+
+TEST(EntropySplit, EqualsThePlainFormOnSmallTables)
 {
     int numWithCuts = 0;
     int numCases = 0;
     for (const Cells kind : {Cells::kWhole, Cells::kFractional, Cells::kTinyTotal, Cells::kFarApart})
     {
-        for (unsigned int seed = 1; seed <= 1000; ++seed)
+        for (unsigned int seed = 1; seed <= 1000; ++seed, ++numCases)
         {
             Dice dice(seed);
             const int numCategories = seed % 50 == 0 ? 256 : 1 + dice.Below(seed % 5 == 0 ? 20 : 4);
             const int numRows = kind == Cells::kTinyTotal ? 2 + dice.Below(4) : 2 + dice.Below(60);
             Rows rows = RandomRows(dice, numRows, numCategories, kind);
-            if (seed % 7 == 0) // a mirror image: every cut has a twin of equal entropy
-                for (int i = numRows - 1; i >= 0; --i) rows.push_back(rows[static_cast<std::size_t>(i)]);
-            for (const bool rightBorderClosed : {true, false})
-            {
-                const std::set<double> plain = PlainCutPoints(rows, rightBorderClosed);
-                ASSERT_EQ(plain, CutPoints(rows, rightBorderClosed))
-                    << "kind " << static_cast<int>(kind) << " seed " << seed << " closed " << rightBorderClosed;
-                numWithCuts += plain.empty() ? 0 : 1;
-                ++numCases;
-            }
+            if (seed % 7 == 0)
+                Mirror(rows);
+            numWithCuts += EqualsThePlainForm(rows, CaseName(kind, seed)) ? 1 : 0;
         }
     }
     EXPECT_GT(numWithCuts, numCases / 4) << "the tables are too dull to tell anything";
+}
+
+TEST(EntropySplit, EqualsThePlainFormOnTablesLongEnoughForBounds)
+{
+    for (const Cells kind : {Cells::kWhole, Cells::kFractional, Cells::kTinyTotal, Cells::kFarApart})
+    {
+        for (unsigned int seed = 1; seed <= 80; ++seed)
+        {
+            Dice dice(seed);
+            const int numCategories = seed % 40 == 0 ? 100 : 2 + dice.Below(seed % 5 == 0 ? 12 : 3);
+            Rows rows = RandomRows(dice, 256 + dice.Below(400), numCategories, kind);
+            if (seed % 4 == 0)
+                dice.Shuffle(rows); // noise: no cut stands out
+            if (seed % 7 == 0)
+                Mirror(rows);
+            EqualsThePlainForm(rows, CaseName(kind, seed));
+        }
+    }
 }
