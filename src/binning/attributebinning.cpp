@@ -140,8 +140,9 @@ void BINAlgorithm::FillCells(const std::vector<double>& values, const std::vecto
     fillBin(values.size());
 }
 
-/// Decides on the merges, all of them on the table as it is: no decision changes the judgement of another bin. Only inner
-/// bins are judged, and each against the smaller of its neighbours. A small bin joins the side that leaves the lower entropy.
+/// Decides on the merges, all of them on the table as it is: no decision changes the judgement of another bin. Only
+/// inner bins are judged, and each against the smaller of its neighbours. A small bin joins the side that leaves the
+/// lower entropy.
 std::vector<BINBinMerge> BINAlgorithm::FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const
 {
     const std::size_t numCells = NumCategories() + 1;

@@ -9,14 +9,14 @@
 
 #include <cstdint>
 
-/// The reports of one loop over attributes: after each treated attribute, or with settings that skip n, after each (n+1)th.
-/// An attribute that ended in an error makes no report but counts, and the next that didn't then reports.
+/// The reports of one loop over attributes: after each treated attribute, or with settings that skip n, after each
+/// (n+1)th. An attribute that ended in an error makes no report but counts, and the next that didn't then reports.
 template<class Settings>
 class AttributeReports
 {
 public:
-    /// Takes the listener from the settings; may be null, and then nothing is counted. The settings are asked again for the
-    /// number to skip after each report.
+    /// Takes the listener from the settings; may be null, and then nothing is counted. The settings are asked again for
+    /// the number to skip after each report.
     AttributeReports(const Settings& settings, Platform* platform)
         : fSettings(settings), fListener(settings.GetProgressListener()), fCountdown(settings.GetNSkippedAttReports()),
           fPlatform(platform), fStart(platform->GetTickCount())

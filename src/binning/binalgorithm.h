@@ -12,12 +12,12 @@
 #include <set>
 #include <vector>
 
-/// The driver of supervised runs: has the records read once, takes each pair of attribute and target in turn, has its cut
-/// points found, and stores what was found.
+/// The driver of supervised runs: has the records read once, takes each pair of attribute and target in turn, has its
+/// cut points found, and stores what was found.
 ///
-/// The run is in binalgorithm.cpp, the bins of one attribute are in attributebinning.cpp, and the split that finds the cut
-/// points is in entropysplit.cpp, with the search of one range in CutScan. These shapes, all of doubles, go through the last
-/// two, K being the number of the target's categories:
+/// The run is in binalgorithm.cpp, the bins of one attribute are in attributebinning.cpp, and the split that finds the
+/// cut points is in entropysplit.cpp, with the search of one range in CutScan. These shapes, all of doubles, go through
+/// the last two, K being the number of the target's categories:
 ///
 ///     value table   R rows of K cells, one row for each interval of values in rising order: weight by target code
 ///     row values    R borders, one for each row: its right border if that is closed, else its left border
@@ -35,9 +35,9 @@ public:
 
     /// Bins the current pair with each distinct value of the attribute as a row.
     ///
-    /// The cut points and the cell table arrive empty, the model entropy as not found. Without a cut point there is one bin,
-    /// with the warning BINStatusNoCutPoints. If the tuples don't fit the rows (a value beyond the largest finite double),
-    /// the warning BINStatusBadBinTable comes back, and nothing is filled.
+    /// The cut points and the cell table arrive empty, the model entropy as not found. Without a cut point there is one
+    /// bin, with the warning BINStatusNoCutPoints. If the tuples don't fit the rows (a value beyond the largest finite
+    /// double), the warning BINStatusBadBinTable comes back, and nothing is filled.
     MCBinning::MCStatus BinAttributeDirect(const std::vector<BINSortTuple>* tuples, std::set<double>& cutPoints,
                                            std::vector<double>& cells, double& modelEntropy);
 
@@ -48,8 +48,8 @@ public:
 
     /// Adds the cut points of the rows `first` to `last`, both inclusive, to `cutPoints`.
     ///
-    /// \return OK, or the error BINStatusBadBinTable, with the set untouched, if there is no table, or it has not one row for
-    ///         each of the row values.
+    /// \return OK, or the error BINStatusBadBinTable, with the set untouched, if there is no table, or it has not one
+    ///         row for each of the row values.
     MCBinning::MCStatus FindCutPoints(const std::vector<double>* values, const std::vector<double>* table, int first,
                                       int last, std::set<double>& cutPoints) const;
 

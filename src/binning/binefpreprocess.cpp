@@ -1,9 +1,9 @@
 // Weighted percentiles in one walk over the sorted tuples.
 //
-// The walk takes whole groups of equal values. The target of a bin is either passed inside a group, and then the group's
-// value is the cut, or met exactly between two groups, and then the midpoint of their values is. The total weight comes from
-// a sum in another order than the walk's and may differ from it in the last bit, so "all of it" is asked of the tuples, by
-// the cursor, and never of the weights.
+// The walk takes whole groups of equal values. The target of a bin is either passed inside a group, and then the
+// group's value is the cut, or met exactly between two groups, and then the midpoint of their values is. The total
+// weight comes from a sum in another order than the walk's and may differ from it in the last bit, so "all of it" is
+// asked of the tuples, by the cursor, and never of the weights.
 
 #include "binning/binefpreprocess.h"
 
@@ -47,8 +47,9 @@ public:
     double GetCutPoint() const { return fCutPoint; }
     bool IsLastBin() const { return fBin == fLastBin; }
 
-    /// Appends the weight of the bin. With the right border closed the group at the cut belongs to it, else to the next bin;
-    /// where that group is the last of all, the next bin is complete too, and no call will come that could count it.
+    /// Appends the weight of the bin. With the right border closed the group at the cut belongs to it, else to the next
+    /// bin; where that group is the last of all, the next bin is complete too, and no call will come that could count
+    /// it.
     void CountBin(bool rightBorderClosed, std::vector<double>& counts) const
     {
         if (rightBorderClosed)
@@ -70,8 +71,8 @@ private:
         return bin == fLastBin ? fTotalWeight : std::min((bin + 1.0) * fStep, 100.0) / 100.0 * fTotalWeight;
     }
 
-    /// Targets rise with the bins, so those that one heavy group has passed are found by halving, however many they are.
-    /// The first bin is never passed, not even with a target too small to be told from 0.
+    /// Targets rise with the bins, so those that one heavy group has passed are found by halving, however many they
+    /// are. The first bin is never passed, not even with a target too small to be told from 0.
     int FirstBinNotPassed() const
     {
         int first = fBin + 1;
@@ -129,8 +130,8 @@ private:
     double fCutPoint = 0.0;
 };
 
-/// A bin whose cut equals the one before it: the midpoint of two neighbouring doubles is one of them, and a target inside
-/// its group gives it once more. The bin's weight then belongs to the bin before.
+/// A bin whose cut equals the one before it: the midpoint of two neighbouring doubles is one of them, and a target
+/// inside its group gives it once more. The bin's weight then belongs to the bin before.
 void JoinToPreviousBin(std::vector<double>& counts, std::size_t bin)
 {
     counts[bin - 1] += counts[bin];
@@ -155,8 +156,8 @@ void FindBins(EFWalk<Tuple> walk, bool rightBorderClosed, std::vector<double>& c
     }
 }
 
-/// Takes out the bins without weight: one at the end of the data, where a single value holds the last share or, with the
-/// left border closed, the first; and those between two cuts in which no value lies, each with its right cut.
+/// Takes out the bins without weight: one at the end of the data, where a single value holds the last share or, with
+/// the left border closed, the first; and those between two cuts in which no value lies, each with its right cut.
 void RemoveEmptyBins(double smallest, double largest, bool rightBorderClosed, double totalWeight,
                      std::vector<double>& cuts, std::vector<double>& counts)
 {

@@ -21,8 +21,8 @@
 
 class BINEFPreProcess;
 
-/// What the two drivers share: the copies that they work on, the one preparation of the data, and how statuses travel from
-/// an attribute to the end of a run. `Interface` is the abstract class that the host knows.
+/// What the two drivers share: the copies that they work on, the one preparation of the data, and how statuses travel
+/// from an attribute to the end of a run. `Interface` is the abstract class that the host knows.
 template<class Interface, class Settings, class Output>
 class BinningDriver : public Interface
 {
@@ -54,8 +54,8 @@ protected:
     BinningDriver(const BinningDriver&) = delete;
     BinningDriver& operator=(const BinningDriver&) = delete;
 
-    /// Reads and spools the records in the first call that finds one, and gives the outcome of that again in later calls.
-    /// `threshold` is the number of distinct values above which an attribute is pre-binned, 0 for none.
+    /// Reads and spools the records in the first call that finds one, and gives the outcome of that again in later
+    /// calls. `threshold` is the number of distinct values above which an attribute is pre-binned, 0 for none.
     MCBinning::MCStatus PrepareOnce(IBINRecordSource* source, TupleKind kind, unsigned int threshold)
     {
         if (fDataPreparator != nullptr)

@@ -1,30 +1,31 @@
-// To work out the partition entropy of a candidate takes 2 K logarithms, and few candidates can be the best. So a range is
-// cut into segments, and a segment is left out when a bound for all its candidates is above the best one found.
+// To work out the partition entropy of a candidate takes 2 K logarithms, and few candidates can be the best. So a range
+// is cut into segments, and a segment is left out when a bound for all its candidates is above the best one found.
 //
-// The bound. Let H(v) = v0 log2 v0 - sum over c of vc log2 vc be the entropy of a count vector times its weight. H is concave
-// and of degree one, so it is superadditive, and at a boundary with the sides L and R, for any candidate between it and the
-// next boundary, which moves m from R to L, 0 <= m <= M:
+// The bound. Let H(v) = v0 log2 v0 - sum over c of vc log2 vc be the entropy of a count vector times its weight. H is
+// concave and of degree one, so it is superadditive, and at a boundary with the sides L and R, for any candidate
+// between it and the next boundary, which moves m from R to L, 0 <= m <= M:
 //
 //     H(L + m) + H(R - m)  >=  H(L) + H(R) + sum over c of mc (log2(L'0 / L'c) - log2(R'0 / R'c))       (a)
 //     H(L + m) + H(R - m)  >=  H(L) + H(R - M)                                                          (b)
 //
-// (a) is the tangent at the new sides L' = L + m and R' = R - m. With L'0 >= L0, L'c <= Lc + Mc, L'c <= L'0, R'0 <= R0 and
-// R'c >= Rc - Mc the bracket is at least bc = max(0, log2(L0 / (Lc + Mc))) - log2(R0 / (Rc - Mc)), and mc bc at least
-// Mc min(0, bc). All logarithms are those of the two boundaries. The larger of (a) and (b) is taken.
+// (a) is the tangent at the new sides L' = L + m and R' = R - m. With L'0 >= L0, L'c <= Lc + Mc, L'c <= L'0, R'0 <= R0
+// and R'c >= Rc - Mc the bracket is at least bc = max(0, log2(L0 / (Lc + Mc))) - log2(R0 / (Rc - Mc)), and mc bc at
+// least Mc min(0, bc). All logarithms are those of the two boundaries. The larger of (a) and (b) is taken.
 //
-// In a segment that is left, the same quantity is kept up to date row by row from the logarithms of what a row moves, mostly
-// 4 of them, and only rows for which it is not above the best one are worked out.
+// In a segment that is left, the same quantity is kept up to date row by row from the logarithms of what a row moves,
+// mostly 4 of them, and only rows for which it is not above the best one are worked out.
 //
-// The margin. What is compared with bound and estimate is the partition entropy as it is worked out, times the weight N. With
-// u = 2^-53, an entropy is off by at most (40 + 8 K) u. The terms of bound and estimate are at most N log2 N <= 53 N each; the
-// bound has 4 (K + 1) of them, and the estimate is updated up to 64 K times in a segment, each time off by 4 x 53 u N:
-// 2^15 (K + 4) u N is enough for all of it. That is all where the cells are whole numbers with exact sums. Otherwise the sides
-// are running sums of n rows, each off by up to e = 2 n K u N, a residual of a category that is used up among them. No partial
-// sum is finer than the last bit of the smallest cell, so no logarithm is above g = log2(N / smallest cell) + 54 in size, and
-// an error of e in each count of both sides moves their H by at most 2 K (3 g + 16) e.
+// The margin. What is compared with bound and estimate is the partition entropy as it is worked out, times the weight
+// N. With u = 2^-53, an entropy is off by at most (40 + 8 K) u. The terms of bound and estimate are at most N log2 N <=
+// 53 N each; the bound has 4 (K + 1) of them, and the estimate is updated up to 64 K times in a segment, each time off
+// by 4 x 53 u N: 2^15 (K + 4) u N is enough for all of it. That is all where the cells are whole numbers with exact
+// sums. Otherwise the sides are running sums of n rows, each off by up to e = 2 n K u N, a residual of a category that
+// is used up among them. No partial sum is finer than the last bit of the smallest cell, so no logarithm is above g =
+// log2(N / smallest cell) + 54 in size, and an error of e in each count of both sides moves their H by at most 2 K (3 g
+// + 16) e.
 //
-// For a million rows of three categories this takes a scan from 60 ms to less than one with whole numbers, and to 5 with
-// fractions, which have to be summed row by row.
+// For a million rows of three categories this takes a scan from 60 ms to less than one with whole numbers, and to 5
+// with fractions, which have to be summed row by row.
 
 #include "binning/cutscan.h"
 
@@ -164,8 +165,8 @@ int CutScan::FindBestCut(int first, int last, CountVector& left, CountVector& ri
     if (best.fRow == kNoRow)
         return kNoRow;
 
-    // The sides are those of another row by now, with the roundings of all subtractions. The shorter one is summed afresh, the
-    // other is what it leaves of the totals.
+    // The sides are those of another row by now, with the roundings of all subtractions. The shorter one is summed
+    // afresh, the other is what it leaves of the totals.
     const int lastLeft = LastLeftRow(best.fRow);
     const bool isLeftShorter = (static_cast<double>(first) + last) * 0.5 >= best.fRow;
     CountVector& summed = isLeftShorter ? left : right;

@@ -6,10 +6,11 @@
 #include <cstddef>
 #include <vector>
 
-/// Finds the best cut in ranges of rows of one value table: R rows of K cells, the weights of an interval by target code.
+/// Finds the best cut in ranges of rows of one value table: R rows of K cells, the weights of an interval by target
+/// code.
 ///
-/// What it finds is what a walk over all rows would find that works out the partition entropy of every candidate. It only
-/// leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp.
+/// What it finds is what a walk over all rows would find that works out the partition entropy of every candidate. It
+/// only leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp.
 class CutScan
 {
 public:
@@ -18,17 +19,17 @@ public:
     /// The table outlives the object.
     CutScan(const std::vector<double>& table, std::size_t numCategories, bool rightBorderClosed);
 
-    /// The count vector of the rows `first` to `last`, both inclusive: each category summed in the order of the rows, and the
-    /// total in the order of the categories.
+    /// The count vector of the rows `first` to `last`, both inclusive: each category summed in the order of the rows,
+    /// and the total in the order of the categories.
     void SumRows(int first, int last, CountVector& counts) const;
 
-    /// The candidate with the lowest partition entropy, the lowest row among equal ones, or kNoRow if all rows are pure in
-    /// one and the same category. `left` arrives all zero and `right` with SumRows of the range; both leave with the two
-    /// sides of the row. The range holds two rows at least.
+    /// The candidate with the lowest partition entropy, the lowest row among equal ones, or kNoRow if all rows are pure
+    /// in one and the same category. `left` arrives all zero and `right` with SumRows of the range; both leave with the
+    /// two sides of the row. The range holds two rows at least.
     int FindBestCut(int first, int last, CountVector& left, CountVector& right);
 
-    /// The last row on the left of a cut at `row`: with the right border closed the row's own border is the cut, and the row
-    /// lies on the left.
+    /// The last row on the left of a cut at `row`: with the right border closed the row's own border is the cut, and
+    /// the row lies on the left.
     int LastLeftRow(int row) const { return fRightBorderClosed ? row : row - 1; }
 
 private:
@@ -54,7 +55,8 @@ private:
         void Set(const double* counts, std::size_t size);
     };
 
-    /// The partition entropy, times the weight, of sides that change by a row at a time; only what the row moves is worked out.
+    /// The partition entropy, times the weight, of sides that change by a row at a time; only what the row moves is
+    /// worked out.
     class Estimate
     {
     public:

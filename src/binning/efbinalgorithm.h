@@ -10,8 +10,8 @@
 #include <iosfwd>
 #include <vector>
 
-/// The driver of equal-frequency runs: has the records read once, takes each attribute in turn, has it cut, and stores what
-/// was found.
+/// The driver of equal-frequency runs: has the records read once, takes each attribute in turn, has it cut, and stores
+/// what was found.
 class EFBINAlgorithm : public BinningDriver<IEFBINAlgorithm, EFBINSettings, EFBINOutput>
 {
 public:

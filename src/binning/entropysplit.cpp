@@ -1,13 +1,12 @@
-// Recursive entropy minimisation under the minimum description length criterion, after
-//   U. M. Fayyad and K. B. Irani, Multi-interval discretization of continuous-valued attributes for classification
-//   learning, IJCAI 1993.
+// Recursive entropy minimisation under the minimum description length criterion, after U. M. Fayyad and K. B. Irani,
+// Multi-interval discretization of continuous-valued attributes for classification learning, IJCAI 1993.
 //
-// Our decisions: N is the weight of a range and need not be whole. A category present on both sides of a cut counts twice in
-// the Delta term. The rows tried are both rows around each pair of neighbours that is not pure in one and the same category.
-// A cut point is the border of a row, no midpoint. Of equal candidates the lowest row stays.
+// Our decisions: N is the weight of a range and need not be whole. A category present on both sides of a cut counts
+// twice in the Delta term. The rows tried are both rows around each pair of neighbours that is not pure in one and the
+// same category. A cut point is the border of a row, no midpoint. Of equal candidates the lowest row stays.
 //
-// The order of the additions is part of the result. Logarithms of 0 and of negative numbers, and 0 / 0, are relied on: a NaN
-// compares false, so it never becomes better than what is there, and never passes the test.
+// The order of the additions is part of the result. Logarithms of 0 and of negative numbers, and 0 / 0, are relied on:
+// a NaN compares false, so it never becomes better than what is there, and never passes the test.
 
 #include "binning/binalgorithm.h"
 #include "binning/cutscan.h"
@@ -22,8 +21,8 @@ using MCBinning::MCStatus;
 namespace
 {
 
-/// The best cut of a range if its gain of information pays for its description: if it is above (log2(N - 1) + Delta) / N.
-/// Else kNoRow. The two sides are working memory.
+/// The best cut of a range if its gain of information pays for its description: if it is above (log2(N - 1) + Delta) /
+/// N. Else kNoRow. The two sides are working memory.
 int FindAcceptedCut(CutScan& scan, int first, int last, CountVector& left, CountVector& right)
 {
     std::fill(left.begin(), left.end(), 0.0);
@@ -32,8 +31,8 @@ int FindAcceptedCut(CutScan& scan, int first, int last, CountVector& left, Count
     const double weight = right[0];
 
     const int cut = scan.FindBestCut(first, last, left, right);
-    // A cut with all rows on one side would bring the same range back for ever. It gains nothing, but where the weight is
-    // below 2 even that can be above the threshold.
+    // A cut with all rows on one side would bring the same range back for ever. It gains nothing, but where the weight
+    // is below 2 even that can be above the threshold.
     if (cut == CutScan::kNoRow || scan.LastLeftRow(cut) < first || scan.LastLeftRow(cut) == last)
         return CutScan::kNoRow;
     const double gain = entropy - PartitionEntropy(left, right);

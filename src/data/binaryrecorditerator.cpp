@@ -66,7 +66,8 @@ int BinaryRecordIterator::Rewind()
     return fRecordStatus;
 }
 
-/// A file that ends within a block is at its end when the values before that are taken: a failed read of the rest says so.
+/// A file that ends within a block is at its end when the values before that are taken: a failed read of the rest says
+/// so.
 int BinaryRecordIterator::ReadBlock()
 {
     fNextValue = 0;

@@ -11,8 +11,8 @@
 namespace MCBinning
 {
 
-/// Reads a temporary file, a headerless run of doubles, from first to last, as often as wanted. The file is read in blocks,
-/// and always ahead, so that IsOK() can say that a value is left before it is asked for.
+/// Reads a temporary file, a headerless run of doubles, from first to last, as often as wanted. The file is read in
+/// blocks, and always ahead, so that IsOK() can say that a value is left before it is asked for.
 class BinaryRecordIterator final
 {
 public:

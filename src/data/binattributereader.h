@@ -40,7 +40,8 @@ public:
     /// From now on an attribute with more distinct values than `threshold` is to be pre-binned. 0 changes nothing.
     void SetNumDistinctValueThreshold(unsigned int threshold);
 
-    /// Runs the data pass and gets ready for reads. \return the status of the pass, or BINStatusOutOfMemory for the tuples.
+    /// Runs the data pass and gets ready for reads. \return the status of the pass, or BINStatusOutOfMemory for the
+    /// tuples.
     MCBinning::MCStatus ReadRecords();
 
     /// As BINDataPreparator::IsVariableUsable, of a variable index. BINStatusTargetUnusable for a negative one.
@@ -48,8 +49,8 @@ public:
 
     /// Loads and sorts a pair, given by variable indices, and sets `*tuples` to the reader's vector, or to null.
     ///
-    /// \return OK; BINStatusTargetUnusable, and then the figures of the last read stay; BINStatusTooManyCategories for an
-    ///         attribute with a code that doesn't fit, its index in slot 0 of the discrete data;
+    /// \return OK; BINStatusTargetUnusable, and then the figures of the last read stay; BINStatusTooManyCategories for
+    ///         an attribute with a code that doesn't fit, its index in slot 0 of the discrete data;
     ///         BINStatusCannotOpenTempFile if a file can't be opened or doesn't hold all records any more.
     MCBinning::MCStatus GetAttributeTargetData(int attribute, int target, std::vector<BINSortTuple>** tuples);
 
@@ -57,11 +58,11 @@ public:
     MCBinning::MCStatus GetAttributeData(int attribute, std::vector<BINValueTuple>** tuples);
 
     /// Adds up the weights of the current tuples by bin and target code. `cuts` holds the borders of the bins in rising
-    /// order, from an outer left one, which is never compared, to the right border of the last bin. `table` gets one row of
-    /// GetNumTargetCats() cells for each bin.
+    /// order, from an outer left one, which is never compared, to the right border of the last bin. `table` gets one
+    /// row of GetNumTargetCats() cells for each bin.
     ///
-    /// \return OK, or the warning BINStatusBadBinTable if there are no borders, or the tuples end before the last bin or go
-    ///         on past it; the table is worth nothing then.
+    /// \return OK, or the warning BINStatusBadBinTable if there are no borders, or the tuples end before the last bin
+    ///         or go on past it; the table is worth nothing then.
     MCBinning::MCStatus TallyBins(const std::vector<double>* cuts, bool rightBorderClosed,
                                   std::vector<double>& table) const;
 

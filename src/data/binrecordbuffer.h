@@ -3,16 +3,16 @@
 
 #include <vector>
 
-/// The memory in front of the temporary files: a matrix of doubles with one row for each position of a processed record and
-/// a fill count for each row. Positions fill at different speeds once one of them has dropped out of the pass.
+/// The memory in front of the temporary files: a matrix of doubles with one row for each position of a processed record
+/// and a fill count for each row. Positions fill at different speeds once one of them has dropped out of the pass.
 class BINRecordBuffer
 {
 public:
     /// Makes all rows empty, with room for `cols` values each. False if a size is negative or there is not the memory.
     bool Init(int rows, int cols);
 
-    /// Stores the value behind the last one of the row. False, with nothing done, for a row that there is not or that is
-    /// full.
+    /// Stores the value behind the last one of the row. False, with nothing done, for a row that there is not or that
+    /// is full.
     bool Append(int row, double value);
 
     /// True from the moment when some row has no room left, up to Reset().

@@ -1,7 +1,7 @@
 // The one pass over the host's records: which records count, what counts as missing, and which positions stay usable.
 //
-// Only a missing weight drops a record. All other missing data stay in the files as gMissingValue, since a record without
-// one attribute is good for the others.
+// Only a missing weight drops a record. All other missing data stay in the files as gMissingValue, since a record
+// without one attribute is good for the others.
 
 #include "entry/bincancelmonitor.h"
 #include "entry/makestatus.h"
@@ -24,8 +24,8 @@ using MCMV::gMissingValue;
 namespace
 {
 
-/// A code's whole part has to lie in 0..255 to fit the 8 bits of a tuple. Asked of the double, before any cast: a NaN or a
-/// number beyond an int fits no more than 256 does.
+/// A code's whole part has to lie in 0..255 to fit the 8 bits of a tuple. Asked of the double, before any cast: a NaN
+/// or a number beyond an int fits no more than 256 does.
 bool FitsCode(double code)
 {
     return code > -1.0 && code < 256.0;
@@ -42,7 +42,8 @@ bool IsMissingCategory(double code)
     return code == gMissingValue || code == -1.0;
 }
 
-/// The reports of the pass: one for every `interval` turns of its loop, none for an interval of 0 or without a listener.
+/// The reports of the pass: one for every `interval` turns of its loop, none for an interval of 0 or without a
+/// listener.
 class PassReports
 {
 public:
@@ -209,8 +210,8 @@ bool BINDataPreparator::ProcessCategory(double code, int position, Record& proce
     return true;
 }
 
-/// Stores a code as it came, with its fraction. \return false if it doesn't fit, and then the position has dropped out. A
-/// position that is out already takes nothing, and nothing is said of it again.
+/// Stores a code as it came, with its fraction. \return false if it doesn't fit, and then the position has dropped out.
+/// A position that is out already takes nothing, and nothing is said of it again.
 bool BINDataPreparator::StoreCode(double code, int position, Record& processed)
 {
     const auto index = static_cast<std::size_t>(position);

@@ -1,7 +1,7 @@
 // The temporary files of the data pass: their names, their coming into being, their growth and their end.
 //
-// A name is picked before the pass and becomes ours when its file is made, which fails if anything bears the name by then.
-// Until a file is made nothing is read, written or removed under its name; from then on only that very file is.
+// A name is picked before the pass and becomes ours when its file is made, which fails if anything bears the name by
+// then. Until a file is made nothing is read, written or removed under its name; from then on only that very file is.
 
 #include "entry/bincancelmonitor.h"
 #include "entry/makestatus.h"
@@ -25,8 +25,8 @@ std::string Hexadecimal(std::int64_t number)
     return std::string(digits.data(), end.ptr);
 }
 
-/// The directory as the beginning of a path. A trailing backslash counts as a separator on every system: it is what some
-/// hosts write.
+/// The directory as the beginning of a path. A trailing backslash counts as a separator on every system: it is what
+/// some hosts write.
 std::string AsPathPrefix(const std::string& directory)
 {
     const bool isComplete = directory.empty() || directory.back() == '/' || directory.back() == '\\';

@@ -1,8 +1,9 @@
-// A radix sort from the top: the bits of a double, turned so that they rise with its value, are the key. Each level deals a
-// range out by the highest bits in which its keys differ at all, so constant bits cost nothing and few-valued data end early.
+// A radix sort from the top: the bits of a double, turned so that they rise with its value, are the key. Each level
+// deals a range out by the highest bits in which its keys differ at all, so constant bits cost nothing and few-valued
+// data end early.
 //
-// A range too large for the scratch memory is dealt out in place, smaller ones from and to the scratch. That is slower by a
-// sixth for a million tuples than with scratch for all of them, and needs 1.5 MiB in place of 23.
+// A range too large for the scratch memory is dealt out in place, smaller ones from and to the scratch. That is slower
+// by a sixth for a million tuples than with scratch for all of them, and needs 1.5 MiB in place of 23.
 
 #include "data/tuplesort.h"
 

@@ -6,7 +6,8 @@
 
 #include <vector>
 
-/// What becomes of tuples of equal value. Sums over them must depend neither on the order of the records nor on the sort.
+/// What becomes of tuples of equal value. Sums over them must depend neither on the order of the records nor on the
+/// sort.
 enum class TieOrder
 {
     kAny,     ///< for weights whose sums are exact, so that no order makes a difference

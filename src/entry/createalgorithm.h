@@ -31,8 +31,8 @@ inline MCBinning::MCStatus CheckVarList(const BINVarList& varList)
     return status;
 }
 
-/// What both factories do: makes an `Algorithm` on copies of the arguments and hands it to the caller, or gives null and says
-/// why in `status`. The algorithm stands in `underConstruction` meanwhile.
+/// What both factories do: makes an `Algorithm` on copies of the arguments and hands it to the caller, or gives null
+/// and says why in `status`. The algorithm stands in `underConstruction` meanwhile.
 template<class Algorithm, class Interface, class Settings>
 Interface* CreateAlgorithm(const Settings& settings, const BINVarList& varList, MCBinning::MCStatus& status,
                            std::unique_ptr<Interface>& underConstruction)

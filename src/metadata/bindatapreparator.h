@@ -20,11 +20,11 @@ class IBINRecordSource;
 class IBINUserMissing;
 class ProgressListener;
 
-/// Stands between the variable list and the temporary files: works out how the host's variables map onto the fields of a
-/// processed record, reads the host's records once, and spools them to one temporary file per field.
+/// Stands between the variable list and the temporary files: works out how the host's variables map onto the fields of
+/// a processed record, reads the host's records once, and spools them to one temporary file per field.
 ///
-/// A processed record is laid out as target, weight, attributes in list order; target and weight only where the list has
-/// one. A field's place in it is its position, which is not the variable's index in the list.
+/// A processed record is laid out as target, weight, attributes in list order; target and weight only where the list
+/// has one. A field's place in it is its position, which is not the variable's index in the list.
 ///
 /// The layout is in bindatapreparator.cpp, the files in recordfiles.cpp, the pass over the records in datapass.cpp.
 class BINDataPreparator
@@ -50,26 +50,27 @@ public:
     /// Reads the source to its end, spools its records, and finds out which positions can be used. Called once.
     ///
     /// \return OK, or the error after which there are no data: BINStatusNoRecords when no record was accepted,
-    ///         BINStatusCancelled, BINStatusTooManyCategories for the only categorical variable, BINStatusInvalidVarList
-    ///         when some variable has no position, or what InitTempFiles() or FlushBuffer() gave.
+    ///         BINStatusCancelled, BINStatusTooManyCategories for the only categorical variable,
+    ///         BINStatusInvalidVarList when some variable has no position, or what InitTempFiles() or FlushBuffer()
+    ///         gave.
     MCBinning::MCStatus PrepareData(IBINRecordSource* source);
 
-    /// Turns one record of the host into a processed one, and keeps the largest codes and the usable positions up to date.
-    /// A record to be dropped raises fSkipRecord and is no failure.
+    /// Turns one record of the host into a processed one, and keeps the largest codes and the usable positions up to
+    /// date. A record to be dropped raises fSkipRecord and is no failure.
     ///
-    /// \return OK, or BINStatusTooManyCategories: an error if the list's target has a code that doesn't fit and there is
-    ///         nothing else to bin against, else a warning.
+    /// \return OK, or BINStatusTooManyCategories: an error if the list's target has a code that doesn't fit and there
+    ///         is nothing else to bin against, else a warning.
     MCBinning::MCStatus ProcessRecord(const MCCommon::Record& input, MCCommon::Record& processed);
 
     /// Sizes the buffer and picks a free name for each position's file. No file comes into being here.
     MCBinning::MCStatus InitTempFiles();
 
-    /// Writes the rows of the buffer behind what their files hold, makes the files where this is the first time, and empties
-    /// the buffer, whatever the result. Every position gets a file, also one without a value.
+    /// Writes the rows of the buffer behind what their files hold, makes the files where this is the first time, and
+    /// empties the buffer, whatever the result. Every position gets a file, also one without a value.
     MCBinning::MCStatus FlushBuffer();
 
-    /// Sets `*usable` to whether the position can be binned or binned against. BINStatusIndexOutOfRange for a position that
-    /// there is not; `*usable` stays as it was.
+    /// Sets `*usable` to whether the position can be binned or binned against. BINStatusIndexOutOfRange for a position
+    /// that there is not; `*usable` stays as it was.
     MCBinning::MCStatus IsVariableUsable(int position, bool* usable) const;
 
     /// Whether the position dropped out in the pass, so that its file holds fewer elements than there are records.

@@ -38,16 +38,17 @@ public:
     /// Tells whether a file could be made as `path`. Makes nothing, and doesn't wait on what it finds.
     virtual NameState ProbeName(const std::string& path) = 0;
 
-    /// Makes the file `path`, readable and writable by the user alone, and opens it for writing. Fails if anything bears the
-    /// name, a dangling link too. On kFree `file` and `identity` are set; else they are untouched and nothing is left.
+    /// Makes the file `path`, readable and writable by the user alone, and opens it for writing. Fails if anything
+    /// bears the name, a dangling link too. On kFree `file` and `identity` are set; else they are untouched and nothing
+    /// is left.
     virtual NameState CreateNewFile(const std::string& path, std::FILE*& file, FileIdentity& identity) = 0;
 
-    /// Opens the file for writing at its end. Null if `path` can't be opened, or is not that regular file, or doesn't hold
-    /// exactly `size` bytes. Never makes a file and never follows a link.
+    /// Opens the file for writing at its end. Null if `path` can't be opened, or is not that regular file, or doesn't
+    /// hold exactly `size` bytes. Never makes a file and never follows a link.
     virtual std::FILE* OpenForAppending(const std::string& path, const FileIdentity& identity, std::uint64_t size) = 0;
 
-    /// Opens a file for reading from its start. Null if it can't be opened. Unless `identity` is null, also null if `path`
-    /// is a link or not that regular file.
+    /// Opens a file for reading from its start. Null if it can't be opened. Unless `identity` is null, also null if
+    /// `path` is a link or not that regular file.
     virtual std::FILE* OpenForReading(const std::string& path, const FileIdentity* identity) = 0;
 
     /// As std::fread and std::fwrite of doubles: the number of elements read or written.
@@ -67,7 +68,8 @@ public:
 /// The platform that the program runs on; lives as long as the program.
 Platform* SystemPlatform();
 
-/// The directory where the user's programs put their temporary files, without trailing separator; "./" if there is none.
+/// The directory where the user's programs put their temporary files, without trailing separator; "./" if there is
+/// none.
 std::string SystemTempDirectory();
 
 #endif

@@ -79,8 +79,8 @@ bool HasIdentity(const struct stat& found, const FileIdentity& identity)
            static_cast<std::uint64_t>(found.st_ino) == identity.fNode;
 }
 
-/// What it means that a name couldn't be opened. Only the free name and the missing directory are hard to tell apart: the
-/// system gives one error for both, and a link without an end looks like either.
+/// What it means that a name couldn't be opened. Only the free name and the missing directory are hard to tell apart:
+/// the system gives one error for both, and a link without an end looks like either.
 NameState StateOfUnopenedName(const std::string& path, int error)
 {
     if (error == EMFILE || error == ENFILE)

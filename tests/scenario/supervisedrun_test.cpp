@@ -202,7 +202,8 @@ TEST(SupervisedRun, CancelKeepsTheResultsFoundBefore)
 {
     const MCStatus cancelled = ErrorOf(MCBinning::BINStatusCancelled);
     BINSettings settings = SupervisedSettings();
-    // Asked at creation, at the run, once a record, behind the pass, then twice a pair: the 10th is the end of the first.
+    // Asked at creation, at the run, once a record, behind the pass, then twice a pair: the 10th is the end of the
+    // first.
     CancelAfter query(10);
     settings.SetCancelPointer(&query);
     Supervised run(FullList(), settings);

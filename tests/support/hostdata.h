@@ -48,8 +48,8 @@ private:
 /// A rounding option that leaves weights as they are, fractions included.
 inline constexpr auto kUnrounded = static_cast<IBINVariable::BINWRoundingOption>(2);
 
-/// A host's record source over rows in memory. It counts what it is asked, and `fBeforeNext`, called with the number of the
-/// row that is asked for, can misbehave.
+/// A host's record source over rows in memory. It counts what it is asked, and `fBeforeNext`, called with the number of
+/// the row that is asked for, can misbehave.
 class RecordTable : public IBINRecordSource
 {
 public:

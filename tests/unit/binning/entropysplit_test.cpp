@@ -130,7 +130,8 @@ TEST(EntropySplit, WeightOfExactlyOneAlwaysPasses)
 
 TEST(EntropySplit, LightRangeWithoutTwoSidesEnds)
 {
-    // An empty pre-bin beside a weight of 1: only the cut in front of all rows is best, and it would bring the range back.
+    // An empty pre-bin beside a weight of 1: only the cut in front of all rows is best, and it would bring the range
+    // back.
     EXPECT_TRUE(CutPoints({{0, 0}, {1, 0}}, false).empty());
     EXPECT_EQ(std::set<double>{1.0}, CutPoints({{0, 0}, {1, 0}}, true));
 }
