@@ -218,10 +218,10 @@ MCStatus BINAttributeReader::LoadAttribute(int position)
         if (!HasNextInAll(*attribute))
             return MakeError(MCBinning::BINStatusCannotOpenTempFile);
         const std::size_t count = std::min(numLeft, CommonBlockSize(*attribute));
-        if (fHasTarget)
-            AddTuples(*fTargetTuples, attribute->GetBlock(), count);
-        else
-            AddTuples(*fValueTuples, attribute->GetBlock(), count);
+        const bool isAdded = fHasTarget ? AddTuples(*fTargetTuples, attribute->GetBlock(), count)
+                                        : AddTuples(*fValueTuples, attribute->GetBlock(), count);
+        if (!isAdded)
+            return MakeError(MCBinning::BINStatusCannotOpenTempFile);
         attribute->Skip(count);
         if (fHasTarget)
             fTargetIterator->Skip(count);
@@ -249,23 +249,36 @@ std::size_t BINAttributeReader::CommonBlockSize(const Iterator& attribute) const
 }
 
 /// Joins the next `count` records, whose values of the attribute are given. Each sum is in the order of the records.
+/// False if the target's file holds a code that the pass can't have written: somebody else has.
 template<class Tuple>
-void BINAttributeReader::AddTuples(std::vector<Tuple>& tuples, const double* values, std::size_t count)
+bool BINAttributeReader::AddTuples(std::vector<Tuple>& tuples, const double* values, std::size_t count)
 {
     const double* const targets = fHasTarget ? fTargetIterator->GetBlock() : nullptr;
     const double* const weights = fHasWeight ? fWeightIterator->GetBlock() : nullptr;
+    // Locals, since the compiler must take every tuple that is stored for a member of the same type.
+    unsigned int numTuples = fNumTuples;
+    double total = fTotalWeight;
+    double totalWithMissing = fTotalWeightWithMissing;
     for (std::size_t i = 0; i < count; ++i)
     {
         const double weight = weights != nullptr ? weights[i] : 1.0;
         if (weight == gMissingValue)
             continue;
-        fTotalWeightWithMissing += weight;
-        if ((targets != nullptr && targets[i] == gMissingValue) || values[i] == gMissingValue)
+        totalWithMissing += weight;
+        const double code = targets != nullptr ? targets[i] : 0.0;
+        if (code == gMissingValue || values[i] == gMissingValue)
             continue;
-        fTotalWeight += weight;
-        fHasFractions |= weight != std::floor(weight);
-        tuples[fNumTuples++] = MakeTuple<Tuple>(values[i], targets != nullptr ? targets[i] : 0.0, weight);
+        if (targets != nullptr && !(code > -1.0 && code < fNumTargetCats))
+            return false;
+        total += weight;
+        if (weight != 1.0 && weight != std::floor(weight))
+            fHasFractions = true;
+        tuples[numTuples++] = MakeTuple<Tuple>(values[i], code, weight);
     }
+    fNumTuples = numTuples;
+    fTotalWeight = total;
+    fTotalWeightWithMissing = totalWithMissing;
+    return true;
 }
 
 /// Whether every sum of weights is exact, whatever its order: whole numbers that a double holds all of.

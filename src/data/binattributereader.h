@@ -88,7 +88,7 @@ private:
     bool HasNextInAll(Iterator& attribute) const;
     std::size_t CommonBlockSize(const Iterator& attribute) const;
     template<class Tuple>
-    void AddTuples(std::vector<Tuple>& tuples, const double* values, std::size_t count);
+    bool AddTuples(std::vector<Tuple>& tuples, const double* values, std::size_t count);
     bool AreSumsExact() const;
     template<class Tuple>
     void SortAndMeasure(std::vector<Tuple>& tuples);
