@@ -102,7 +102,8 @@ public:
     ///         variable is not the list's weight.
     bool SetVariableRole(int index, IBINVariable::VariableRole role);
 
-    /// Raises each variable's number of categories to what its encoder has seen. \return their sum.
+    /// Raises each variable's number of categories to what its encoder has seen. \return their sum, no further than an int
+    /// goes.
     int UpdateNumbersOfCategories();
 
     /// Gives the names of all attributes, in order, and that of the last variable of RoleTarget; `target` is left

@@ -156,18 +156,33 @@ void FindBins(EFWalk<Tuple> walk, bool rightBorderClosed, std::vector<double>& c
     }
 }
 
-/// Takes out the bins without weight: one at the end of the data, where a single value holds the last share or, with
-/// the left border closed, the first; and those between two cuts in which no value lies, each with its right cut.
-void RemoveEmptyBins(double smallest, double largest, bool rightBorderClosed, double totalWeight,
-                     std::vector<double>& cuts, std::vector<double>& counts)
+/// Takes out a cut at an end of the data, where a single value holds the last share or, with the left border closed, the
+/// first. The bin that it cuts off has no weight, unless the cut is the midpoint of two neighbouring doubles, which is one
+/// of them: then its weight goes to the bin beside it.
+void RemoveCutAtEnd(double smallest, double largest, bool rightBorderClosed, std::vector<double>& cuts,
+                    std::vector<double>& counts)
 {
-    if (!cuts.empty() && rightBorderClosed && cuts.back() == largest)
+    if (cuts.empty())
+        return;
+    if (rightBorderClosed && cuts.back() == largest)
+    {
         cuts.pop_back();
-    if (!cuts.empty() && !rightBorderClosed && cuts.front() == smallest)
+        if (counts.size() > cuts.size() + 1)
+            JoinToPreviousBin(counts, counts.size() - 1);
+    }
+    else if (!rightBorderClosed && cuts.front() == smallest)
     {
         cuts.erase(cuts.begin());
-        counts.erase(counts.begin());
+        if (counts.size() > 1)
+            JoinToPreviousBin(counts, 1);
+        else
+            counts.clear();
     }
+}
+
+/// Takes out the bins without weight, each with its right cut: no value lies between that and the cut before it.
+void RemoveEmptyBins(double totalWeight, std::vector<double>& cuts, std::vector<double>& counts)
+{
     if (cuts.empty() && counts.empty())
         counts.push_back(totalWeight);
 
@@ -229,7 +244,8 @@ bool BINEFPreProcess::FindEFCutPoints(std::vector<double>& cuts, std::vector<dou
     }
     FindBins(EFWalk<BINValueTuple>(*fValueTuples, numTuples, totalWeight, fNumberOfBins), fRightBorderClosed, cuts,
              &counts);
-    RemoveEmptyBins(fValueTuples->front().fValue, (*fValueTuples)[numTuples - 1].fValue, fRightBorderClosed,
-                    totalWeight, cuts, counts);
+    RemoveCutAtEnd(fValueTuples->front().fValue, (*fValueTuples)[numTuples - 1].fValue, fRightBorderClosed, cuts,
+                   counts);
+    RemoveEmptyBins(totalWeight, cuts, counts);
     return true;
 }

@@ -12,6 +12,8 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <cstdint>
+#include <limits>
 #include <ostream>
 #include <utility>
 
@@ -227,9 +229,10 @@ bool BINVarList::SetVariableRole(int index, IBINVariable::VariableRole role)
 
 int BINVarList::UpdateNumbersOfCategories()
 {
-    int sum = 0;
+    std::int64_t sum = 0; // a host may declare any numbers
     for (const auto& variable : fVars) sum += variable->UpdateNumberOfCategories();
-    return sum;
+    using Limits = std::numeric_limits<int>;
+    return static_cast<int>(std::clamp<std::int64_t>(sum, Limits::min(), Limits::max()));
 }
 
 void BINVarList::GetVarNames(std::vector<std::string>& attributes, std::string& target) const

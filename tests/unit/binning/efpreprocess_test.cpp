@@ -143,6 +143,19 @@ TEST(EqualFrequency, WeightsLostInRoundingLeaveTheListsInStep)
     }
 }
 
+TEST(EqualFrequency, NoWeightIsLostBetweenNeighbouringDoubles)
+{
+    const double step = std::numeric_limits<double>::epsilon();
+    // The midpoint of the two is the even one of them: the largest value, and the smallest.
+    const Bins right = Cut({1 + step, 1 + 2 * step}, {}, 2, true);
+    const Bins left = Cut({1, 1 + step}, {}, 2, false);
+
+    EXPECT_TRUE(right.fCuts.empty());
+    EXPECT_EQ(std::vector<double>{2}, right.fCounts);
+    EXPECT_TRUE(left.fCuts.empty());
+    EXPECT_EQ(std::vector<double>{2}, left.fCounts);
+}
+
 TEST(EqualFrequency, BinsOfRandomDataHoldTheirWeight)
 {
     for (unsigned int seed = 1; seed <= 2000; ++seed)
