@@ -21,6 +21,7 @@ struct FileIdentity
 {
     std::uint64_t fDevice = 0;
     std::uint64_t fNode = 0;
+    std::int64_t fBirth = 0; ///< when it was made, since systems give the number of a removed file again; 0 if unknown
 };
 
 /// All that the library needs of its system: a clock, and the files of the spool. One object serves any number of

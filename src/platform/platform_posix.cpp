@@ -56,9 +56,7 @@ bool HoldsNul(const std::string& path)
 
 bool IsTakenName(const std::string& path)
 {
-    struct stat found
-    {
-    };
+    struct stat found = {};
     return lstat(path.c_str(), &found) == 0;
 }
 
@@ -66,17 +64,41 @@ bool IsTakenName(const std::string& path)
 bool IsDirectoryUsable(const std::string& path)
 {
     const std::string directory = DirectoryOf(path);
-    struct stat found
-    {
-    };
+    struct stat found = {};
     return stat(directory.c_str(), &found) == 0 && S_ISDIR(found.st_mode) &&
            faccessat(AT_FDCWD, directory.c_str(), W_OK | X_OK, AT_EACCESS) == 0;
 }
 
-bool HasIdentity(const struct stat& found, const FileIdentity& identity)
+/// The time at which a file was made, in nanoseconds, 0 if the system doesn't tell. It is the file at `path`, seen from
+/// `directory`, or with an empty path the one that is open as `directory` itself.
+std::int64_t TimeOfBirth(int directory, const char* path)
 {
-    return S_ISREG(found.st_mode) && static_cast<std::uint64_t>(found.st_dev) == identity.fDevice &&
-           static_cast<std::uint64_t>(found.st_ino) == identity.fNode;
+#ifdef STATX_BTIME
+    struct statx found = {};
+    if (statx(directory, path, AT_EMPTY_PATH | AT_SYMLINK_NOFOLLOW, STATX_BTIME, &found) == 0 &&
+        (found.stx_mask & STATX_BTIME) != 0)
+        return found.stx_btime.tv_sec * std::int64_t{1000000000} + found.stx_btime.tv_nsec;
+#endif
+    return 0;
+}
+
+FileIdentity IdentityOf(const struct stat& found, std::int64_t birth)
+{
+    return {static_cast<std::uint64_t>(found.st_dev), static_cast<std::uint64_t>(found.st_ino), birth};
+}
+
+bool IsSameFile(const struct stat& found, std::int64_t birth, const FileIdentity& identity)
+{
+    const FileIdentity other = IdentityOf(found, birth);
+    return S_ISREG(found.st_mode) && other.fDevice == identity.fDevice && other.fNode == identity.fNode &&
+           other.fBirth == identity.fBirth;
+}
+
+/// Sets `found` if the descriptor is open on that file.
+bool IsOpenOn(const Descriptor& opened, const FileIdentity& identity, struct stat& found)
+{
+    return opened.IsOpen() && fstat(opened.Get(), &found) == 0 &&
+           IsSameFile(found, TimeOfBirth(opened.Get(), ""), identity);
 }
 
 /// What it means that a name couldn't be opened. Only the free name and the missing directory are hard to tell apart:
@@ -105,7 +127,9 @@ public:
     {
         if (HoldsNul(path))
             return NameState::kDirectoryMissing;
-        // Without waiting: the name may be that of a pipe whose other end nobody opens.
+        // What bears the name is not opened: that would wake a writer who waits for a reader of its pipe.
+        if (IsTakenName(path))
+            return NameState::kTaken;
         const Descriptor probe(open(path.c_str(), O_RDONLY | O_NONBLOCK | O_NOFOLLOW | O_NOCTTY | O_CLOEXEC));
         return probe.IsOpen() ? NameState::kTaken : StateOfUnopenedName(path, errno);
     }
@@ -118,9 +142,7 @@ public:
         if (!created.IsOpen())
             return errno == EEXIST ? NameState::kTaken : NameState::kFailed;
 
-        struct stat made
-        {
-        };
+        struct stat made = {};
         std::FILE* stream = fstat(created.Get(), &made) == 0 ? created.IntoStream("ab") : nullptr;
         if (stream == nullptr)
         {
@@ -128,17 +150,15 @@ public:
             return NameState::kFailed;
         }
         file = stream;
-        identity = {static_cast<std::uint64_t>(made.st_dev), static_cast<std::uint64_t>(made.st_ino)};
+        identity = IdentityOf(made, TimeOfBirth(fileno(stream), ""));
         return NameState::kFree;
     }
 
     std::FILE* OpenForAppending(const std::string& path, const FileIdentity& identity, std::uint64_t size) override
     {
         Descriptor opened(open(path.c_str(), O_WRONLY | O_APPEND | O_NONBLOCK | O_NOFOLLOW | O_NOCTTY | O_CLOEXEC));
-        struct stat found
-        {
-        };
-        if (!opened.IsOpen() || fstat(opened.Get(), &found) != 0 || !HasIdentity(found, identity))
+        struct stat found = {};
+        if (!IsOpenOn(opened, identity, found))
             return nullptr;
         return static_cast<std::uint64_t>(found.st_size) == size ? opened.IntoStream("ab") : nullptr;
     }
@@ -148,10 +168,8 @@ public:
         if (identity == nullptr)
             return std::fopen(path.c_str(), "rbe");
         Descriptor opened(open(path.c_str(), O_RDONLY | O_NONBLOCK | O_NOFOLLOW | O_NOCTTY | O_CLOEXEC));
-        struct stat found
-        {
-        };
-        if (!opened.IsOpen() || fstat(opened.Get(), &found) != 0 || !HasIdentity(found, *identity))
+        struct stat found = {};
+        if (!IsOpenOn(opened, *identity, found))
             return nullptr;
         return opened.IntoStream("rb");
     }
@@ -176,10 +194,8 @@ public:
 
     void RemoveFile(const std::string& path, const FileIdentity& identity) override
     {
-        struct stat found
-        {
-        };
-        if (lstat(path.c_str(), &found) == 0 && HasIdentity(found, identity))
+        struct stat found = {};
+        if (lstat(path.c_str(), &found) == 0 && IsSameFile(found, TimeOfBirth(AT_FDCWD, path.c_str()), identity))
             unlink(path.c_str());
     }
 };

@@ -1,0 +1,145 @@
+#include "faults/tworuns.h"
+#include "support/tempdir.h"
+
+#include <cstdlib>
+#include <new>
+
+namespace
+{
+
+int numAllocations = 0;
+int failingAllocation = 0; ///< its number, counted from 1; 0 for none
+
+} // namespace
+
+void* operator new(std::size_t size)
+{
+    void* memory = ++numAllocations != failingAllocation ? std::malloc(size > 0 ? size : 1) : nullptr;
+    if (memory == nullptr)
+        throw std::bad_alloc();
+    return memory;
+}
+
+void operator delete(void* memory) noexcept
+{
+    std::free(memory);
+}
+
+void operator delete(void* memory, std::size_t) noexcept
+{
+    std::free(memory);
+}
+
+namespace
+{
+
+template<class Step, class OtherStep>
+auto OrElse(const Step& step, const OtherStep& otherStep)
+{
+    try
+    {
+        return step();
+    }
+    catch (const std::bad_alloc&)
+    {
+        return otherStep();
+    }
+}
+
+/// Takes the step once more if memory failed it: nothing half done may be in the way.
+template<class Step>
+auto Again(const Step& step)
+{
+    return OrElse(step, step);
+}
+
+const std::vector<std::string> kKinds{"first of the kinds", "second of the kinds", "third of the kinds"};
+const std::vector<double> kGroups{2.0, 4.0};
+
+/// The variables of SomeRecords(), with user-missing values that these don't have.
+void FillList(BINVarList& list)
+{
+    constexpr auto kAttribute = IBINVariable::RoleAttribute;
+    constexpr auto kTarget = IBINVariable::RoleTarget;
+    EXPECT_EQ(0, Again([&] { return list.AddContVar("size", "in whole metres, rounded", kAttribute); }));
+    EXPECT_EQ(1, Again([&] { return list.AddContVar("price", "", kAttribute); }));
+    EXPECT_EQ(2, Again([&] { return list.AddCatVar("kind", "", kKinds, kKinds, kTarget); }));
+    EXPECT_EQ(3, Again([&] { return list.AddCatVar("group", "", kGroups, kAttribute); }));
+    EXPECT_EQ(4, Again([&] { return list.AddWeightVar("weight", "", kUnrounded); }));
+    EXPECT_TRUE(Again([&] { return list.AddDiscreteUserMissing(0, 99.0, "not measured at all"); }));
+    EXPECT_TRUE(Again([&] { return list.AddDiscreteUserMissing(2, "none of the kinds", "none of the kinds"); }));
+    EXPECT_TRUE(Again([&] { return list.SetMissingInterval(1, 90.0, 99.0); }));
+}
+
+std::unique_ptr<IBINAlgorithm> Create(BINFactory& factory, BINSettings& settings, BINVarList& list)
+{
+    return std::unique_ptr<IBINAlgorithm>(factory.CreateBINAlgorithm(settings, list));
+}
+
+std::unique_ptr<IEFBINAlgorithm> Create(EFBINFactory& factory, EFBINSettings& settings, BINVarList& list)
+{
+    return std::unique_ptr<IEFBINAlgorithm>(factory.CreateEFBINAlgorithm(settings, list));
+}
+
+/// All that a host does with the library.
+template<class Host, class Factory, class Settings>
+auto UseAll(const Settings& settings, RecordTable& records)
+{
+    BINVarList list;
+    FillList(list);
+    BINVarList copiedList = Again([&] { return BINVarList(list); });
+    Settings copiedSettings = Again([&] { return Settings(settings); });
+    Factory factory;
+    auto algorithm = Again([&] { return Create(factory, copiedSettings, copiedList); });
+    if (factory.GetStatus().GetErrorCode() == MCBinning::BINStatusOutOfMemory)
+        algorithm = Create(factory, copiedSettings, copiedList);
+    Host host(std::move(algorithm));
+
+    const auto outOfMemory = [] { return MCBinning::MCStatus(MCBinning::BINStatusOutOfMemory, false); };
+    const MCBinning::MCStatus first = OrElse([&] { return host.Run(records); }, outOfMemory);
+    MCBinning::MCStatus second = OrElse([&] { return RunSecond(host, records); }, outOfMemory);
+    if (first.IsError() && second.GetErrorCode() == MCBinning::BINStatusNoRecords)
+        second = first; // a reading of the source that was broken off leaves no data
+    auto results = Again([&] { return host.All(); });
+    const auto copiedOutput = Again([&] { return *host->GetOutput(); });
+    Again([&] { return copiedOutput.GetAllCutPoints(results); });
+    return Outcome<typename decltype(results)::value_type>{first, second, std::move(results)};
+}
+
+/// Lets the first allocation fail, then the second, until the host is done before the failing one.
+template<class Host, class Factory, class Settings>
+void FailEachAllocation(Settings settings)
+{
+    const TempDir dir;
+    settings.SetTempDirName(dir.Path());
+    RecordTable records = SomeRecords(50);
+    const auto undisturbed = UseAll<Host, Factory>(settings, records);
+    ASSERT_TRUE(undisturbed.fSecond.IsOK());
+
+    int n = 0;
+    for (bool hasFired = true; hasFired && !::testing::Test::HasFailure();)
+    {
+        SCOPED_TRACE("allocation " + std::to_string(++n));
+        records = SomeRecords(50);
+        failingAllocation = numAllocations + n;
+        const auto disturbed = UseAll<Host, Factory>(settings, records);
+        hasFired = numAllocations >= failingAllocation;
+        failingAllocation = 0;
+
+        ExpectSound(undisturbed, disturbed, MCBinning::BINStatusOutOfMemory);
+        EXPECT_TRUE(dir.IsEmpty());
+    }
+    EXPECT_GT(n, 300) << "valgrind takes this operator new only with --soname-synonyms=somalloc=nouserintercepts";
+}
+
+} // namespace
+
+TEST(EveryAllocation, MayFailForAHostOfSupervisedRuns)
+{
+    FailEachAllocation<Supervised, BINFactory>(PreBinningSettings());
+}
+
+TEST(EveryAllocation, MayFailForAHostOfEqualFrequencyRuns)
+{
+    FailEachAllocation<EqualFrequency, EFBINFactory>(EqualFrequencySettings(6));
+}
