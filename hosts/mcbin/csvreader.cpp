@@ -3,51 +3,44 @@
 #include "failure.h"
 
 #include <algorithm>
-#include <cerrno>
 #include <cstring>
-#include <filesystem>
 #include <new>
 #include <utility>
 
-// libcsv calls back for each field and each line end, and can't be halted in between. So all rows of a block are
-// collected, and then handed out one by one.
+// Almost every line of almost every file has no quote. Such a line is a row, and is cut at its delimiters where it
+// stands in the buffer: libcsv, which goes character by character and copies, needs six times as long. It gets the lines
+// from one with a quote on, until the row that began there has ended; so all that makes the format hard is its.
 
 namespace
 {
 
-constexpr std::size_t kBlockSize = 1 << 16;
+constexpr std::size_t kBufferSize = 1 << 18;
 /// Behind a quote that is never closed, the rest of the file is one field, and memory would grow with it.
 constexpr std::size_t kLongestField = 1 << 24;
+constexpr std::size_t kLongestLine = std::size_t(1) << 30;
 constexpr std::string_view kUtf8Mark = "\xEF\xBB\xBF";
 
-std::FILE* Open(const std::string& path)
-{
-    // Asked first, as to open a pipe would wait for its other end.
-    std::error_code error;
-    const std::filesystem::file_status status = std::filesystem::status(path, error);
-    if (std::filesystem::exists(status) && !std::filesystem::is_regular_file(status))
-        throw Failure(path + ": not a regular file; it has to be one, as it is read twice");
-    std::FILE* const file = std::fopen(path.c_str(), "rb");
-    if (!file)
-        throw Failure(path + ": " + std::strerror(errno));
-    return file;
-}
-
-csv_parser* MakeParser()
+csv_parser* MakeParser(char delimiter)
 {
     auto parser = std::make_unique<csv_parser>();
     csv_init(parser.get(), CSV_STRICT | CSV_STRICT_FINI | CSV_REPALL_NL);
-    csv_set_blk_size(parser.get(), kBlockSize);
+    csv_set_delim(parser.get(), static_cast<unsigned char>(delimiter));
+    csv_set_blk_size(parser.get(), 1 << 16);
     return parser.release();
 }
 
-} // namespace
-
-std::string_view CsvRow::operator[](std::size_t index) const
+const char* Find(const char* begin, const char* end, char what)
 {
-    const std::size_t begin = index == 0 ? 0 : fEnds[index - 1];
-    return std::string_view(fText).substr(begin, fEnds[index] - begin);
+    const void* const found = std::memchr(begin, what, static_cast<std::size_t>(end - begin));
+    return found ? static_cast<const char*>(found) : end;
 }
+
+std::string_view MakeView(const char* begin, const char* end)
+{
+    return std::string_view(begin, static_cast<std::size_t>(end - begin));
+}
+
+} // namespace
 
 void CsvReader::ParserDeleter::operator()(csv_parser* parser) const
 {
@@ -55,62 +48,170 @@ void CsvReader::ParserDeleter::operator()(csv_parser* parser) const
     delete parser;
 }
 
-CsvReader::CsvReader(const std::string& path)
-    : fPath(path), fFile(Open(path)), fParser(MakeParser()), fBlock(kBlockSize), fRows(1)
+CsvReader::CsvReader(InputFile file, char delimiter)
+    : fFile(std::move(file)), fDelimiter(delimiter), fParser(MakeParser(delimiter)), fBuffer(kBufferSize), fRows(1)
 {
+    Rewind();
 }
 
 const CsvRow* CsvReader::NextRow()
 {
-    while (fNextRow == fNumRows && !fAtEnd && !fFailure) ReadBlock();
-    if (fNextRow < fNumRows)
-        return &fRows[fNextRow++];
-    if (fFailure)
-        std::rethrow_exception(fFailure);
-    return nullptr;
+    for (;;)
+    {
+        if (fNextRow < fNumRows)
+            return &ShowFields(fRows[fNextRow++]);
+        if (fFailure)
+            std::rethrow_exception(fFailure);
+        if (!FindLine())
+        {
+            if (!fInRow)
+                return nullptr;
+            FinishParsing();
+        }
+        else if (fInRow || FindSpecial(fLineEnd) < fLineEnd)
+            ParseLine();
+        else if (SplitLine(MakeView(std::exchange(fBegin, fLineEnd), fLineEnd)))
+            return &fPlainRow;
+    }
 }
 
 void CsvReader::Rewind()
 {
-    std::rewind(fFile.get());
+    fFile.Rewind();
+    fBegin = fEnd = fSpecial = fBuffer.data();
+    fFileRead = false;
     fLine = 1;
     fLastTerminator = 0;
-    fAtEnd = false;
+    Refill();
+    if (MakeView(fBegin, fEnd).substr(0, kUtf8Mark.size()) == kUtf8Mark)
+        fBegin += kUtf8Mark.size();
+    fSpecial = fBegin;
 }
 
-void CsvReader::ReadBlock()
+/// Finds the end of the line at fBegin, or of a part of it that is one for the parser. \return false at the end of the file.
+bool CsvReader::FindLine()
 {
-    // The row that the last block has left unfinished goes on in this one.
+    const char* searched = fBegin;
+    for (;;)
+    {
+        fLineEnd = Find(searched, fEnd, '\n');
+        if (fLineEnd != fEnd)
+        {
+            ++fLineEnd;
+            return true;
+        }
+        const std::ptrdiff_t size = fEnd - fBegin;
+        // The parser takes parts of a line, too; so a file whose lines end with CR doesn't fill the memory.
+        const bool isForParser = fInRow || FindSpecial(fEnd) < fEnd;
+        if ((isForParser && static_cast<std::size_t>(size) == fBuffer.size()) || !Refill())
+        {
+            fLineEnd = fEnd;
+            return fBegin != fEnd;
+        }
+        searched = fBegin + size;
+    }
+}
+
+/// Moves what is left to the front of the buffer, which grows if that fills it, and reads on behind it. \return false if
+/// there is nothing more.
+bool CsvReader::Refill()
+{
+    if (fFileRead)
+        return false;
+    const auto left = static_cast<std::size_t>(fEnd - fBegin);
+    const std::ptrdiff_t unspecial = std::max(fSpecial, fBegin) - fBegin;
+    std::memmove(fBuffer.data(), fBegin, left);
+    if (left == fBuffer.size())
+    {
+        if (left >= kLongestLine)
+            throw Failure(GetName() + ", line " + std::to_string(fLine) + ": longer than 1 GB");
+        fBuffer.resize(2 * left);
+    }
+    const std::size_t size = fFile.Read(fBuffer.data() + left, fBuffer.size() - left);
+    fFileRead = size < fBuffer.size() - left;
+    fBegin = fBuffer.data();
+    fEnd = fBegin + left + size;
+    fSpecial = fBegin + unspecial;
+    return size > 0;
+}
+
+/// The first quote before `end`, or a CR that isn't part of the line's CRLF; `end` if there is none.
+const char* CsvReader::FindSpecial(const char* end)
+{
+    while (fSpecial < end)
+    {
+        const char* const quote = Find(std::max(fSpecial, fBegin), end, '"');
+        const char* const back = Find(std::max(fSpecial, fBegin), quote, '\r');
+        if (back != quote && back + 2 == end && back[1] == '\n')
+            fSpecial = end;
+        else if (back != quote || quote != end)
+            return std::min(back, quote);
+        else
+            fSpecial = end;
+    }
+    return end;
+}
+
+/// \return false for a blank line.
+bool CsvReader::SplitLine(std::string_view line)
+{
+    fPlainRow.fLine = fLine++;
+    if (!line.empty() && line.back() == '\n')
+        line.remove_suffix(1);
+    if (!line.empty() && line.back() == '\r')
+        line.remove_suffix(1);
+
+    fPlainRow.fFields.clear();
+    const char* const end = line.data() + line.size();
+    const char* begin = line.data();
+    for (const char* fieldEnd; (fieldEnd = Find(begin, end, fDelimiter)) != end; begin = fieldEnd + 1)
+        AddTrimmed(MakeView(begin, fieldEnd));
+    AddTrimmed(MakeView(begin, end));
+    fLastTerminator = 0;
+    return fPlainRow.Size() > 1 || !fPlainRow[0].empty();
+}
+
+void CsvReader::AddTrimmed(std::string_view field)
+{
+    const auto isSpace = [this](char c) { return (c == ' ' || c == '\t') && c != fDelimiter; };
+    while (!field.empty() && isSpace(field.front())) field.remove_prefix(1);
+    while (!field.empty() && isSpace(field.back())) field.remove_suffix(1);
+    fPlainRow.fFields.push_back(field);
+}
+
+/// Gives a line to the parser, and takes the rows that end in it.
+void CsvReader::ParseLine()
+{
+    // The row that the last line has left unfinished goes on in this one.
     std::swap(fRows.front(), fRows[fNumRows]);
     fNumRows = 0;
     fNextRow = 0;
-
-    const bool isFirst = std::ftell(fFile.get()) == 0;
-    const std::size_t size = std::fread(fBlock.data(), 1, fBlock.size(), fFile.get());
-    if (std::ferror(fFile.get()))
-        throw Failure(fPath + ": " + std::strerror(errno));
-    std::string_view block(fBlock.data(), size);
-    if (isFirst && block.substr(0, kUtf8Mark.size()) == kUtf8Mark)
-        block.remove_prefix(kUtf8Mark.size());
-    Parse(block, size < fBlock.size());
+    // The last character by itself: if it ends a row, and so isn't one of a quoted field, the parser is between rows.
+    Parse(MakeView(std::exchange(fBegin, fLineEnd - 1), fLineEnd - 1));
+    fInRow = true;
+    Parse(MakeView(std::exchange(fBegin, fLineEnd), fLineEnd));
 }
 
-void CsvReader::Parse(std::string_view block, bool isLast)
+void CsvReader::Parse(std::string_view text)
 {
-    bool isParsed = csv_parse(fParser.get(), block.data(), block.size(), OnField, OnRowEnd, this) == block.size();
-    if (isParsed && isLast)
+    if (csv_parse(fParser.get(), text.data(), text.size(), OnField, OnRowEnd, this) != text.size())
     {
-        isParsed = csv_fini(fParser.get(), OnField, OnRowEnd, this) == 0;
-        fAtEnd = true;
-        if (!isParsed)
-            Fail("a quoted field in this row is never closed");
-    }
-    else if (!isParsed && csv_error(fParser.get()) == CSV_EPARSE)
+        if (csv_error(fParser.get()) != CSV_EPARSE)
+            throw std::bad_alloc();
         Fail("a quote in the wrong place: a field that holds one must be quoted, and the quote in it doubled");
-    else if (!isParsed)
-        throw std::bad_alloc();
+    }
     else if (csv_get_buffer_size(fParser.get()) > kLongestField)
         Fail("a field of more than 16 MB; is a closing quote missing?");
+}
+
+void CsvReader::FinishParsing()
+{
+    std::swap(fRows.front(), fRows[fNumRows]);
+    fNumRows = 0;
+    fNextRow = 0;
+    fInRow = false;
+    if (csv_fini(fParser.get(), OnField, OnRowEnd, this) != 0)
+        Fail("a quoted field in this row is never closed");
 }
 
 // An exception must not pass through the C code between Parse and here.
@@ -153,6 +254,7 @@ void CsvReader::AddField(std::string_view text)
 
 void CsvReader::EndRow(int terminator)
 {
+    fInRow = false;
     const bool isBlank = fRows[fNumRows].fEnds.empty();
     const bool isSecondOfPair = isBlank && terminator == CSV_LF && fLastTerminator == CSV_CR;
     if (!isSecondOfPair)
@@ -167,10 +269,23 @@ void CsvReader::EndRow(int terminator)
     fRows[fNumRows].fEnds.clear();
 }
 
+/// The views of the fields, which are made when the row has come to its place.
+const CsvRow& CsvReader::ShowFields(CsvRow& row)
+{
+    row.fFields.clear();
+    const char* begin = row.fText.data();
+    for (const std::size_t end : row.fEnds)
+    {
+        row.fFields.push_back(MakeView(begin, row.fText.data() + end));
+        begin = row.fText.data() + end;
+    }
+    return row;
+}
+
 void CsvReader::Fail(const std::string& words)
 {
     const CsvRow& row = fRows[fNumRows];
     const long line = row.fEnds.empty() ? fLine : row.fLine;
     if (!fFailure)
-        fFailure = std::make_exception_ptr(Failure(fPath + ", line " + std::to_string(line) + ": " + words));
+        fFailure = std::make_exception_ptr(Failure(GetName() + ", line " + std::to_string(line) + ": " + words));
 }

@@ -1,25 +1,26 @@
 #ifndef MCBIN_CSVREADER_H
 #define MCBIN_CSVREADER_H
 
+#include "inputfile.h"
+
 #include <csv.h>
 
 #include <cstddef>
-#include <cstdio>
 #include <exception>
 #include <memory>
 #include <string>
 #include <string_view>
 #include <vector>
 
-/// One row of a CSV file.
+/// One row of a delimited text file. Its fields are good as long as the reader's documentation says.
 class CsvRow
 {
 public:
     /// The number of fields, at least 1.
-    std::size_t Size() const { return fEnds.size(); }
+    std::size_t Size() const { return fFields.size(); }
 
     /// The field without its quotes. `index` must be below Size().
-    std::string_view operator[](std::size_t index) const;
+    std::string_view operator[](std::size_t index) const { return fFields[index]; }
 
     /// The line of the file on which the row begins, from 1.
     long GetLine() const { return fLine; }
@@ -27,21 +28,21 @@ public:
 private:
     friend class CsvReader;
 
-    std::string fText; ///< all fields, one behind the other
-    std::vector<std::size_t> fEnds;
+    std::vector<std::string_view> fFields; ///< into fText, or into the reader's buffer for a row without quotes
+    std::string fText;                     ///< all fields, one behind the other
+    std::vector<std::size_t> fEnds;        ///< of the fields in fText
     long fLine = 0;
 };
 
-/// Reads the rows of a CSV file, of which it holds one block at a time.
+/// Reads the rows of a delimited text file, of which it holds one buffer at a time.
 ///
-/// Fields are separated by commas, rows end with LF, CRLF or CR, and the last row needs no end. A field in double quotes
-/// may hold commas, line ends and, doubled, quotes; quotes anywhere else are an error. Spaces around a field that isn't
-/// quoted are dropped, and so are blank lines and a UTF-8 mark at the beginning.
+/// Rows end with LF, CRLF or CR, and the last row needs no end. A field in double quotes may hold delimiters, line ends
+/// and, doubled, quotes; quotes anywhere else are an error. Spaces around a field that isn't quoted are dropped, and so
+/// are blank lines and a UTF-8 mark at the beginning.
 class CsvReader
 {
 public:
-    /// \throw Failure if the file can't be opened or, like a pipe, can't be read twice.
-    explicit CsvReader(const std::string& path);
+    CsvReader(InputFile file, char delimiter);
 
     /// The next row, which stays the reader's and is good until the next call, or null at the end.
     /// \throw Failure for a bad row, once all rows before it have been handed out, or if the file can't be read.
@@ -50,13 +51,10 @@ public:
     /// Goes back to the first row. Only to be called when NextRow() has given null.
     void Rewind();
 
-    const std::string& GetPath() const { return fPath; }
+    const std::string& GetName() const { return fFile.GetName(); }
+    char GetDelimiter() const { return fDelimiter; }
 
 private:
-    struct FileCloser
-    {
-        void operator()(std::FILE* file) const { std::fclose(file); }
-    };
     struct ParserDeleter
     {
         void operator()(csv_parser* parser) const;
@@ -65,24 +63,40 @@ private:
     static void OnField(void* text, std::size_t size, void* reader);
     static void OnRowEnd(int terminator, void* reader);
 
+    bool FindLine();
+    bool Refill();
+    const char* FindSpecial(const char* end);
+    bool SplitLine(std::string_view line);
+    void AddTrimmed(std::string_view field);
+
+    void ParseLine();
+    void Parse(std::string_view text);
+    void FinishParsing();
     template<class Work>
     void KeepFailure(Work work);
-    void ReadBlock();
-    void Parse(std::string_view block, bool isLast);
     void AddField(std::string_view text);
     void EndRow(int terminator);
+    const CsvRow& ShowFields(CsvRow& row);
     void Fail(const std::string& words);
 
-    std::string fPath;
-    std::unique_ptr<std::FILE, FileCloser> fFile;
+    InputFile fFile;
+    char fDelimiter;
     std::unique_ptr<csv_parser, ParserDeleter> fParser;
-    std::vector<char> fBlock;
-    std::vector<CsvRow> fRows;   ///< the fNumRows finished ones of the block, then the one being read
-    std::size_t fNumRows = 0;    ///< rows of the block that are finished
+
+    std::vector<char> fBuffer;
+    const char* fBegin = nullptr;   ///< of what isn't handed out yet
+    const char* fEnd = nullptr;     ///< of what has been read
+    const char* fLineEnd = nullptr; ///< what FindLine() has found: behind the line end, or the end of the file
+    const char* fSpecial = nullptr; ///< no quote or CR stands from fBegin up to here
+    bool fFileRead = false;         ///< there is nothing behind the buffer
+
+    CsvRow fPlainRow;
+    std::vector<CsvRow> fRows;   ///< the parser's fNumRows finished ones, then the one being read
+    std::size_t fNumRows = 0;    ///< rows that the parser has finished
     std::size_t fNextRow = 0;    ///< the one of them that is handed out next
-    long fLine = 1;              ///< the line that the parser has come to
-    int fLastTerminator = 0;     ///< what ended the last line
-    bool fAtEnd = false;         ///< the parser has seen the whole file
+    bool fInRow = false;         ///< the parser waits for the rest of a row
+    long fLine = 1;              ///< the line that the reader has come to
+    int fLastTerminator = 0;     ///< what ended the parser's last line
     std::exception_ptr fFailure; ///< thrown once the rows before it have been handed out
 };
 

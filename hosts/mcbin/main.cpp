@@ -1,66 +1,106 @@
-#include "commands.h"
+#include "apply.h"
+#include "commandline.h"
+#include "csvoutput.h"
 #include "failure.h"
+#include "figures.h"
+#include "interrupt.h"
+#include "jsonoutput.h"
+#include "outputfile.h"
+#include "progress.h"
+#include "run.h"
+#include "sqloutput.h"
+#include "tableoutput.h"
+#include "tablereader.h"
+#include "terminal.h"
 
-#include <CLI/CLI.hpp>
-
-#include <csignal>
+#include <algorithm>
 #include <exception>
 #include <iostream>
-#include <limits>
 #include <new>
+#include <sstream>
+
+#include <unistd.h>
 
 namespace
 {
 
 constexpr int kFailure = 1;
 constexpr int kUsage = 2;
+constexpr int kFlagged = 3;
+constexpr int kInterrupted = 130;
 
-void AddSupervised(CLI::App& app, SupervisedOptions& options)
+std::string Print(const Findings& findings, Format format)
 {
-    CLI::App* const command =
-        app.add_subcommand("supervised", "Cut the numeric columns where the categories of a target are separated best");
-    command->add_option("FILE", options.file, "CSV file; its first line names the columns")->required();
-    command->add_option("--target", options.target, "The column whose categories are to be separated")
-        ->required()
-        ->option_text("NAME REQUIRED");
-    command->callback([&options] { RunSupervised(options, std::cout); });
+    std::ostringstream os;
+    switch (format)
+    {
+    case Format::kTable:
+        PrintTables(os, findings, {GetTerminalWidth(STDOUT_FILENO), HasColours(STDOUT_FILENO)});
+        break;
+    case Format::kJson:
+        PrintJson(os, findings);
+        break;
+    case Format::kCsv:
+        PrintCsv(os, findings);
+        break;
+    case Format::kSql:
+        PrintSql(os, findings);
+        break;
+    }
+    return os.str();
 }
 
-void AddEqualFrequency(CLI::App& app, EqualFrequencyOptions& options)
+void Write(const std::string& path, const std::string& text)
 {
-    CLI::App* const command =
-        app.add_subcommand("equal-frequency", "Cut the numeric columns into bins of about equal weight");
-    command->add_option("FILE", options.file, "CSV file; its first line names the columns")->required();
-    command->add_option("--bins", options.bins, "The number of bins to aim at, at least 2")
-        ->required()
-        ->check(CLI::Range(2, std::numeric_limits<int>::max()))
-        ->option_text("N REQUIRED");
-    command->callback([&options] { RunEqualFrequency(options, std::cout); });
+    OutputFile output(path);
+    output.Write(text);
+    output.Commit();
+}
+
+int GetExitCode(const Findings& findings, bool isStrict)
+{
+    if (findings.status.GetErrorCode() == MCBinning::BINStatusCancelled)
+    {
+        std::cerr << "mcbin: interrupted; these are the results up to then\n";
+        return kInterrupted;
+    }
+    const auto isFlagged = [](const Result& result) { return !result.status.IsOK(); };
+    return isStrict && std::any_of(findings.results.begin(), findings.results.end(), isFlagged) ? kFlagged : 0;
+}
+
+int Bin(const BinOptions& options)
+{
+    Progress progress(IsTerminal(STDERR_FILENO) && !options.output.isQuiet);
+    TableOptions tableOptions = options.table;
+    tableOptions.spoolDirectory = options.settings.tempDirectory;
+    TableReader table(tableOptions);
+    const Findings findings = FindBins(table, options, progress);
+    Write("-", Print(findings, options.output.format));
+    return GetExitCode(findings, options.output.isStrict);
 }
 
 int Run(int argc, char** argv)
 {
-    CLI::App app("Bins the numeric columns of a CSV file.", "mcbin");
-    app.require_subcommand(1);
-    SupervisedOptions supervised;
-    AddSupervised(app, supervised);
-    EqualFrequencyOptions equalFrequency;
-    AddEqualFrequency(app, equalFrequency);
+    Request request;
+    const std::unique_ptr<CLI::App> app = MakeCommandLine(request);
     try
     {
-        app.parse(argc, argv); // calls the command
+        app->parse(argc, argv);
     }
     catch (const CLI::Success& help)
     {
-        app.exit(help);
+        app->exit(help);
+        return 0;
     }
     catch (const CLI::ParseError& error)
     {
         std::cerr << "mcbin: " << error.what() << "\nRun 'mcbin --help' for more information.\n";
         return kUsage;
     }
-    if (!std::cout.flush())
-        throw Failure("cannot write the results to standard output");
+    if (request.command != Request::Command::kApply)
+        return Bin(request.bin);
+    Progress progress(IsTerminal(STDERR_FILENO) && !request.apply.isQuiet);
+    ApplyBins(request.apply, progress);
     return 0;
 }
 
@@ -68,11 +108,19 @@ int Run(int argc, char** argv)
 
 int main(int argc, char** argv)
 {
-    // A closed pipe shall be a failed write, so that the temporary files are still removed.
-    std::signal(SIGPIPE, SIG_IGN);
+    CatchSignals();
     try
     {
         return Run(argc, argv);
+    }
+    catch (const Interrupted&)
+    {
+        std::cerr << "mcbin: interrupted; there are no results yet\n";
+        return kInterrupted;
+    }
+    catch (const PipeClosed&)
+    {
+        // Who closed it knows.
     }
     catch (const std::bad_alloc&)
     {

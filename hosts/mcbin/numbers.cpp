@@ -17,6 +17,22 @@ std::optional<double> ParseNumber(std::string_view text)
     return value;
 }
 
+bool IsNumber(std::string_view text)
+{
+    // Digits and at most one point, which can be no other number than a small one; the rest is from_chars's.
+    constexpr std::size_t kSmallSize = 40;
+    std::size_t digits = 0;
+    std::size_t points = 0;
+    const std::size_t sign = !text.empty() && text.front() == '-' ? 1 : 0;
+    for (const char c : text.substr(sign))
+    {
+        digits += static_cast<unsigned char>(c - '0') < 10;
+        points += c == '.';
+    }
+    const bool isPlain = digits > 0 && points <= 1 && sign + digits + points == text.size();
+    return (isPlain && text.size() < kSmallSize) || ParseNumber(text).has_value();
+}
+
 std::string FormatNumber(double value)
 {
     // Left to itself, to_chars writes 100000 as 1e+05, being the shorter one by a character.

@@ -1,28 +1,36 @@
 #include "recordsource.h"
 
+#include "columnplan.h"
 #include "numbers.h"
+#include "progress.h"
 #include "tablereader.h"
 #include "variables.h"
 
 #include <mcobnqrt/binstringencoder.h>
 
 #include <optional>
-#include <utility>
 
 namespace
 {
 
 constexpr const char* kChanged = "the file has changed while it was read";
 
+/// A weight has an encoder, too, but its field is the weight as it is.
+const BINStringEncoder* FindEncoder(const BINVarList& list, int index)
+{
+    return dynamic_cast<const BINStringEncoder*>(list.GetEncoderAt(index));
+}
+
 } // namespace
 
-TableRecordSource::TableRecordSource(TableReader& table, const Variables& variables, long nRows)
-    : fTable(table), fRowsLeft(nRows), fRecord(static_cast<int>(variables.columns.size()))
+TableRecordSource::TableRecordSource(TableReader& table, const ColumnPlan& plan, const Variables& variables,
+                                     Progress& progress)
+    : fTable(table), fPlan(plan), fProgress(progress), fRowsLeft(plan.nRows),
+      fRecord(static_cast<int>(variables.columns.size()))
 {
-    // Every encoder is of strings, as only targets are categorical.
     for (std::size_t i = 0; i < variables.columns.size(); ++i)
-        fFields.push_back({variables.columns[i],
-                           static_cast<const BINStringEncoder*>(variables.list.GetEncoderAt(static_cast<int>(i)))});
+        fFields.push_back({variables.columns[i], &plan.columns[variables.columns[i]],
+                           FindEncoder(variables.list, static_cast<int>(i))});
     fTable.Rewind();
 }
 
@@ -33,6 +41,8 @@ bool TableRecordSource::HasNext()
     fRow = fTable.NextRow();
     if (fRow ? fRowsLeft == 0 : fRowsLeft != 0)
         throw fTable.MakeFailure(kChanged);
+    if (!fRow)
+        fProgress.BeginAttributes();
     return fRow != nullptr;
 }
 
@@ -41,7 +51,7 @@ const MCCommon::Record* TableRecordSource::Next()
     if (!HasNext())
         return nullptr;
     for (std::size_t i = 0; i < fFields.size(); ++i)
-        fRecord[static_cast<int>(i)] = Convert(fFields[i], (*fRow)[fFields[i].column]);
+        fRecord[static_cast<int>(i)] = Convert(fFields[i], (*fRow)[fFields[i].place]);
     --fRowsLeft;
     fRow = nullptr;
     return &fRecord;
@@ -49,18 +59,22 @@ const MCCommon::Record* TableRecordSource::Next()
 
 double TableRecordSource::Convert(const Field& field, std::string_view text)
 {
-    if (text.empty())
+    if (fPlan.IsMissing(*field.column, text))
         return MCMV::gMissingValue;
-    if (!field.encoder)
-    {
-        const std::optional<double> number = ParseNumber(text);
-        if (!number)
-            throw fTable.MakeFailure(*fRow, kChanged);
+    if (field.encoder)
+        return ConvertCategory(field, text);
+    if (const std::optional<double> number = ParseNumber(text))
         return *number;
-    }
+    if (!fPlan.isBadMissing)
+        throw fTable.MakeFailure(fRow->GetLine(), kChanged);
+    return MCMV::gMissingValue;
+}
+
+double TableRecordSource::ConvertCategory(const Field& field, std::string_view text)
+{
     fCategory = text;
     const double code = field.encoder->EncodeConst(fCategory);
     if (code < 0.0)
-        throw fTable.MakeFailure(*fRow, kChanged);
+        throw fTable.MakeFailure(fRow->GetLine(), kChanged);
     return code;
 }

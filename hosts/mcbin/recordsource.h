@@ -1,7 +1,6 @@
 #ifndef MCBIN_RECORDSOURCE_H
 #define MCBIN_RECORDSOURCE_H
 
-#include <mcobnqrt/binvarlist.h>
 #include <mcobnqrt/ibinrecordsource.h>
 #include <mcobnqrt/mccommon.h>
 
@@ -12,18 +11,21 @@
 
 class BINStringEncoder;
 class CsvRow;
+class Progress;
 class TableReader;
+struct Column;
+struct ColumnPlan;
 struct Variables;
 
-/// The rows of a table as records of the variables, read as they are asked for. An empty field is missing.
+/// The rows of a table as records of the variables, read as they are asked for.
 ///
 /// All operations throw a Failure where a row can't be read or isn't what it was when the variables were made.
 class TableRecordSource : public IBINRecordSource
 {
 public:
-    /// `table` has been read to its end once, and was found to have `nRows` rows. Both `table` and `variables` are the
+    /// `table` has been read to its end once, to complete `plan`, from which `variables` have been made. All are the
     /// caller's and outlive this object.
-    TableRecordSource(TableReader& table, const Variables& variables, long nRows);
+    TableRecordSource(TableReader& table, const ColumnPlan& plan, const Variables& variables, Progress& progress);
 
     bool HasNext() override;
 
@@ -33,13 +35,17 @@ public:
 private:
     struct Field
     {
-        std::size_t column;              ///< its place in the table
+        std::size_t place;               ///< of the column in the table
+        const Column* column;            ///< the same
         const BINStringEncoder* encoder; ///< null for a number
     };
 
     double Convert(const Field& field, std::string_view text);
+    double ConvertCategory(const Field& field, std::string_view text);
 
     TableReader& fTable;
+    const ColumnPlan& fPlan;
+    Progress& fProgress;
     std::vector<Field> fFields;   ///< by variable index
     const CsvRow* fRow = nullptr; ///< what HasNext() has found for Next(); null if it hasn't looked
     long fRowsLeft;               ///< how many more rows there should be

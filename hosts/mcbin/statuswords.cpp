@@ -61,11 +61,21 @@ const char* GetWords(MCBinning::BINStatusCode code)
 
 } // namespace
 
+const char* GetStatusWords(const MCBinning::MCStatus& status)
+{
+    return status.IsOK() ? "OK" : GetWords(static_cast<MCBinning::BINStatusCode>(status.GetErrorCode()));
+}
+
+const char* GetSeverity(const MCBinning::MCStatus& status)
+{
+    if (status.IsOK())
+        return "ok";
+    return status.IsError() ? "error" : "warning";
+}
+
 std::string DescribeStatus(const MCBinning::MCStatus& status)
 {
     if (status.IsOK())
         return "OK";
-    const long code = status.GetErrorCode();
-    return (status.IsError() ? "error " : "warning ") + std::to_string(code) + ": " +
-           GetWords(static_cast<MCBinning::BINStatusCode>(code));
+    return GetSeverity(status) + (" " + std::to_string(status.GetErrorCode())) + ": " + GetStatusWords(status);
 }

@@ -1,8 +1,10 @@
 #include "tableprofile.h"
 
+#include "columnplan.h"
 #include "numbers.h"
+#include "progress.h"
 #include "tablereader.h"
-#include "texttable.h"
+#include "text.h"
 
 #include <string_view>
 
@@ -12,52 +14,74 @@ namespace
 /// A run takes the codes from 0 to 255.
 constexpr std::size_t kMostCategories = 256;
 
-void AddCategory(Column& column, std::string_view field)
+void ProfileNumber(Column& column, std::string_view field, long line)
 {
-    if (column.categories.find(field) == column.categories.end())
-        column.categories.emplace(field);
-}
-
-void NoteText(Column& column, std::string_view field, long line)
-{
-    column.isNumeric = false;
-    column.firstText = field;
-    column.firstTextLine = line;
-}
-
-void ProfileField(Column& column, std::string_view field, long line)
-{
-    if (field.empty())
+    if (IsNumber(field))
+    {
+        ++column.nNumbers;
         return;
-    if (column.isTarget)
-        AddCategory(column, field);
-    else if (column.isNumeric && !ParseNumber(field))
-        NoteText(column, field, line);
+    }
+    if (column.nTexts++ == 0)
+    {
+        column.firstText = field;
+        column.firstTextLine = line;
+    }
+}
+
+void ProfileCategory(const TableReader& table, Column& column, std::size_t place, std::string_view field, long line)
+{
+    if (column.categories.find(field) != column.categories.end())
+        return;
+    column.categories.emplace(field);
+    if (column.categories.size() > kMostCategories)
+        throw table.MakeFailure(line, place,
+                                "more than " + std::to_string(kMostCategories) +
+                                    " categories, which are too many for a " +
+                                    (column.isTarget ? "target" : "categorical attribute"));
+}
+
+void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t place, std::string_view field, long line)
+{
+    Column& column = plan.columns[place];
+    if (!column.IsUsed() || plan.IsMissing(column, field))
+        return;
+    if (column.kind == ColumnKind::kCategorical)
+        ProfileCategory(table, column, place, field, line);
+    else
+        ProfileNumber(column, field, line);
+}
+
+void SettleKind(const TableReader& table, const ColumnPlan& plan, std::size_t place, Column& column)
+{
+    if (column.kind == ColumnKind::kCategorical)
+        return;
+    const bool isText = column.kind == ColumnKind::kUnknown && column.nTexts > 0 && column.nTexts >= column.nNumbers;
+    if (isText && column.isNamed)
+        throw table.MakeFailure(column.firstTextLine, place,
+                                "holds text, such as " + Quote(Shorten(column.firstText)) +
+                                    "; with --categorical its categories are binned in sorted order");
+    if (isText)
+        column.isAttribute = false;
+    else if (column.nTexts > 0 && !plan.isBadMissing)
+        throw table.MakeNotANumber(column.firstTextLine, place, column.firstText);
+    else
+        column.kind = ColumnKind::kContinuous;
 }
 
 } // namespace
 
-TableProfile ProfileTable(TableReader& table, std::optional<std::size_t> target)
+void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress)
 {
-    TableProfile profile;
-    for (const std::string& name : table.GetColumnNames())
-    {
-        profile.columns.emplace_back();
-        profile.columns.back().name = name;
-    }
-    if (target)
-        profile.columns[*target].isTarget = true;
-
+    progress.BeginRows("learning the columns");
     while (const CsvRow* const row = table.NextRow())
     {
-        ++profile.nRows;
-        for (std::size_t i = 0; i < row->Size(); ++i) ProfileField(profile.columns[i], (*row)[i], row->GetLine());
-        if (target && profile.columns[*target].categories.size() > kMostCategories)
-            throw table.MakeFailure(*row, "column " + Quote(profile.columns[*target].name) + " has more than " +
-                                              std::to_string(kMostCategories) +
-                                              " categories, which are too many for a target");
+        progress.CountRow();
+        ++plan.nRows;
+        for (std::size_t i = 0; i < row->Size(); ++i) ProfileField(table, plan, i, (*row)[i], row->GetLine());
     }
-    if (profile.nRows == 0)
+    if (plan.nRows == 0)
         throw table.MakeFailure("there is no row below the header");
-    return profile;
+    for (std::size_t i = 0; i < plan.columns.size(); ++i)
+        if (plan.columns[i].IsUsed())
+            SettleKind(table, plan, i, plan.columns[i]);
 }

@@ -1,8 +1,10 @@
 #include "tablereader.h"
 
-#include "texttable.h"
+#include "delimiter.h"
+#include "text.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace
 {
@@ -15,9 +17,23 @@ std::vector<std::string> NameColumns(const CsvRow& header)
     return names;
 }
 
+CsvReader Open(const TableOptions& options)
+{
+    InputFile file =
+        options.file == "-" ? InputFile::SpoolStandardInput(options.spoolDirectory) : InputFile(options.file);
+    char delimiter = options.delimiter;
+    if (delimiter == '\0')
+    {
+        std::string beginning(1 << 16, '\0');
+        beginning.resize(file.Read(beginning.data(), beginning.size()));
+        delimiter = DetectDelimiter(beginning);
+    }
+    return CsvReader(std::move(file), delimiter);
+}
+
 } // namespace
 
-TableReader::TableReader(const std::string& path) : fReader(path)
+TableReader::TableReader(const TableOptions& options) : fReader(Open(options))
 {
     const CsvRow* const header = fReader.NextRow();
     if (!header)
@@ -25,7 +41,7 @@ TableReader::TableReader(const std::string& path) : fReader(path)
     fColumnNames = NameColumns(*header);
     for (auto name = fColumnNames.begin(); name != fColumnNames.end(); ++name)
         if (std::find(fColumnNames.begin(), name, *name) != name)
-            throw MakeFailure(*header, "two columns are named " + Quote(*name));
+            throw MakeFailure(header->GetLine(), "two columns are named " + Quote(*name));
 }
 
 std::size_t TableReader::FindColumn(const std::string& name) const
@@ -42,8 +58,8 @@ const CsvRow* TableReader::NextRow()
 {
     const CsvRow* const row = fReader.NextRow();
     if (row && row->Size() != fColumnNames.size())
-        throw MakeFailure(*row, "wrong number of fields: " + std::to_string(row->Size()) + ", but the header has " +
-                                    std::to_string(fColumnNames.size()));
+        throw MakeFailure(row->GetLine(), "wrong number of fields: " + std::to_string(row->Size()) +
+                                              ", but the header has " + std::to_string(fColumnNames.size()));
     return row;
 }
 
@@ -55,10 +71,22 @@ void TableReader::Rewind()
 
 Failure TableReader::MakeFailure(const std::string& words) const
 {
-    return Failure(fReader.GetPath() + ": " + words);
+    return Failure(fReader.GetName() + ": " + words);
 }
 
-Failure TableReader::MakeFailure(const CsvRow& row, const std::string& words) const
+Failure TableReader::MakeFailure(long line, const std::string& words) const
 {
-    return Failure(fReader.GetPath() + ", line " + std::to_string(row.GetLine()) + ": " + words);
+    return Failure(fReader.GetName() + ", line " + std::to_string(line) + ": " + words);
+}
+
+Failure TableReader::MakeFailure(long line, std::size_t column, const std::string& words) const
+{
+    return MakeFailure(line, "column " + Quote(fColumnNames[column]) + ": " + words);
+}
+
+Failure TableReader::MakeNotANumber(long line, std::size_t column, std::string_view field) const
+{
+    return MakeFailure(line, column,
+                       Quote(Shorten(field)) + " is not a number; if it stands for a missing value, say so with " +
+                           "--missing-text, and with --bad missing for all such fields");
 }

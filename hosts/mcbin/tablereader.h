@@ -6,17 +6,28 @@
 
 #include <cstddef>
 #include <string>
+#include <string_view>
 #include <vector>
 
-/// Reads a table: a CSV file whose first row names the columns, and whose every other row has a field for each of them.
-/// A column without a name is called "column 1", "column 2", ... after its place.
+/// Where a table is and how it is written.
+struct TableOptions
+{
+    std::string file;           ///< "-" for standard input
+    char delimiter = '\0';      ///< '\0' for finding it
+    std::string spoolDirectory; ///< for standard input; empty for the system's
+};
+
+/// Reads a table: a delimited file whose first row names the columns, and whose every other row has a field for each of
+/// them. A column without a name is called "column 1", "column 2", ... after its place.
 class TableReader
 {
 public:
     /// \throw Failure if the file can't be read, is empty, or has two columns of one name.
-    explicit TableReader(const std::string& path);
+    explicit TableReader(const TableOptions& options);
 
     const std::vector<std::string>& GetColumnNames() const { return fColumnNames; }
+    char GetDelimiter() const { return fReader.GetDelimiter(); }
+    const std::string& GetName() const { return fReader.GetName(); }
 
     /// The place of the column, from 0. \throw Failure, which tells what columns there are, if there is none of the name.
     std::size_t FindColumn(const std::string& name) const;
@@ -28,9 +39,13 @@ public:
     /// Goes back to the first row below the header. Only to be called when NextRow() has given null.
     void Rewind();
 
-    /// What is wrong with the file, or with the row, with the place put in front.
+    /// What is wrong with the file, with the row, or with a field in it, with the place put in front.
     Failure MakeFailure(const std::string& words) const;
-    Failure MakeFailure(const CsvRow& row, const std::string& words) const;
+    Failure MakeFailure(long line, const std::string& words) const;
+    Failure MakeFailure(long line, std::size_t column, const std::string& words) const;
+
+    /// The failure of a field that should be a number.
+    Failure MakeNotANumber(long line, std::size_t column, std::string_view field) const;
 
 private:
     CsvReader fReader;

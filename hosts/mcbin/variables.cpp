@@ -1,42 +1,82 @@
 #include "variables.h"
 
+#include "columnplan.h"
 #include "failure.h"
-#include "tableprofile.h"
-#include "texttable.h"
+#include "text.h"
 
 #include <string>
 
 namespace
 {
 
-void AddTarget(BINVarList& list, const Column& column)
+std::vector<std::string> GetCategories(const Column& column)
 {
+    const std::string what = column.isTarget ? "target" : "categorical attribute";
     if (column.categories.empty())
-        throw Failure("column " + Quote(column.name) + " is empty; a target needs at least 2 categories");
+        throw Failure("column " + Quote(column.name) + " has no value; a " + what + " needs at least 2 categories");
     if (column.categories.size() == 1)
         throw Failure("column " + Quote(column.name) + " has a single category, " + Quote(*column.categories.begin()) +
-                      "; a target needs at least 2");
-    const std::vector<std::string> categories(column.categories.begin(), column.categories.end());
-    list.AddCatVar(column.name, "", categories, IBINVariable::RoleTarget);
+                      "; a " + what + " needs at least 2");
+    return {column.categories.begin(), column.categories.end()};
+}
+
+/// With a list of pairs no variable is the target of the list.
+int AddVariable(BINVarList& list, const Column& column, bool hasPairs, IBINVariable::BINWRoundingOption rounding)
+{
+    if (column.isWeight)
+        return list.AddWeightVar(column.name, "", rounding);
+    if (column.kind == ColumnKind::kContinuous)
+        return list.AddContVar(column.name, "", IBINVariable::RoleAttribute);
+    const bool isTarget = column.isTarget && !hasPairs;
+    return list.AddCatVar(column.name, "", GetCategories(column),
+                          isTarget ? IBINVariable::RoleTarget : IBINVariable::RoleAttribute);
+}
+
+void DeclareMissing(BINVarList& list, int index, const Column& column)
+{
+    if (column.kind == ColumnKind::kCategorical)
+    {
+        for (const std::string& text : column.missingTexts) list.AddDiscreteUserMissing(index, text, "");
+        if (column.missingInterval)
+            throw Failure("column " + Quote(column.name) +
+                          " is categorical, and so its missing values can't be declared as an interval");
+        return;
+    }
+    for (const double number : column.missingNumbers) list.AddDiscreteUserMissing(index, number, "");
+    if (column.missingInterval)
+        list.SetMissingInterval(index, column.missingInterval->first, column.missingInterval->second);
+}
+
+void AddPairs(Variables& variables, const ColumnPlan& plan, const std::vector<int>& variableOfColumn)
+{
+    for (const auto& [attribute, target] : plan.pairs)
+    {
+        if (!plan.columns[attribute].isAttribute)
+            continue; // it turned out to be text
+        variables.pairAttributes.push_back(variableOfColumn[attribute]);
+        variables.pairTargets.push_back(variableOfColumn[target]);
+    }
 }
 
 } // namespace
 
-Variables MakeVariables(const TableProfile& profile)
+Variables MakeVariables(const ColumnPlan& plan, IBINVariable::BINWRoundingOption rounding)
 {
     Variables variables;
-    for (std::size_t i = 0; i < profile.columns.size(); ++i)
+    std::vector<int> variableOfColumn(plan.columns.size(), -1);
+    bool hasAttribute = false;
+    for (std::size_t i = 0; i < plan.columns.size(); ++i)
     {
-        const Column& column = profile.columns[i];
-        if (column.isTarget)
-            AddTarget(variables.list, column);
-        else if (column.isNumeric)
-            variables.list.AddContVar(column.name, "", IBINVariable::RoleAttribute);
-        else
+        const Column& column = plan.columns[i];
+        if (!column.IsUsed())
             continue;
+        hasAttribute = hasAttribute || column.isAttribute;
+        variableOfColumn[i] = AddVariable(variables.list, column, !plan.pairs.empty(), rounding);
+        DeclareMissing(variables.list, variableOfColumn[i], column);
         variables.columns.push_back(i);
     }
-    if (variables.list.GetNumAttributeVars() == 0)
-        throw Failure("there is nothing to bin: no column has numbers only, but for the target");
+    if (!hasAttribute)
+        throw Failure("there is nothing to bin: no column that could be an attribute has numbers");
+    AddPairs(variables, plan, variableOfColumn);
     return variables;
 }

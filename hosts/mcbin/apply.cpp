@@ -1,0 +1,162 @@
+#include "apply.h"
+
+#include "binner.h"
+#include "csvoutput.h"
+#include "failure.h"
+#include "figures.h"
+#include "jsoninput.h"
+#include "options.h"
+#include "outputfile.h"
+#include "progress.h"
+#include "tablereader.h"
+#include "text.h"
+
+#include <algorithm>
+#include <optional>
+#include <vector>
+
+namespace
+{
+
+/// One column of the output that isn't the input's.
+struct BinColumn
+{
+    std::size_t place; ///< of the attribute in the table
+    std::string name;
+    Binner binner;
+    std::vector<std::string> fields; ///< by bin: what is written
+};
+
+std::vector<std::string> MakeFields(const Findings& findings, const Result& result, const ApplyOptions& options,
+                                    char delimiter)
+{
+    std::vector<std::string> fields;
+    for (std::size_t i = 0; i < result.bins.size(); ++i)
+        fields.push_back(options.areLabels ? QuoteField(FormatBin(findings, result, result.bins[i]), delimiter)
+                                           : std::to_string(i));
+    return fields;
+}
+
+std::vector<BinColumn> MakeColumns(const TableReader& table, const Findings& findings, const ApplyOptions& options)
+{
+    std::vector<BinColumn> columns;
+    for (const Result& result : findings.results)
+    {
+        if (result.cutPoints.empty())
+            continue;
+        const std::size_t place = table.FindColumn(findings.GetAttribute(result).name);
+        const auto isSame = [place](const BinColumn& column) { return column.place == place; };
+        if (options.isInPlace && std::any_of(columns.begin(), columns.end(), isSame))
+            throw Failure("column " + Quote(findings.GetAttribute(result).name) +
+                          " has been binned for more than one target, so its bins can't take its place");
+        columns.push_back({place, GetBinColumn(findings, result), Binner(findings, result, options.missingText),
+                           MakeFields(findings, result, options, table.GetDelimiter())});
+    }
+    if (columns.empty())
+        throw Failure(options.bins + ": there is nothing to apply, as no attribute has cut points");
+    return columns;
+}
+
+void ThrowIfTaken(const TableReader& table, const std::vector<BinColumn>& columns)
+{
+    const std::vector<std::string>& names = table.GetColumnNames();
+    for (const BinColumn& column : columns)
+        if (std::find(names.begin(), names.end(), column.name) != names.end())
+            throw table.MakeFailure("there is a column " + Quote(column.name) +
+                                    " already; --in-place-columns makes no new ones");
+}
+
+std::string MakeHeader(const TableReader& table, const std::vector<BinColumn>& columns, bool isInPlace)
+{
+    std::vector<std::string> names;
+    for (const std::string& name : table.GetColumnNames()) names.push_back(QuoteField(name, table.GetDelimiter()));
+    if (!isInPlace)
+        for (const BinColumn& column : columns) names.push_back(QuoteField(column.name, table.GetDelimiter()));
+    return Join(names, std::string(1, table.GetDelimiter())) + "\n";
+}
+
+[[noreturn]] void ThrowBadField(const TableReader& table, const CsvRow& row, const BinColumn& column)
+{
+    const std::string_view field = row[column.place];
+    if (!column.binner.IsCategorical())
+        throw table.MakeNotANumber(row.GetLine(), column.place, field);
+    throw table.MakeFailure(row.GetLine(), column.place,
+                            Quote(Shorten(field)) + " is a category that the bins don't know; with --bad missing it "
+                                                    "counts as missing");
+}
+
+/// The field that is written for the row's value; empty for a missing one.
+std::string_view FindField(const TableReader& table, const CsvRow& row, BinColumn& column, bool isBadMissing)
+{
+    const Binner::Place place = column.binner.Find(row[column.place]);
+    if (place.isBad && !isBadMissing)
+        ThrowBadField(table, row, column);
+    return place.bin ? std::string_view(column.fields[*place.bin]) : std::string_view();
+}
+
+/// Writes rows: the input's fields, some perhaps replaced, and further ones behind them.
+class RowWriter
+{
+public:
+    RowWriter(const TableReader& table, std::vector<BinColumn>& columns, const ApplyOptions& options)
+        : fTable(table), fColumns(columns), fOptions(options), fOwn(table.GetColumnNames().size(), nullptr)
+    {
+        if (options.isInPlace)
+            for (BinColumn& column : columns) fOwn[column.place] = &column;
+    }
+
+    /// The line is the object's and good until the next call.
+    const std::string& MakeLine(const CsvRow& row)
+    {
+        fLine.clear();
+        for (std::size_t i = 0; i < row.Size(); ++i)
+        {
+            if (fOwn[i])
+                Append(FindField(fTable, row, *fOwn[i], fOptions.isBadMissing));
+            else
+                Append(QuoteField(row[i], fTable.GetDelimiter()));
+        }
+        if (!fOptions.isInPlace)
+            for (BinColumn& column : fColumns) Append(FindField(fTable, row, column, fOptions.isBadMissing));
+        // A line of a single empty field would be a blank one, which no reader counts.
+        fLine.back() = '\n';
+        if (fLine.size() == 1)
+            fLine = "\"\"\n";
+        return fLine;
+    }
+
+private:
+    void Append(std::string_view field)
+    {
+        fLine += field;
+        fLine += fTable.GetDelimiter();
+    }
+
+    const TableReader& fTable;
+    std::vector<BinColumn>& fColumns;
+    const ApplyOptions& fOptions;
+    std::vector<BinColumn*> fOwn; ///< by column of the table: what replaces it, or null
+    std::string fLine;
+};
+
+} // namespace
+
+void ApplyBins(const ApplyOptions& options, Progress& progress)
+{
+    const Findings findings = ReadJson(options.bins);
+    TableReader table(options.table);
+    std::vector<BinColumn> columns = MakeColumns(table, findings, options);
+    if (!options.isInPlace)
+        ThrowIfTaken(table, columns);
+
+    OutputFile output(options.output);
+    output.Write(MakeHeader(table, columns, options.isInPlace));
+    RowWriter writer(table, columns, options);
+    progress.BeginRows("applying the bins");
+    while (const CsvRow* const row = table.NextRow())
+    {
+        progress.CountRow();
+        output.Write(writer.MakeLine(*row));
+    }
+    output.Commit();
+}

@@ -1,0 +1,170 @@
+#include "collect.h"
+
+#include "columnplan.h"
+#include "figures.h"
+#include "findings.h"
+#include "numbers.h"
+#include "text.h"
+
+#include <mcobnqrt/mcobnqrt.h>
+
+#include <cmath>
+#include <limits>
+
+namespace
+{
+
+constexpr double kInfinity = std::numeric_limits<double>::infinity();
+
+VariableRole GetRole(IBINVariable::VariableRole role)
+{
+    switch (role)
+    {
+    case IBINVariable::RoleTarget:
+        return VariableRole::kTarget;
+    case IBINVariable::RoleFrequencyWeight:
+        return VariableRole::kWeight;
+    default: // the tool gives no other role
+        return VariableRole::kAttribute;
+    }
+}
+
+/// The library holds an infinite end as the largest finite number.
+double GetEnd(double end)
+{
+    return std::fabs(end) == std::numeric_limits<double>::max() ? std::copysign(kInfinity, end) : end;
+}
+
+void AddMissing(Variable& variable, const IBINUserMissing* missing)
+{
+    if (const auto* const numeric = dynamic_cast<const BINNumericUserMissing*>(missing))
+    {
+        variable.missingNumbers = numeric->GetDiscreteValues();
+        if (const BINNumericInterval* const interval = numeric->GetInterval())
+            variable.missingInterval = {GetEnd(interval->GetLeftEnd()), GetEnd(interval->GetRightEnd())};
+    }
+    if (const auto* const strings = dynamic_cast<const BINStringUserMissing*>(missing))
+        variable.missingTexts = strings->GetDiscreteValues();
+}
+
+/// What the encoder of a variable adds; a continuous one has none.
+void AddEncoder(Variable& variable, const IBINEncoder* encoder)
+{
+    if (const auto* const strings = dynamic_cast<const BINStringEncoder*>(encoder))
+    {
+        variable.kind = VariableKind::kStringCategorical;
+        for (int code = 0; code < strings->GetNumberOfCategories(); ++code)
+            variable.categories.push_back(strings->Decode(code));
+    }
+}
+
+std::optional<double> GetFigure(double figure)
+{
+    return figure == MCMV::gMissingValue ? std::nullopt : std::optional(figure);
+}
+
+template<class LibraryResult>
+Result MakeResult(const LibraryResult& result)
+{
+    Result made;
+    made.status = result.GetStatus();
+    made.attribute = result.GetAttributeIndex();
+    made.distinctValues = result.GetNDistinctValues();
+    made.weight = result.GetTotalWeight();
+    made.weightWithMissing = result.GetTotalWeightWithMissing();
+    made.cutPoints = result.GetCutPoints();
+    // With an error they are 0, which is no figure.
+    if (!made.status.IsError())
+    {
+        made.minimum = GetFigure(result.GetMinimum());
+        made.maximum = GetFigure(result.GetMaximum());
+    }
+    return made;
+}
+
+void AddBin(Result& result, double weight, const std::vector<double>& weights)
+{
+    const std::size_t place = result.bins.size();
+    Bin bin;
+    bin.left = place == 0 ? -kInfinity : result.cutPoints[place - 1];
+    bin.right = place == result.cutPoints.size() ? kInfinity : result.cutPoints[place];
+    bin.weight = weight;
+    bin.weights = weights;
+    result.bins.push_back(bin);
+}
+
+/// The library takes numbers alone as missing values of a continuous variable. Texts are known beside it, for all columns.
+void AddMissingTexts(Findings& findings, const Column& column)
+{
+    if (column.kind != ColumnKind::kCategorical)
+        for (const std::string& text : column.missingTexts)
+            if (!ParseNumber(text))
+                findings.missingText.push_back(text);
+}
+
+bool IsIn(const Findings& findings, int index)
+{
+    return index >= 0 && static_cast<std::size_t>(index) < findings.variables.size();
+}
+
+} // namespace
+
+void AddPlan(Findings& findings, const ColumnPlan& plan)
+{
+    findings.records = plan.nRows;
+    findings.missingText = plan.missingTexts;
+    for (const Column& column : plan.columns)
+    {
+        AddMissingTexts(findings, column);
+        if (column.nTexts > 0 && !column.IsUsed())
+            findings.leftOut.push_back(Printable(column.name) + " (" + Quote(Shorten(column.firstText)) + " in line " +
+                                       std::to_string(column.firstTextLine) + ")");
+    }
+}
+
+void AddVariables(Findings& findings, const BINVarList& list, IBINVariable::BINWRoundingOption rounding)
+{
+    for (int i = 0; i < static_cast<int>(list.Size()); ++i)
+    {
+        const IBINVariable& source = *list.GetVarAt(i);
+        Variable variable;
+        variable.name = source.GetVariableName();
+        variable.label = source.GetVariableLabel();
+        variable.role = GetRole(source.GetVariableRole());
+        AddEncoder(variable, list.GetEncoderAt(i));
+        if (variable.role == VariableRole::kWeight)
+        {
+            variable.kind = VariableKind::kWeight;
+            variable.rounding = rounding == IBINVariable::RoundTruncate ? "truncate" : "closest";
+        }
+        AddMissing(variable, source.GetUserMissingInfo());
+        findings.variables.push_back(variable);
+    }
+}
+
+void AddResult(Findings& findings, const BINAttributeTargetResults& result)
+{
+    Result made = MakeResult(result);
+    made.target = result.GetTargetIndex();
+    if (!IsIn(findings, made.attribute) || !IsIn(findings, made.target))
+        return;
+    // A row of a table that wasn't filled is empty.
+    for (const std::vector<double>& row : result.GetCellCounts())
+        if (!row.empty())
+            AddBin(made, row.front(), {row.begin() + 1, row.end()});
+    if (!made.bins.empty())
+    {
+        made.targetEntropy = GetEntropy(GetCategoryWeights(made));
+        made.modelEntropy = GetFigure(result.GetModelEntropy());
+    }
+    findings.results.push_back(made);
+}
+
+void AddResult(Findings& findings, const BINAttributeResults& result)
+{
+    Result made = MakeResult(result);
+    if (!IsIn(findings, made.attribute))
+        return;
+    for (const double weight : result.GetCellCounts()) AddBin(made, weight, {});
+    findings.results.push_back(made);
+}

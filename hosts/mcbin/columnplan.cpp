@@ -1,0 +1,205 @@
+#include "columnplan.h"
+
+#include "failure.h"
+#include "numbers.h"
+#include "options.h"
+#include "tablereader.h"
+#include "text.h"
+
+#include <algorithm>
+#include <limits>
+
+namespace
+{
+
+using Indices = std::vector<std::size_t>;
+
+/// The columns that a name or pattern stands for. A column's own name counts before the pattern in it.
+Indices FindColumns(const TableReader& table, const std::string& pattern)
+{
+    const std::vector<std::string>& names = table.GetColumnNames();
+    Indices found;
+    if (IsPattern(pattern) && std::find(names.begin(), names.end(), pattern) == names.end())
+        for (std::size_t i = 0; i < names.size(); ++i)
+            if (Matches(pattern, names[i]))
+                found.push_back(i);
+    if (found.empty())
+        found.push_back(table.FindColumn(pattern));
+    return found;
+}
+
+Indices FindColumns(const TableReader& table, const std::vector<std::string>& patterns)
+{
+    Indices found;
+    for (const std::string& pattern : patterns)
+        for (const std::size_t column : FindColumns(table, pattern)) found.push_back(column);
+    return found;
+}
+
+void SetKind(ColumnPlan& plan, const Indices& columns, ColumnKind kind)
+{
+    for (const std::size_t i : columns)
+    {
+        Column& column = plan.columns[i];
+        if (column.kind != ColumnKind::kUnknown && column.kind != kind)
+            throw Failure("column " + Quote(column.name) + " cannot be both categorical and continuous");
+        column.kind = kind;
+    }
+}
+
+void SetKinds(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
+{
+    SetKind(plan, FindColumns(table, options.categorical), ColumnKind::kCategorical);
+    SetKind(plan, FindColumns(table, options.continuous), ColumnKind::kContinuous);
+}
+
+void SetTarget(Column& column)
+{
+    if (column.isWeight)
+        throw Failure("column " + Quote(column.name) + " cannot be both target and weight");
+    column.isTarget = true;
+    column.kind = ColumnKind::kCategorical; // a target always is, even if it was said to be continuous
+}
+
+void SetTargetAndWeight(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
+{
+    if (!options.weight.empty())
+    {
+        Column& weight = plan.columns[table.FindColumn(options.weight)];
+        weight.isWeight = true;
+        weight.kind = ColumnKind::kContinuous;
+    }
+    if (!options.target.empty())
+        SetTarget(plan.columns[table.FindColumn(options.target)]);
+}
+
+/// Where ATTRIBUTE:TARGET is split: names may hold colons, so it is where a column's name follows.
+std::pair<std::string, std::string> SplitPair(const TableReader& table, const std::string& pair)
+{
+    const std::vector<std::string>& names = table.GetColumnNames();
+    for (std::size_t at = pair.find(':'); at != std::string::npos; at = pair.find(':', at + 1))
+        if (std::find(names.begin(), names.end(), pair.substr(at + 1)) != names.end())
+            return {pair.substr(0, at), pair.substr(at + 1)};
+    const std::size_t colon = pair.find(':');
+    if (colon == std::string::npos)
+        throw Failure("a pair is written ATTRIBUTE:TARGET, which " + Quote(pair) + " is not");
+    table.FindColumn(pair.substr(colon + 1)); // tells that there is no such column
+    return {};
+}
+
+void SetPairs(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
+{
+    std::vector<std::pair<std::string, std::size_t>> pairs;
+    for (const std::string& pair : options.pairs)
+    {
+        const auto [attribute, target] = SplitPair(table, pair);
+        pairs.emplace_back(attribute, table.FindColumn(target));
+        SetTarget(plan.columns[pairs.back().second]);
+    }
+    for (const auto& [pattern, target] : pairs)
+        for (const std::size_t i : FindColumns(table, pattern))
+        {
+            Column& column = plan.columns[i];
+            const bool isNamed = column.name == pattern;
+            if (!isNamed && (column.isWeight || column.isTarget))
+                continue;
+            if (column.isWeight || i == target)
+                throw Failure("column " + Quote(column.name) + " cannot be an attribute in " +
+                              Quote(pattern + ":" + plan.columns[target].name));
+            column.isAttribute = true;
+            column.isNamed = column.isNamed || isNamed;
+            plan.pairs.emplace_back(i, target);
+        }
+}
+
+void SetAttributes(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
+{
+    for (const std::string& pattern : options.attributes.empty() ? std::vector<std::string>{"*"} : options.attributes)
+        for (const std::size_t i : FindColumns(table, pattern))
+        {
+            Column& column = plan.columns[i];
+            const bool isFree = !column.isTarget && !column.isWeight;
+            if (!isFree && column.name == pattern)
+                throw Failure("column " + Quote(column.name) +
+                              " cannot be an attribute: it is the target or the weight");
+            column.isAttribute = column.isAttribute || isFree;
+            column.isNamed = column.isNamed || column.name == pattern;
+        }
+    for (const std::size_t i : FindColumns(table, options.exclude)) plan.columns[i].isAttribute = false;
+}
+
+double ParseEnd(std::string_view text, double absent, const std::string& declaration)
+{
+    const std::optional<double> end = text.empty() ? absent : ParseNumber(text);
+    if (!end)
+        throw Failure("an interval of missing values is written LOW:HIGH, with numbers, which is not so in " +
+                      Quote(declaration));
+    return *end;
+}
+
+/// Whether it is LOW:HIGH; one end may be left out for an infinite one.
+bool IsInterval(std::string_view value)
+{
+    const std::size_t colon = value.find(':');
+    return colon != std::string_view::npos && value.size() > 1 && (colon == 0 || ParseNumber(value.substr(0, colon))) &&
+           (colon + 1 == value.size() || ParseNumber(value.substr(colon + 1)));
+}
+
+void DeclareMissing(Column& column, const std::string& value, const std::string& declaration)
+{
+    if (IsInterval(value))
+    {
+        const std::size_t colon = value.find(':');
+        if (column.missingInterval)
+            throw Failure("column " + Quote(column.name) + " has more than one interval of missing values");
+        constexpr double kInfinite = std::numeric_limits<double>::max();
+        column.missingInterval = {ParseEnd(value.substr(0, colon), -kInfinite, declaration),
+                                  ParseEnd(value.substr(colon + 1), kInfinite, declaration)};
+        if (column.missingInterval->first > column.missingInterval->second)
+            throw Failure("the interval of missing values in " + Quote(declaration) + " is empty");
+    }
+    else
+    {
+        column.missingTexts.push_back(value);
+        if (const std::optional<double> number = ParseNumber(value))
+            column.missingNumbers.push_back(*number);
+    }
+}
+
+void DeclareMissing(ColumnPlan& plan, const TableReader& table, const std::string& declaration)
+{
+    const std::size_t equals = declaration.rfind('=');
+    if (equals == std::string::npos || equals + 1 == declaration.size())
+        throw Failure("missing values are declared as COLUMN=9,99 or COLUMN=90:99, which " + Quote(declaration) +
+                      " is not");
+    for (const std::size_t column : FindColumns(table, declaration.substr(0, equals)))
+        for (const std::string& value : Split(std::string_view(declaration).substr(equals + 1), ','))
+            DeclareMissing(plan.columns[column], value, declaration);
+}
+
+} // namespace
+
+bool ColumnPlan::IsIn(const std::vector<std::string>& texts, std::string_view field)
+{
+    return std::find(texts.begin(), texts.end(), field) != texts.end();
+}
+
+ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
+{
+    ColumnPlan plan;
+    plan.missingTexts = options.missingText;
+    plan.isBadMissing = options.isBadMissing;
+    for (const std::string& name : table.GetColumnNames())
+    {
+        plan.columns.emplace_back();
+        plan.columns.back().name = name;
+    }
+    SetKinds(plan, table, options);
+    SetTargetAndWeight(plan, table, options);
+    if (options.pairs.empty())
+        SetAttributes(plan, table, options);
+    else
+        SetPairs(plan, table, options);
+    for (const std::string& declaration : options.missing) DeclareMissing(plan, table, declaration);
+    return plan;
+}

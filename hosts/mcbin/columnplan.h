@@ -1,0 +1,70 @@
+#ifndef MCBIN_COLUMNPLAN_H
+#define MCBIN_COLUMNPLAN_H
+
+#include <cstddef>
+#include <optional>
+#include <set>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <vector>
+
+class TableReader;
+struct ColumnOptions;
+
+enum class ColumnKind
+{
+    kUnknown, ///< to be found out from the fields
+    kContinuous,
+    kCategorical
+};
+
+/// A column of the table: its part in the analysis, and what is found out about it.
+struct Column
+{
+    std::string name;
+    ColumnKind kind = ColumnKind::kUnknown;
+    bool isAttribute = false;
+    bool isTarget = false;
+    bool isWeight = false;
+    bool isNamed = false; ///< asked for by its own name, so it can't be left out silently
+
+    std::vector<std::string> missingTexts; ///< declared for this column, as they are written
+    std::vector<double> missingNumbers;    ///< those of them that are numbers
+    std::optional<std::pair<double, double>> missingInterval;
+
+    long nNumbers = 0;                             ///< fields that are numbers
+    long nTexts = 0;                               ///< fields that are something else
+    std::string firstText;                         ///< the first of the latter
+    long firstTextLine = 0;                        ///< and its line
+    std::set<std::string, std::less<>> categories; ///< the different fields, if it may be categorical
+
+    bool IsUsed() const { return isAttribute || isTarget || isWeight; }
+};
+
+/// All columns of a table in their order, and what is to be done with them.
+struct ColumnPlan
+{
+    std::vector<Column> columns;
+    std::vector<std::pair<std::size_t, std::size_t>> pairs; ///< attribute and target; empty without a list of pairs
+    std::vector<std::string> missingTexts;                  ///< of all columns, beside the empty one
+    bool isBadMissing = false;
+    long nRows = 0;
+
+    /// Whether the field stands for a missing value as text, before it is looked at as a number.
+    bool IsMissing(const Column& column, std::string_view field) const
+    {
+        if (field.empty())
+            return true;
+        return (!missingTexts.empty() && IsIn(missingTexts, field)) ||
+               (!column.missingTexts.empty() && IsIn(column.missingTexts, field));
+    }
+
+    static bool IsIn(const std::vector<std::string>& texts, std::string_view field);
+};
+
+/// Gives the columns of the table their parts.
+/// \throw Failure if a name or pattern fits no column, or parts contradict each other.
+ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options);
+
+#endif

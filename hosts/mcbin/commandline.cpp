@@ -1,0 +1,290 @@
+#include "commandline.h"
+
+#include "delimiter.h"
+
+#include <mcobnqrt/binfactory.h>
+#include <mcobnqrt/binsettings.h>
+#include <mcobnqrt/binvarlist.h>
+#include <mcobnqrt/ibinalgorithm.h>
+
+#include <limits>
+#include <map>
+#include <memory>
+#include <string>
+
+namespace
+{
+
+constexpr int kMost = std::numeric_limits<int>::max();
+
+/// A supervised run refuses to work without a number of bins, but uses it for pre-binning alone, which is off as long as
+/// no distinct value threshold is set. With 1000 bins pre-binning costs hardly any precision: a border is off by a
+/// thousandth of the weight at most.
+constexpr int kPreBins = 1000;
+
+constexpr const char* kData = "A delimited text file whose first line names the columns; - for standard input";
+
+constexpr const char* kSupervisedExamples = R"(Examples:
+  mcbin supervised iris.csv --target species
+  mcbin supervised people.csv --target income --weight weight --missing-text ? --report people.html
+  mcbin supervised loans.csv --target default --format json > bins.json
+  mcbin supervised survey.csv --pairs 'age:bought,income:bought,age:returned' --missing age=-9:-1)";
+
+constexpr const char* kEqualFrequencyExamples = R"(Examples:
+  mcbin equal-frequency iris.csv --bins 4
+  zcat big.csv.gz | mcbin equal-frequency - --attributes 'amount_*' --bins 20 --format sql)";
+
+constexpr const char* kApplyExamples = R"(Examples:
+  mcbin supervised train.csv --target bought --format json > bins.json
+  mcbin apply bins.json new.csv -o new_binned.csv
+  mcbin apply bins.json new.csv --labels --in-place-columns | head)";
+
+constexpr const char* kExitCodes = R"(Exit codes:
+  0    done
+  1    failure: a file, a row or the data cannot be used, or the output cannot be written
+  2    the command line is wrong
+  3    with --strict: done, but an attribute carries a warning or an error
+  130  interrupted; what was found before that has been printed)";
+
+CLI::Validator MakeDelimiterCheck()
+{
+    return CLI::Validator([](const std::string& name)
+                          { return ParseDelimiter(name) ? "" : "no delimiter is called '" + name + "'"; },
+                          "", "");
+}
+
+/// A list that is given with commas, by repeating the option, or both; it doesn't swallow what follows.
+CLI::Option* AddList(CLI::App& command, const std::string& name, std::vector<std::string>& list,
+                     const std::string& description, const std::string& what)
+{
+    return command.add_option(name, list, description)->allow_extra_args(false)->delimiter(',')->option_text(what);
+}
+
+void AddTable(CLI::App& command, TableOptions& table)
+{
+    command.add_option("DATA", table.file, kData)->required()->option_text("FILE");
+    command
+        .add_option_function<std::string>(
+            "--delimiter", [&table](const std::string& name) { table.delimiter = ParseDelimiter(name); },
+            "What separates the fields: a character, or comma, tab, semicolon, bar; found out if not given")
+        ->check(MakeDelimiterCheck())
+        ->option_text("CHAR")
+        ->group("Input");
+}
+
+void AddMissing(CLI::App& command, std::vector<std::string>& missingText, bool& isBadMissing)
+{
+    AddList(command, "--missing-text", missingText,
+            "Fields that stand for a missing value in every column, beside the empty one", "TEXT,...")
+        ->group("Input");
+    command
+        .add_option_function<std::string>(
+            "--bad", [&isBadMissing](const std::string& how) { isBadMissing = how == "missing"; },
+            "What a field is that is no number in a column of numbers: an error (the default), or missing")
+        ->check(CLI::IsMember({"error", "missing"}))
+        ->option_text("error|missing")
+        ->group("Input");
+}
+
+void AddColumns(CLI::App& command, ColumnOptions& columns)
+{
+    AddList(command, "--attributes", columns.attributes,
+            "The columns to bin; names or patterns such as 'x_*'. All columns of numbers if not given", "NAME,...")
+        ->group("Columns");
+    AddList(command, "--exclude", columns.exclude, "Columns not to bin; names or patterns", "NAME,...")
+        ->group("Columns");
+    command.add_option("--weight", columns.weight, "The column that tells how many cases a row stands for")
+        ->option_text("NAME")
+        ->group("Columns");
+    command
+        .add_option_function<std::string>(
+            "--round",
+            [&columns](const std::string& how)
+            { columns.rounding = how == "truncate" ? IBINVariable::RoundTruncate : IBINVariable::RoundClosest; },
+            "How a weight becomes a whole number; closest if not given")
+        ->check(CLI::IsMember({"truncate", "closest"}))
+        ->option_text("truncate|closest")
+        ->group("Columns");
+    AddList(command, "--categorical", columns.categorical,
+            "Columns of categories, also if they are numbers; an attribute's are binned in sorted order", "NAME,...")
+        ->group("Columns");
+    AddList(command, "--continuous", columns.continuous, "Columns of numbers, also if most fields are something else",
+            "NAME,...")
+        ->group("Columns");
+    AddMissing(command, columns.missingText, columns.isBadMissing);
+    command
+        .add_option("--missing", columns.missing,
+                    "Values of one column that count as missing, and at most one interval of them, both ends included; "
+                    "may be repeated")
+        ->allow_extra_args(false)
+        ->option_text("COLUMN=9,90:99")
+        ->group("Input");
+}
+
+void AddSettings(CLI::App& command, SettingOptions& settings)
+{
+    command
+        .add_option_function<std::string>(
+            "--closed", [&settings](const std::string& side) { settings.isRightClosed = side == "right"; },
+            "Which end of an interval belongs to it; right if not given")
+        ->check(CLI::IsMember({"right", "left"}))
+        ->option_text("right|left")
+        ->group("Settings");
+    command
+        .add_option_function<std::string>(
+            "--temp-dir", [&settings](const std::string& directory) { settings.tempDirectory = directory; },
+            "Where the temporary files go, which hold all records; the system's directory if not given")
+        ->option_text("DIR")
+        ->group("Settings");
+}
+
+void AddOutput(CLI::App& command, OutputOptions& output)
+{
+    command
+        .add_option_function<std::string>(
+            "--format",
+            [&output](const std::string& name)
+            {
+                const std::map<std::string, Format> formats{
+                    {"table", Format::kTable}, {"json", Format::kJson}, {"csv", Format::kCsv}, {"sql", Format::kSql}};
+                output.format = formats.at(name);
+            },
+            "table: to read (the default). json: everything, for apply and other programs. csv: a row for each bin. "
+            "sql: a CASE expression for each attribute")
+        ->check(CLI::IsMember({"table", "json", "csv", "sql"}))
+        ->option_text("FORMAT")
+        ->group("Output");
+    command.add_option("--report", output.report, "Write a page with tables and charts, too")
+        ->option_text("FILE.html")
+        ->group("Output");
+    command.add_flag("--strict", output.isStrict, "End with exit code 3 if an attribute carries a warning or an error")
+        ->group("Output");
+    command.add_flag("--quiet", output.isQuiet, "Show no progress")->group("Output");
+}
+
+void AddSupervised(CLI::App& app, Request& request)
+{
+    CLI::App& command = *app.add_subcommand(
+        "supervised", "Cut the columns of numbers where they separate the categories of a target best");
+    AddTable(command, request.bin.table);
+    CLI::Option* const target =
+        command.add_option("--target", request.bin.columns.target, "The column whose categories are to be separated")
+            ->option_text("NAME")
+            ->group("Columns");
+    CLI::Option* const pairs =
+        AddList(command, "--pairs", request.bin.columns.pairs,
+                "Several targets in one pass: what is to be binned for which; the attribute may be a pattern",
+                "ATTRIBUTE:TARGET,...")
+            ->group("Columns");
+    pairs->excludes(target);
+    AddColumns(command, request.bin.columns);
+    for (const char* const name : {"--attributes", "--exclude"}) pairs->excludes(command.get_option(name));
+    SettingOptions& settings = request.bin.settings;
+    command
+        .add_option("--distinct-threshold", settings.distinctThreshold,
+                    "An attribute with more distinct values is first cut into --bins bins of equal frequency; never if "
+                    "not given")
+        ->check(CLI::Range(0, kMost))
+        ->option_text("N")
+        ->group("Settings");
+    command.add_option("--bins", settings.bins, "The number of bins for that; 1000 if not given")
+        ->check(CLI::Range(2, kMost))
+        ->option_text("N")
+        ->group("Settings");
+    command
+        .add_option("--small-bins", settings.smallBins,
+                    "An inner bin of less than this share of its lighter neighbour's weight is merged, from 0 to 1")
+        ->check(CLI::Range(0.0, 1.0))
+        ->option_text("RATIO")
+        ->group("Settings");
+    AddSettings(command, settings);
+    AddOutput(command, request.bin.output);
+    command.footer(kSupervisedExamples);
+    command.callback(
+        [&request, target, pairs]
+        {
+            if (target->empty() && pairs->empty())
+                throw CLI::RequiredError("--target, or --pairs,");
+            request.command = Request::Command::kSupervised;
+            request.bin.settings.method = Method::kSupervised;
+            if (request.bin.settings.bins == 0)
+                request.bin.settings.bins = kPreBins;
+        });
+}
+
+void AddEqualFrequency(CLI::App& app, Request& request)
+{
+    constexpr int kUsualBins = 10;
+    CLI::App& command =
+        *app.add_subcommand("equal-frequency", "Cut the columns of numbers into bins of about equal weight");
+    AddTable(command, request.bin.table);
+    AddColumns(command, request.bin.columns);
+    command.add_option("--bins", request.bin.settings.bins, "The number of bins to aim at; 10 if not given")
+        ->check(CLI::Range(2, kMost))
+        ->option_text("N")
+        ->group("Settings");
+    AddSettings(command, request.bin.settings);
+    AddOutput(command, request.bin.output);
+    command.footer(kEqualFrequencyExamples);
+    command.callback(
+        [&request]
+        {
+            request.command = Request::Command::kEqualFrequency;
+            request.bin.settings.method = Method::kEqualFrequency;
+            if (request.bin.settings.bins == 0)
+                request.bin.settings.bins = kUsualBins;
+        });
+}
+
+void AddApply(CLI::App& app, Request& request)
+{
+    ApplyOptions& options = request.apply;
+    CLI::App& command = *app.add_subcommand("apply", "Add the bins of each attribute to a file as new columns");
+    command.add_option("BINS", options.bins, "The bins, as --format json has written them")
+        ->required()
+        ->option_text("BINS.json");
+    AddTable(command, options.table);
+    AddMissing(command, options.missingText, options.isBadMissing);
+    options.output = "-";
+    command.add_option("-o,--output", options.output, "The file to write; standard output if not given")
+        ->option_text("FILE")
+        ->group("Output");
+    command.add_flag("--labels", options.areLabels, "Write intervals, not the numbers of the bins from 0")
+        ->group("Output");
+    command.add_flag("--in-place-columns", options.isInPlace, "Write the bins in place of the values")->group("Output");
+    command.add_flag("--quiet", options.isQuiet, "Show no progress")->group("Output");
+    command.footer(kApplyExamples);
+    command.callback([&request] { request.command = Request::Command::kApply; });
+}
+
+/// The version of the tool, which is the library's.
+std::string GetVersion()
+{
+    BINSettings settings;
+    BINVarList list;
+    list.AddContVar("x", "", IBINVariable::RoleAttribute);
+    const std::unique_ptr<IBINAlgorithm> algorithm(BINFactory().CreateBINAlgorithm(settings, list));
+    return "mcbin " MCBIN_VERSION " with " + (algorithm ? algorithm->GetVersionString() : "");
+}
+
+} // namespace
+
+std::unique_ptr<CLI::App> MakeCommandLine(Request& request)
+{
+    auto app =
+        std::make_unique<CLI::App>("Finds bins in the columns of a text file, shows them, and applies them.", "mcbin");
+    app->require_subcommand(0, 1);
+    app->set_version_flag("--version", GetVersion);
+    app->add_flag("--man", request.isManPage, "Print this as a manual page, for man")->group("");
+    app->footer(std::string("'mcbin COMMAND --help' tells of the options of a command.\n\n") + kExitCodes);
+    AddSupervised(*app, request);
+    AddEqualFrequency(*app, request);
+    AddApply(*app, request);
+    app->final_callback(
+        [&request]
+        {
+            if (request.command == Request::Command::kNone && !request.isManPage)
+                throw CLI::RequiredError("A command");
+        });
+    return app;
+}

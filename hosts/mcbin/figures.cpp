@@ -1,0 +1,117 @@
+#include "figures.h"
+
+#include "findings.h"
+#include "numbers.h"
+#include "text.h"
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+#include <numeric>
+
+double GetEntropy(const std::vector<double>& weights)
+{
+    const double total = std::accumulate(weights.begin(), weights.end(), 0.0);
+    double entropy = 0.0;
+    for (const double weight : weights)
+        if (weight > 0.0)
+            entropy -= weight / total * std::log2(weight / total);
+    return entropy;
+}
+
+std::vector<double> GetCategoryWeights(const Result& result)
+{
+    std::vector<double> sums;
+    for (const Bin& bin : result.bins)
+    {
+        sums.resize(std::max(sums.size(), bin.weights.size()));
+        for (std::size_t i = 0; i < bin.weights.size(); ++i) sums[i] += bin.weights[i];
+    }
+    return sums;
+}
+
+double GetGain(const Result& result)
+{
+    return result.targetEntropy && result.modelEntropy ? *result.targetEntropy - *result.modelEntropy : 0.0;
+}
+
+double GetShare(double part, double whole)
+{
+    return whole > 0.0 ? part / whole : 0.0;
+}
+
+double GetWeightOfEvidence(const Bin& bin, const std::vector<double>& categoryWeights)
+{
+    return std::log(GetShare(bin.weights[1], categoryWeights[1]) / GetShare(bin.weights[0], categoryWeights[0]));
+}
+
+double GetInformationValue(const Bin& bin, const std::vector<double>& categoryWeights)
+{
+    return (GetShare(bin.weights[1], categoryWeights[1]) - GetShare(bin.weights[0], categoryWeights[0])) *
+           GetWeightOfEvidence(bin, categoryWeights);
+}
+
+double GetInformationValue(const Result& result)
+{
+    const std::vector<double> categoryWeights = GetCategoryWeights(result);
+    double value = 0.0;
+    for (const Bin& bin : result.bins) value += GetInformationValue(bin, categoryWeights);
+    return value;
+}
+
+std::vector<const Result*> SortByGain(const Findings& findings)
+{
+    std::vector<const Result*> sorted;
+    for (const Result& result : findings.results)
+        if (!result.cutPoints.empty())
+            sorted.push_back(&result);
+    std::stable_sort(sorted.begin(), sorted.end(),
+                     [](const Result* left, const Result* right) { return GetGain(*left) > GetGain(*right); });
+    return sorted;
+}
+
+std::vector<const Result*> GetUncut(const Findings& findings)
+{
+    std::vector<const Result*> uncut;
+    for (const Result& result : findings.results)
+        if (result.cutPoints.empty())
+            uncut.push_back(&result);
+    return uncut;
+}
+
+std::string FormatInterval(const Findings& findings, const Bin& bin)
+{
+    const bool isRightClosed = findings.settings.isRightClosed;
+    const bool isFirst = bin.left == -std::numeric_limits<double>::infinity();
+    const bool isLast = bin.right == std::numeric_limits<double>::infinity();
+    return (isFirst ? "(-inf" : (isRightClosed ? "(" : "[") + FormatNumber(bin.left)) + ", " +
+           (isLast ? "+inf)" : FormatNumber(bin.right) + (isRightClosed ? "]" : ")"));
+}
+
+std::string FormatBin(const Findings& findings, const Result& result, const Bin& bin)
+{
+    const Variable& attribute = findings.GetAttribute(result);
+    if (!attribute.IsCategorical())
+        return FormatInterval(findings, bin);
+    std::vector<std::string> categories;
+    const auto place = static_cast<std::size_t>(&bin - result.bins.data());
+    for (std::size_t code = 0; code < attribute.categories.size(); ++code)
+        if (FindBin(result.cutPoints, findings.settings.isRightClosed, static_cast<double>(code)) == place)
+            categories.push_back(attribute.categories[code]);
+    return "{" + Join(categories, ", ") + "}";
+}
+
+std::string GetBinColumn(const Findings& findings, const Result& result)
+{
+    const auto isSame = [&](const Result& other) { return other.attribute == result.attribute; };
+    const bool isOne = std::count_if(findings.results.begin(), findings.results.end(), isSame) == 1;
+    const Variable* const target = isOne ? nullptr : findings.FindTarget(result);
+    return findings.GetAttribute(result).name + (target ? "_by_" + target->name : "") + "_bin";
+}
+
+std::size_t FindBin(const std::vector<double>& cutPoints, bool isRightClosed, double value)
+{
+    const auto border = isRightClosed ? std::lower_bound(cutPoints.begin(), cutPoints.end(), value)
+                                      : std::upper_bound(cutPoints.begin(), cutPoints.end(), value);
+    return static_cast<std::size_t>(border - cutPoints.begin());
+}

@@ -1,0 +1,81 @@
+#ifndef MCBIN_OPTIONS_H
+#define MCBIN_OPTIONS_H
+
+#include "tablereader.h"
+
+#include <mcobnqrt/ibinvariable.h>
+
+#include <string>
+#include <vector>
+
+// What a user can ask for. main() fills these from the command line.
+
+/// Which columns take part, and how their fields are read. A name may be a pattern, with * and ? and [].
+struct ColumnOptions
+{
+    std::string target; ///< a name, not a pattern; empty without one
+    std::string weight; ///< a name, not a pattern; empty without one
+    IBINVariable::BINWRoundingOption rounding = IBINVariable::RoundClosest;
+    std::vector<std::string> attributes; ///< empty: all that can be
+    std::vector<std::string> exclude;
+    std::vector<std::string> categorical;
+    std::vector<std::string> continuous;
+    std::vector<std::string> pairs; ///< each ATTRIBUTE:TARGET, where the attribute may be a pattern
+    std::vector<std::string> missingText;
+    std::vector<std::string> missing; ///< each COLUMN=9,99,unknown,90:99
+    bool isBadMissing = false;        ///< what is no number, where it should be one, is missing and no failure
+};
+
+enum class Method
+{
+    kSupervised,
+    kEqualFrequency
+};
+
+struct SettingOptions
+{
+    Method method = Method::kSupervised;
+    int bins = 0;               ///< at least 2
+    int distinctThreshold = -1; ///< supervised only; below 0 for never
+    bool isRightClosed = true;
+    double smallBins = 0.0;    ///< supervised only; from 0 to 1
+    std::string tempDirectory; ///< empty for the system's
+};
+
+enum class Format
+{
+    kTable,
+    kJson,
+    kCsv,
+    kSql
+};
+
+struct OutputOptions
+{
+    Format format = Format::kTable;
+    std::string report;    ///< the file for the page; empty for none
+    bool isStrict = false; ///< the exit code tells of a warning
+    bool isQuiet = false;  ///< no progress line, even on a terminal
+};
+
+struct BinOptions
+{
+    TableOptions table;
+    ColumnOptions columns;
+    SettingOptions settings;
+    OutputOptions output;
+};
+
+struct ApplyOptions
+{
+    std::string bins; ///< the file that was written as JSON
+    TableOptions table;
+    std::string output; ///< "-" for standard output
+    std::vector<std::string> missingText;
+    bool isBadMissing = false;
+    bool areLabels = false; ///< the interval, not the number of the bin
+    bool isInPlace = false; ///< replaces the columns
+    bool isQuiet = false;
+};
+
+#endif

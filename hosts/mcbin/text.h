@@ -1,0 +1,35 @@
+#ifndef MCBIN_TEXT_H
+#define MCBIN_TEXT_H
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+#include <vector>
+
+/// Text of the data made fit for a terminal line: control characters, such as line ends, become escapes like "\x0a".
+std::string Printable(std::string_view text);
+
+/// The same in single quotes, for a message.
+std::string Quote(std::string_view text);
+
+/// The beginning of a text of more than some 30 bytes, with "..." behind it.
+std::string Shorten(std::string_view text);
+
+/// How many columns of a terminal the text takes. Each code point of UTF-8 counts as one.
+std::size_t GetWidth(std::string_view text);
+
+/// The text with spaces in front of it, or behind it, until it is `width` wide.
+std::string PadLeft(const std::string& text, std::size_t width);
+std::string PadRight(const std::string& text, std::size_t width);
+
+std::string Join(const std::vector<std::string>& parts, std::string_view separator);
+
+std::vector<std::string> Split(std::string_view text, char separator);
+
+/// Whether `name` matches the pattern, with * and ? and [] as a shell has them, or is the same.
+bool Matches(const std::string& pattern, const std::string& name);
+
+/// Whether the text has characters that make it a pattern.
+bool IsPattern(std::string_view text);
+
+#endif

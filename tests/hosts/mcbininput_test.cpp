@@ -1,0 +1,222 @@
+#include "hosts/mcbinrun.h"
+
+#include <algorithm>
+#include <string>
+#include <vector>
+
+// What the tool makes of a file.
+
+namespace
+{
+
+constexpr const char* kHeights = "height,\"city, zip\",size,flat,void\n"
+                                 "1.5,\"A, \"\"0\"\"\",small,7,\n"
+                                 "2, B ,small,7,\n"
+                                 "2.5,B,small,7,\n"
+                                 "3,B,small,,\n"
+                                 "1.1e1,B,\"größer\",7,\n"
+                                 "+12,B,größer,7,\n"
+                                 "13,B,größer,7,\n"
+                                 "14,B,größer,7,\n"
+                                 "\n"
+                                 ",C,small,7,\n"
+                                 "12,C,,7,\n";
+
+constexpr const char* kHeightsBySize = R"(height by size: gain 1.0000 bits, 100.0%
+  entropy 1 before, 0 after
+  8 distinct values from 1.5 to 14, missing weight 2
+  bin        weight  share  größer  small    rate   WoE   IV
+  (-inf, 3]       4  50.0%       0      4  100.0%  +inf  inf  ▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓▓
+  (3, +inf)       4  50.0%       4      0    0.0%  -inf  inf  ██████████████████████████████
+  █ größer ▓ small
+  rate and WoE of 'small'; information value inf
+
+Without cut points:
+  flat by size  warning 120014: all valid values are equal
+  void by size  warning 120015: no record has a valid value
+
+Left out, as they hold text: city, zip ('A, "0"' in line 2)
+)";
+
+std::string Replace(std::string text, const std::string& what, const std::string& with)
+{
+    for (std::size_t at = 0; (at = text.find(what, at)) != std::string::npos; at += with.size())
+        text.replace(at, what.size(), with);
+    return text;
+}
+
+using McbinInput = Mcbin;
+
+} // namespace
+
+TEST_F(McbinInput, LineEndsDelimitersAndAUtf8MarkMakeNoDifference)
+{
+    const std::string heights = kHeights;
+    const std::string withoutComma = Replace(heights, "city, zip", "city; zip");
+    const std::vector<std::string> variants{heights,
+                                            Replace(heights, "\n", "\r\n"),
+                                            Replace(heights, "\n", "\r"),
+                                            heights.substr(0, heights.size() - 1),
+                                            "\xEF\xBB\xBF" + heights,
+                                            "\xEF\xBB\xBF" + Replace(heights, "height", "\"height\"")};
+    for (const std::string& variant : variants)
+        EXPECT_EQ(kHeightsBySize, RunOn(variant, "supervised", "--target size").out) << variant;
+    for (const char* delimiter : {"\t", ";", "|", ":"})
+    {
+        const std::string commas = Replace(Replace(heights, "\"city, zip\"", "\"city@ zip\""), "\"A, ", "\"A@ ");
+        const std::string data = Replace(Replace(commas, ",", delimiter), "@", ",");
+        const std::string option = *delimiter == ':' ? " --delimiter :" : "";
+        EXPECT_EQ(kHeightsBySize, RunOn(data, "supervised", "--target size" + option).out) << data;
+    }
+}
+
+TEST_F(McbinInput, StandardInputIsReadTwice)
+{
+    Write("data.csv", kHeights);
+    EXPECT_EQ(kHeightsBySize, Shell("cat data.csv | mcbin supervised - --target size").out);
+}
+
+TEST_F(McbinInput, OrderOfRowsMakesNoDifference)
+{
+    const std::string iris = "'" EXAMPLE_DATA "/iris.csv'";
+    Shell("{ head -n 1 " + iris + "; tail -n +2 " + iris + " | sort -r; } >sorted.csv");
+
+    const Outcome outcome = Run("supervised " + iris + " --target species --format csv");
+
+    EXPECT_NE(std::string::npos,
+              outcome.out.find("petal_length,species,1,\"(1.9, 4.7]\",1.9,4.7,right,45,0.3,0,44,1\n"));
+    EXPECT_EQ(outcome.out, Run("supervised sorted.csv --target species --format csv").out);
+}
+
+TEST_F(McbinInput, AFileOfManyBlocksLosesNoRowAndNoLine)
+{
+    // Quoted and plain rows mixed, so that both ways of reading meet each other at every place of a block.
+    std::string data = "x,padding\n";
+    for (int i = 1; i <= 60000; ++i)
+        data += std::to_string(i) +
+                (i % 3 == 0 ? ",plain" : ",\"" + std::string(static_cast<std::size_t>(i % 7), '\n') + "\"") + "\n";
+    data += "60001," + std::string(3000000, 'y') + "\n";
+
+    const Outcome whole = RunOn(data, "equal-frequency", "--bins 2 --attributes x");
+    const Outcome broken = RunOn(data + "1,2,3\n", "equal-frequency", "--bins 2");
+
+    EXPECT_NE(std::string::npos, whole.out.find("60001 distinct values from 1 to 60001, missing weight 0"));
+    const long line = std::count(data.begin(), data.end(), '\n') + 1;
+    EXPECT_EQ("mcbin: data.csv, line " + std::to_string(line) + ": wrong number of fields: 3, but the header has 2\n",
+              broken.err);
+}
+
+TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
+{
+    struct Case
+    {
+        const char* data;
+        const char* err;
+    };
+    const Case cases[] = {
+        {"", ": the file is empty; its first line should name the columns"},
+        {"x,y\n", ": there is no row below the header"},
+        {"x,z\n1,2\n", ": no column is named 'y'; there are 'x', 'z'"},
+        {"x,y,x\n1,2,3\n", ", line 1: two columns are named 'x'"},
+        {"x,y\n\"1\n\",a\n\n2\n", ", line 5: wrong number of fields: 1, but the header has 2"},
+        {"x,y\n1,a\n2,\"b\n3,c\n", ", line 3: a quoted field in this row is never closed"},
+        {"x,y\n1,a,b\n2,5\" disk\n", ", line 2: wrong number of fields: 3, but the header has 2"},
+        {"x,y\n1,a\n2,5\" disk\n", ", line 3: a quote in the wrong place: a field that holds one must be quoted, and "
+                                   "the quote in it doubled"},
+        {"x,y\n1,a\n2,b\nmany,a\n", ", line 4: column 'x': 'many' is not a number; if it stands for a missing value, "
+                                    "say so with --missing-text, and with --bad missing for all such fields"},
+    };
+    for (const Case& c : cases)
+    {
+        const Outcome outcome = RunOn(c.data, "supervised", "--target y");
+        EXPECT_EQ(1, outcome.exitCode) << c.data;
+        EXPECT_EQ("", outcome.out) << c.data;
+        EXPECT_EQ("mcbin: data.csv" + std::string(c.err) + "\n", outcome.err) << c.data;
+    }
+    EXPECT_EQ("mcbin: none.csv: No such file or directory\n", Run("supervised none.csv --target y").err);
+    EXPECT_EQ(1, Run("supervised . --target y").exitCode);
+}
+
+TEST_F(McbinInput, ATargetHasFrom2To256Categories)
+{
+    std::string data = "x,y\n";
+    for (int i = 1; i <= 256; ++i) data += std::to_string(i) + "," + std::to_string(i) + "\n";
+
+    EXPECT_EQ(0, RunOn(data, "supervised", "--target y").exitCode);
+    EXPECT_EQ("mcbin: data.csv, line 258: column 'y': more than 256 categories, which are too many for a target\n",
+              RunOn(data + "1,257\n", "supervised", "--target y").err);
+    EXPECT_EQ("mcbin: column 'y' has a single category, '3'; a target needs at least 2\n",
+              RunOn("x,y\n1,3\n2,\n", "supervised", "--target y").err);
+}
+
+TEST_F(McbinInput, MissingValuesAreDeclaredByTextByValueByIntervalOrAsWhatIsBad)
+{
+    struct Case
+    {
+        const char* options;
+        const char* missingAndRange;
+    };
+    // Eight rows: 1, 2, 3, 9, 90, 99, NA and an empty one.
+    const std::string data = "x,z\n1,a\n2,b\n3,a\n9,b\n90,a\n99,b\nNA,a\n,a\n";
+    const Case cases[] = {
+        {"--missing-text NA", "6 distinct values from 1 to 99, missing weight 2"},
+        {"--missing-text n/a,NA", "6 distinct values from 1 to 99, missing weight 2"},
+        {"--bad missing", "6 distinct values from 1 to 99, missing weight 2"},
+        {"--missing x=NA,9", "5 distinct values from 1 to 99, missing weight 3"},
+        {"--missing-text NA --missing 'x=90:99'", "4 distinct values from 1 to 9, missing weight 4"},
+        {"--missing-text NA --missing '?=9.0,90:'", "3 distinct values from 1 to 3, missing weight 5"},
+        {"--missing-text NA --missing x=:2 --missing x=3", "3 distinct values from 9 to 99, missing weight 5"},
+    };
+    for (const Case& c : cases)
+        EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", c.options).out.find(c.missingAndRange))
+            << c.options << RunOn(data, "equal-frequency", c.options).err;
+    EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "").err.find("line 8: column 'x': 'NA' is not a"));
+    EXPECT_EQ(1, RunOn(data, "equal-frequency", "--bad missing --missing x=9:1").exitCode);
+}
+
+TEST_F(McbinInput, WeightsAreRoundedAndRowsWithoutOneCountNowhere)
+{
+    const std::string data = "x,w\n1,2.5\n2,0.4\n3,1.4\n4,\n5,-1\n";
+
+    EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "--bins 2 --weight w --format csv")
+                                     .out.find("x,,0,\"(-inf, 1]\",-inf,1,right,3,0.75\n"));
+    EXPECT_NE(
+        std::string::npos,
+        RunOn(data, "equal-frequency", "--bins 2 --weight w --round truncate --format csv").out.find(",right,2,0.66"));
+}
+
+TEST_F(McbinInput, ColumnsAreChosenByNameAndPatternAndTheirKindsOverruled)
+{
+    const std::string data = "x_1,x_2,y,grade,flag\n1,5,no,b,0\n2,6,no,c,1\n3,7,yes,a,0\n4,8,yes,a,1\n";
+    const auto attributes = [&](const std::string& options)
+    { return RunOn(data, "equal-frequency", "--bins 2 --format csv " + options + " | cut -d, -f1 | uniq").out; };
+
+    EXPECT_EQ("attribute\nx_1\nx_2\nflag\n", attributes(""));
+    EXPECT_EQ("attribute\nx_1\nx_2\n", attributes("--attributes 'x_*'"));
+    EXPECT_EQ("attribute\nx_2\n", attributes("--attributes 'x_?' --exclude x_1"));
+    EXPECT_EQ("attribute\nx_1\ngrade\n", attributes("--attributes x_1,grade --categorical grade"));
+    EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "--attributes grade").err.find("--categorical"));
+    EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "--continuous y --attributes y").err.find("line 2"));
+    EXPECT_NE(std::string::npos, RunOn(data, "supervised", "--target x_1 --attributes y").err.find("holds text"));
+}
+
+TEST_F(McbinInput, PairsBinForSeveralTargetsInOnePass)
+{
+    std::string data = "a,b,p,q\n";
+    for (int i = 0; i < 40; ++i)
+        data += std::to_string(i) + "," + std::to_string(-i) + (i < 20 ? ",no" : ",yes") + (i < 10 ? ",lo\n" : ",hi\n");
+
+    const Outcome outcome = RunOn(data, "supervised", "--pairs '*:p' --pairs b:q --format csv");
+
+    EXPECT_EQ(
+        "attribute,target,bin,label,left,right,closed,weight,share,weight:p=no,weight:p=yes,weight:q=hi,weight:q=lo\n"
+        "a,p,0,\"(-inf, 19]\",-inf,19,right,20,0.5,20,0,,\n"
+        "a,p,1,\"(19, +inf)\",19,inf,right,20,0.5,0,20,,\n"
+        "b,p,0,\"(-inf, -20]\",-inf,-20,right,20,0.5,0,20,,\n"
+        "b,p,1,\"(-20, +inf)\",-20,inf,right,20,0.5,20,0,,\n"
+        "b,q,0,\"(-inf, -10]\",-inf,-10,right,30,0.75,,,30,0\n"
+        "b,q,1,\"(-10, +inf)\",-10,inf,right,10,0.25,,,0,10\n",
+        outcome.out)
+        << outcome.err;
+    EXPECT_EQ(1, RunOn(data, "supervised", "--pairs a:none").exitCode);
+}
