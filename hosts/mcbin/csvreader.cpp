@@ -14,7 +14,7 @@
 namespace
 {
 
-constexpr std::size_t kBufferSize = 1 << 18;
+constexpr std::size_t kBufferSize = 1 << 16;
 /// Behind a quote that is never closed, the rest of the file is one field, and memory would grow with it.
 constexpr std::size_t kLongestField = 1 << 24;
 constexpr std::size_t kLongestLine = std::size_t(1) << 30;
@@ -38,6 +38,16 @@ const char* Find(const char* begin, const char* end, char what)
 std::string_view MakeView(const char* begin, const char* end)
 {
     return std::string_view(begin, static_cast<std::size_t>(end - begin));
+}
+
+/// What is left without the spaces around it.
+inline std::string_view Trim(const char* begin, const char* end, char delimiter)
+{
+    // Above a space there is nothing to be dropped, and that is nearly every character.
+    const auto isSpace = [delimiter](char c) { return c <= ' ' && (c == ' ' || c == '\t') && c != delimiter; };
+    while (begin != end && isSpace(*begin)) ++begin;
+    while (begin != end && isSpace(end[-1])) --end;
+    return MakeView(begin, end);
 }
 
 } // namespace
@@ -161,22 +171,15 @@ bool CsvReader::SplitLine(std::string_view line)
     if (!line.empty() && line.back() == '\r')
         line.remove_suffix(1);
 
-    fPlainRow.fFields.clear();
+    std::vector<std::string_view>& fields = fPlainRow.fFields;
+    fields.clear();
     const char* const end = line.data() + line.size();
     const char* begin = line.data();
     for (const char* fieldEnd; (fieldEnd = Find(begin, end, fDelimiter)) != end; begin = fieldEnd + 1)
-        AddTrimmed(MakeView(begin, fieldEnd));
-    AddTrimmed(MakeView(begin, end));
+        fields.push_back(Trim(begin, fieldEnd, fDelimiter));
+    fields.push_back(Trim(begin, end, fDelimiter));
     fLastTerminator = 0;
     return fPlainRow.Size() > 1 || !fPlainRow[0].empty();
-}
-
-void CsvReader::AddTrimmed(std::string_view field)
-{
-    const auto isSpace = [this](char c) { return (c == ' ' || c == '\t') && c != fDelimiter; };
-    while (!field.empty() && isSpace(field.front())) field.remove_prefix(1);
-    while (!field.empty() && isSpace(field.back())) field.remove_suffix(1);
-    fPlainRow.fFields.push_back(field);
 }
 
 /// Gives a line to the parser, and takes the rows that end in it.

@@ -67,7 +67,6 @@ private:
     bool Refill();
     const char* FindSpecial(const char* end);
     bool SplitLine(std::string_view line);
-    void AddTrimmed(std::string_view field);
 
     void ParseLine();
     void Parse(std::string_view text);

@@ -3,8 +3,10 @@
 #include "csvoutput.h"
 #include "failure.h"
 #include "figures.h"
+#include "htmlreport.h"
 #include "interrupt.h"
 #include "jsonoutput.h"
+#include "manpage.h"
 #include "outputfile.h"
 #include "progress.h"
 #include "run.h"
@@ -75,6 +77,12 @@ int Bin(const BinOptions& options)
     tableOptions.spoolDirectory = options.settings.tempDirectory;
     TableReader table(tableOptions);
     const Findings findings = FindBins(table, options, progress);
+    if (!options.output.report.empty())
+    {
+        std::ostringstream page;
+        PrintHtml(page, findings);
+        Write(options.output.report, page.str());
+    }
     Write("-", Print(findings, options.output.format));
     return GetExitCode(findings, options.output.isStrict);
 }
@@ -96,6 +104,11 @@ int Run(int argc, char** argv)
     {
         std::cerr << "mcbin: " << error.what() << "\nRun 'mcbin --help' for more information.\n";
         return kUsage;
+    }
+    if (request.isManPage)
+    {
+        PrintManPage(std::cout, *app);
+        return 0;
     }
     if (request.command != Request::Command::kApply)
         return Bin(request.bin);

@@ -3,6 +3,29 @@
 #include <array>
 #include <charconv>
 #include <cmath>
+#include <cstdint>
+#include <cstring>
+
+namespace
+{
+
+/// Eight at a time: a digit has the high half 3, and none with 6 added to its low half.
+const char* SkipDigits(const char* at, const char* end)
+{
+    constexpr std::uint64_t kHighHalves = 0xF0F0F0F0F0F0F0F0;
+    constexpr std::uint64_t kThrees = 0x3030303030303030;
+    constexpr std::uint64_t kSixes = 0x0606060606060606;
+    for (std::uint64_t eight; end - at >= 8; at += 8)
+    {
+        std::memcpy(&eight, at, sizeof eight);
+        if ((eight & kHighHalves) != kThrees || ((eight + kSixes) & kHighHalves) != kThrees)
+            break;
+    }
+    while (at != end && *at >= '0' && *at <= '9') ++at;
+    return at;
+}
+
+} // namespace
 
 std::optional<double> ParseNumber(std::string_view text)
 {
@@ -21,16 +44,13 @@ bool IsNumber(std::string_view text)
 {
     // Digits and at most one point, which can be no other number than a small one; the rest is from_chars's.
     constexpr std::size_t kSmallSize = 40;
-    std::size_t digits = 0;
-    std::size_t points = 0;
-    const std::size_t sign = !text.empty() && text.front() == '-' ? 1 : 0;
-    for (const char c : text.substr(sign))
-    {
-        digits += static_cast<unsigned char>(c - '0') < 10;
-        points += c == '.';
-    }
-    const bool isPlain = digits > 0 && points <= 1 && sign + digits + points == text.size();
-    return (isPlain && text.size() < kSmallSize) || ParseNumber(text).has_value();
+    const char* const end = text.data() + text.size();
+    const char* const begin = text.data() + (!text.empty() && text.front() == '-' ? 1 : 0);
+    const char* at = SkipDigits(begin, end);
+    if (at != end && *at == '.')
+        at = SkipDigits(at + 1, end);
+    const bool hasDigit = end - begin > 1 || (end - begin == 1 && *begin != '.');
+    return (at == end && hasDigit && text.size() < kSmallSize) || ParseNumber(text).has_value();
 }
 
 std::string FormatNumber(double value)

@@ -39,6 +39,29 @@ std::string Quote(std::string_view text)
     return "'" + Printable(text) + "'";
 }
 
+std::string EscapeHtml(std::string_view text)
+{
+    std::string escaped;
+    for (const char c : Printable(text)) switch (c)
+        {
+        case '&':
+            escaped += "&amp;";
+            break;
+        case '<':
+            escaped += "&lt;";
+            break;
+        case '>':
+            escaped += "&gt;";
+            break;
+        case '"':
+            escaped += "&quot;";
+            break;
+        default:
+            escaped += c;
+        }
+    return escaped;
+}
+
 std::string Shorten(std::string_view text)
 {
     constexpr std::size_t kLongest = 30;

@@ -12,6 +12,9 @@ std::string Printable(std::string_view text);
 /// The same in single quotes, for a message.
 std::string Quote(std::string_view text);
 
+/// The same as text of a page, or of an attribute in double quotes.
+std::string EscapeHtml(std::string_view text);
+
 /// The beginning of a text of more than some 30 bytes, with "..." behind it.
 std::string Shorten(std::string_view text);
 

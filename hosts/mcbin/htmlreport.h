@@ -1,0 +1,12 @@
+#ifndef MCBIN_HTMLREPORT_H
+#define MCBIN_HTMLREPORT_H
+
+#include <iosfwd>
+
+struct Findings;
+
+/// Prints the findings as one page that needs nothing else to be read: an overview in the order of the gain, then for
+/// each attribute with cut points a chart and the table of its bins.
+void PrintHtml(std::ostream& os, const Findings& findings);
+
+#endif

@@ -1,0 +1,170 @@
+#include "svgchart.h"
+
+#include "figures.h"
+#include "findings.h"
+#include "numbers.h"
+#include "text.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <ostream>
+#include <string>
+#include <vector>
+
+namespace
+{
+
+// In the units of the picture, which is as wide as the page or a telephone allows.
+constexpr double kWidth = 480.0;
+constexpr double kLeft = 44.0;
+constexpr double kRight = 8.0;
+constexpr double kTop = 8.0;
+constexpr double kStackHeight = 150.0;
+constexpr double kGap = 10.0; ///< between the stacks and the weights
+constexpr double kWeightHeight = 56.0;
+constexpr double kLabelHeight = 22.0;
+constexpr double kLabelWidth = 52.0; ///< room for one cut point
+constexpr std::size_t kNumColours = 7;
+constexpr std::size_t kOthersColour = 7;
+
+/// Where things stand in one chart.
+struct Layout
+{
+    double binWidth;
+    double stackHeight; ///< 0 without a target
+    double weightTop;
+    double height;
+};
+
+Layout MakeLayout(const Result& result)
+{
+    Layout layout{};
+    layout.binWidth = (kWidth - kLeft - kRight) / static_cast<double>(result.bins.size());
+    layout.stackHeight = result.target < 0 ? 0.0 : kStackHeight;
+    layout.weightTop = kTop + layout.stackHeight + (result.target < 0 ? 0.0 : kGap);
+    layout.height = layout.weightTop + kWeightHeight + kLabelHeight;
+    return layout;
+}
+
+/// By category: its colour. The heaviest have their own, in the order of their codes, and all others share one.
+std::vector<std::size_t> ChooseColours(const Result& result)
+{
+    const std::vector<double> weights = GetCategoryWeights(result);
+    std::vector<std::size_t> codes(weights.size());
+    for (std::size_t i = 0; i < codes.size(); ++i) codes[i] = i;
+    std::stable_sort(codes.begin(), codes.end(), [&](std::size_t a, std::size_t b) { return weights[a] > weights[b]; });
+    codes.resize(std::min(codes.size(), kNumColours));
+    std::sort(codes.begin(), codes.end());
+
+    std::vector<std::size_t> colours(weights.size(), kOthersColour);
+    for (std::size_t i = 0; i < codes.size(); ++i) colours[codes[i]] = i;
+    return colours;
+}
+
+void PrintKey(std::ostream& os, const Variable& target, const std::vector<std::size_t>& colours)
+{
+    os << "<ul class=\"key\">";
+    for (std::size_t i = 0; i < colours.size(); ++i)
+        if (colours[i] != kOthersColour)
+            os << "<li><i class=\"c" << colours[i] << "\"></i>" << EscapeHtml(target.categories[i]) << "</li>";
+    if (colours.size() > kNumColours)
+        os << "<li><i class=\"c" << kOthersColour << "\"></i>others</li>";
+    os << "</ul>\n";
+}
+
+void PrintRectangle(std::ostream& os, const std::string& kind, double x, double y, double width, double height,
+                    const std::string& title)
+{
+    os << fmt::format("<rect class=\"{}\" x=\"{:.2f}\" y=\"{:.2f}\" width=\"{:.2f}\" height=\"{:.2f}\"><title>{}"
+                      "</title></rect>\n",
+                      kind, x, y, width, height, EscapeHtml(title));
+}
+
+void PrintText(std::ostream& os, double x, double y, const char* anchor, const std::string& text)
+{
+    os << fmt::format("<text x=\"{:.2f}\" y=\"{:.2f}\" text-anchor=\"{}\">{}</text>\n", x, y, anchor, EscapeHtml(text));
+}
+
+void PrintLine(std::ostream& os, double y)
+{
+    os << fmt::format("<line class=\"axis\" x1=\"{:.2f}\" y1=\"{:.2f}\" x2=\"{:.2f}\" y2=\"{:.2f}\"/>\n", kLeft, y,
+                      kWidth - kRight, y);
+}
+
+void PrintAxes(std::ostream& os, const Layout& layout, double heaviest)
+{
+    if (layout.stackHeight > 0.0)
+        for (const int percent : {0, 50, 100})
+        {
+            const double y = kTop + layout.stackHeight * (1.0 - percent / 100.0);
+            PrintLine(os, y);
+            PrintText(os, kLeft - 5.0, y + 4.0, "end", fmt::format("{}%", percent));
+        }
+    PrintLine(os, layout.weightTop + kWeightHeight);
+    PrintText(os, kLeft - 5.0, layout.weightTop + 10.0, "end", fmt::format("{:.4g}", heaviest));
+    PrintText(os, kLeft - 5.0, layout.weightTop + kWeightHeight + 2.0, "end", "0");
+}
+
+void PrintStack(std::ostream& os, const Findings& findings, const Result& result, const Bin& bin, const Layout& layout,
+                double x, const std::vector<std::size_t>& colours)
+{
+    const Variable& target = *findings.FindTarget(result);
+    double bottom = kTop + layout.stackHeight;
+    for (std::size_t i = 0; i < bin.weights.size(); ++i)
+    {
+        const double share = GetShare(bin.weights[i], bin.weight);
+        if (share <= 0.0)
+            continue;
+        const double height = share * layout.stackHeight;
+        bottom -= height;
+        PrintRectangle(os, "c" + std::to_string(colours[i]), x, bottom, layout.binWidth - 1.0, height,
+                       fmt::format("{}: {} {}, {:.1f}%", FormatBin(findings, result, bin), target.categories[i],
+                                   FormatNumber(bin.weights[i]), 100.0 * share));
+    }
+}
+
+/// The cut points under the borders of the bins, as many as have room.
+void PrintCutPoints(std::ostream& os, const Findings& findings, const Result& result, const Layout& layout)
+{
+    if (findings.GetAttribute(result).IsCategorical())
+        return; // a code tells nobody anything
+    double free = 0.0;
+    for (std::size_t i = 0; i < result.cutPoints.size(); ++i)
+    {
+        const double x = kLeft + layout.binWidth * static_cast<double>(i + 1) - 0.5;
+        if (x - kLabelWidth / 2 < free)
+            continue;
+        PrintText(os, x, layout.height - 7.0, "middle", fmt::format("{:.6g}", result.cutPoints[i]));
+        free = x + kLabelWidth / 2;
+    }
+}
+
+} // namespace
+
+void PrintChart(std::ostream& os, const Findings& findings, const Result& result)
+{
+    const Layout layout = MakeLayout(result);
+    const std::vector<std::size_t> colours = ChooseColours(result);
+    double heaviest = 0.0;
+    for (const Bin& bin : result.bins) heaviest = std::max(heaviest, bin.weight);
+
+    if (const Variable* const target = findings.FindTarget(result))
+        PrintKey(os, *target, colours);
+    os << fmt::format("<svg viewBox=\"0 0 {:.0f} {:.0f}\" role=\"img\" aria-label=\"Bins of {}\">\n", kWidth,
+                      layout.height, EscapeHtml(findings.GetAttribute(result).name));
+    PrintAxes(os, layout, heaviest);
+    double x = kLeft;
+    for (const Bin& bin : result.bins)
+    {
+        if (!bin.weights.empty())
+            PrintStack(os, findings, result, bin, layout, x, colours);
+        const double height = kWeightHeight * GetShare(bin.weight, heaviest);
+        PrintRectangle(os, "weight", x, layout.weightTop + kWeightHeight - height, layout.binWidth - 1.0, height,
+                       fmt::format("{}: weight {}, {:.1f}%", FormatBin(findings, result, bin), FormatNumber(bin.weight),
+                                   100.0 * GetShare(bin.weight, result.weight)));
+        x += layout.binWidth;
+    }
+    PrintCutPoints(os, findings, result, layout);
+    os << "</svg>\n";
+}

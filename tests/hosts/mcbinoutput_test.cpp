@@ -1,0 +1,158 @@
+#include "hosts/mcbinrun.h"
+
+#include <regex>
+#include <string>
+
+// What the tool shows, in each of its forms.
+
+namespace
+{
+
+/// 60 visitors of five kinds; the kind goes with the age.
+std::string MakeVisitors()
+{
+    std::string data = "age,noise,kind\n";
+    const char* const kinds[] = {"child", "pupil", "student", "adult", "retired & <old>"};
+    for (int i = 0; i < 60; ++i)
+        data += std::to_string(i) + "," + std::to_string(i * 7 % 10) + "," + kinds[i % 11 == 0 ? 3 : i / 12] + "\n";
+    return data;
+}
+
+std::string Collect(const std::string& text, const std::string& pattern)
+{
+    std::string found;
+    const std::regex expression(pattern);
+    for (std::sregex_iterator match(text.begin(), text.end(), expression), end; match != end; ++match)
+        found += (*match)[1].str() + "\n";
+    return found;
+}
+
+using McbinOutput = Mcbin;
+
+} // namespace
+
+TEST_F(McbinOutput, EqualFrequencyTablesComeInTheOrderOfTheData)
+{
+    const Outcome outcome = RunOn("x,b\n1,5\n2,1\n3,1\n0.1,1\n,1\n", "equal-frequency", "--bins 2 --closed left");
+
+    EXPECT_EQ(R"(x
+  4 distinct values from 0.1 to 3, missing weight 1
+  bin          weight  share
+  (-inf, 1.5)       2  50.0%  ██████████████████████████████
+  [1.5, +inf)       2  50.0%  ██████████████████████████████
+
+Without cut points:
+  b  warning 120019: no cut point was found: too few different values for the number of bins
+
+)",
+              outcome.out);
+}
+
+TEST_F(McbinOutput, MoreCategoriesThanShadesShareTheLastOne)
+{
+    const Outcome outcome = RunOn(MakeVisitors(), "supervised", "--target kind --attributes age");
+
+    EXPECT_NE(std::string::npos, outcome.out.find("  █ adult ▓ pupil ▒ retired & <old> ░ others\n")) << outcome.out;
+    EXPECT_NE(std::string::npos,
+              outcome.out.find("  bin         weight  share  adult  child  pupil  retired & <old>  student\n"))
+        << outcome.out;
+}
+
+TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
+{
+    const Outcome outcome = RunOn("x,y,w\n0.1,a,1\n0.30000000000000004,a,1\n1e300,b,1\n,b,2\n", "supervised",
+                                  "--target y --weight w --missing x=7,90: --missing-text NA --format json");
+
+    std::string json = std::regex_replace(outcome.out, std::regex("\\(MCOBNQRT [^)]*\\)"), "(V)");
+    EXPECT_EQ(R"json({
+  "schema": "mcobnqrt-bins",
+  "schema_version": 1,
+  "component_version": "Supervised Binning Component Ver. 1.0 (V)",
+  "method": "supervised",
+  "settings": {"closed": "right", "bins": 1000, "distinct_threshold": null, "small_bins": 0},
+  "data": {"name": "data.csv", "records": 4, "missing_text": ["NA"]},
+  "variables": [
+    {
+      "name": "x",
+      "label": "",
+      "kind": "continuous",
+      "role": "attribute",
+      "categories": null,
+      "rounding": null,
+      "missing": {"values": [7], "interval": [90, "inf"]}
+    },
+    {
+      "name": "y",
+      "label": "",
+      "kind": "string-categorical",
+      "role": "target",
+      "categories": ["a", "b"],
+      "rounding": null,
+      "missing": {"values": [], "interval": null}
+    },
+    {
+      "name": "w",
+      "label": "",
+      "kind": "weight",
+      "role": "weight",
+      "categories": null,
+      "rounding": "closest",
+      "missing": {"values": [], "interval": null}
+    }
+  ],
+  "status": {"code": 120018, "severity": "warning", "words": "some results carry a warning or an error", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
+  "results": [
+    {
+      "attribute": "x",
+      "target": "y",
+      "status": {"code": 120017, "severity": "warning", "words": "no cut point separates the categories of the target well enough", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
+      "distinct_values": 2,
+      "weight": 2,
+      "weight_with_missing": 5,
+      "minimum": 0.1,
+      "maximum": 0.30000000000000004,
+      "target_entropy": 0,
+      "model_entropy": 0,
+      "cut_points": [],
+      "bins": [
+        {"left": "-inf", "right": "inf", "weight": 2, "weights": [2, 0]}
+      ]
+    }
+  ]
+}
+)json",
+              json);
+}
+
+TEST_F(McbinOutput, ThePageHasTheFiguresOfTheTables)
+{
+    const Outcome csv = RunOn(MakeVisitors(), "supervised", "--target kind --format csv --report page.html");
+    const std::string page = ReadFile(fData.File("page.html"));
+
+    // Of each bin its weight and those of its categories: column 8 and, after the share, 10 to 14.
+    const std::string bins = page.substr(page.find("<table class=\"bins\">"), page.find("</section>"));
+    const std::string cells = Collect(bins, "<td>([0-9.]+)</td>");
+    const Outcome expected =
+        Shell("mcbin supervised data.csv --target kind --format csv | grep '^age' | sed 's/\"[^\"]*\"//' | "
+              "cut -d, -f8,10- | tr , '\\n'");
+    EXPECT_EQ(expected.out, cells);
+    EXPECT_NE(std::string::npos, page.find("retired &amp; &lt;old&gt;"));
+    EXPECT_EQ(std::string::npos, page.find("<script"));
+    EXPECT_EQ(std::string::npos, page.find("http"));
+    EXPECT_EQ(std::string::npos, page.find("<old>"));
+}
+
+TEST_F(McbinOutput, HelpAndManualPageHaveTheSameTexts)
+{
+    const Outcome help = Run("supervised --help");
+    const Outcome page = Run("--man");
+
+    EXPECT_EQ(0, help.exitCode);
+    for (const char* text : {"Cut the columns of numbers where they separate", "mcbin supervised iris.csv"})
+    {
+        EXPECT_NE(std::string::npos, help.out.find(text)) << text;
+        EXPECT_NE(std::string::npos, page.out.find(text)) << text;
+    }
+    EXPECT_NE(std::string::npos, page.out.find(".TP\n.B \\-\\-target \\fINAME\\fR\n"));
+    EXPECT_EQ(0u, Run("--version").out.find("mcbin "));
+}
