@@ -16,6 +16,9 @@ from ._core import MISSING
 Floats = npt.NDArray[np.float64]
 Codes = npt.NDArray[np.intp]
 
+_FEW_CUTS = 32
+_ROWS_IN_CACHE = 1 << 14
+
 LARGEST = float(np.finfo(np.float64).max)
 """What stands for an infinite end in the library."""
 
@@ -80,12 +83,27 @@ def intervals(cut_points: Floats, closed: str, write: Callable[[float], str]) ->
 
 def bin_numbers(values: Floats, cut_points: Floats, closed: str) -> Codes:
     """The bin of each value, from 0; one past the last bin for a NaN."""
-    side = "left" if closed == "right" else "right"
-    # searchsorted takes the cuts for sorted and a NaN for the largest, with infinite cuts behind it: it is told apart.
-    bins: Codes = np.searchsorted(cut_points, values, side=side)  # type: ignore[call-overload]
+    if len(cut_points) <= _FEW_CUTS:
+        bins = _count_cuts(values, cut_points, closed)
+    else:
+        bins = np.searchsorted(cut_points, values, side="left" if closed == "right" else "right")
     missing = np.isnan(values)
     if missing.any():
         bins[missing] = len(cut_points) + 1
+    return bins
+
+
+def _count_cuts(values: Floats, cut_points: Floats, closed: str) -> Codes:
+    """How many cut points each value is beyond. Without a branch for each value this is several times as fast as a search,
+    as long as there are few of them and the rows at hand stay in the cache."""
+    is_beyond = np.greater if closed == "right" else np.greater_equal
+    bins: Codes = np.empty(len(values), dtype=np.intp)
+    for first in range(0, len(values), _ROWS_IN_CACHE):
+        part = np.ascontiguousarray(values[first : first + _ROWS_IN_CACHE])
+        count = np.zeros(len(part), dtype=np.uint8)
+        for cut in cut_points:
+            count += is_beyond(part, cut)
+        bins[first : first + _ROWS_IN_CACHE] = count
     return bins
 
 

@@ -101,6 +101,16 @@ def test_transform_gives_back_the_kind_of_thing_that_it_got(mixed, tmp_path):
         result.transform(frame[["x"]])
 
 
+@pytest.mark.parametrize("closed", ["right", "left"])
+@pytest.mark.parametrize("n_bins", [2, 33, 34, 300])
+def test_many_and_few_cut_points_are_searched_alike(closed, n_bins):
+    values = np.random.default_rng(n_bins).integers(0, 1000, 40_000).astype(float)
+    found = mb.equal_frequency_bins(pa.table({"x": values}), n_bins=n_bins, closed=closed)["x"]
+
+    side = "left" if closed == "right" else "right"
+    assert found.bin_numbers(values).tolist() == np.searchsorted(found.cut_points, values, side=side).tolist()
+
+
 def test_values_outside_the_range_seen_fall_into_the_outer_bins():
     result = mb.equal_frequency_bins(pa.table({"x": range(100)}), n_bins=4)
 

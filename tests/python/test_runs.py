@@ -111,7 +111,7 @@ def test_a_file_far_larger_than_the_memory_is_binned(tmp_path):
     import duckdb
 
     # A column's tuples take 16 bytes a row, 9 MiB, and as much again while they are sorted; the rest is for DuckDB.
-    rows, columns, allowed = 600_000, 100, 200 << 20
+    rows, columns, allowed = 600_000, 120, 256 << 20
     path = tmp_path / "large.parquet"
     numbers = ", ".join(f"random() + {i} AS x{i}" for i in range(columns))
     duckdb.sql(f"COPY (SELECT {numbers} FROM range({rows})) TO '{path}' (ROW_GROUP_SIZE 20480)")
