@@ -1,0 +1,66 @@
+"""Bins as pictures."""
+
+from __future__ import annotations
+
+from typing import TYPE_CHECKING
+
+import numpy as np
+
+from ._result import AttributeBins, BinningResult
+
+if TYPE_CHECKING:
+    import matplotlib.axes
+    import matplotlib.figure
+
+
+def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
+    import matplotlib.pyplot as plt
+
+    if ax is None:
+        ax = plt.subplots(layout="constrained")[1]
+    ax.set_title(_title(found), fontsize="medium")
+    ax.set_xlabel("share of the weight")
+    if found.n_bins == 0:
+        ax.text(0.5, 0.5, found.status.words, ha="center", wrap=True, transform=ax.transAxes)
+        return ax
+    widths = found.weights / found.weights.sum()
+    lefts = np.concatenate([[0.0], np.cumsum(widths)[:-1]])
+    if found.target is None or found.target_weights is None:
+        ax.bar(lefts, found.weights, widths, align="edge", edgecolor="white", color="C0")
+        ax.set_ylabel("weight")
+    else:
+        with np.errstate(invalid="ignore", divide="ignore"):
+            shares = np.nan_to_num(found.target_weights / found.weights[:, np.newaxis])
+        bottoms = np.zeros(len(widths))
+        for code, name in enumerate(found.target.category_names()):
+            ax.bar(
+                lefts, shares[:, code], widths, bottoms, align="edge", edgecolor="white", linewidth=0.5, label=str(name)
+            )
+            bottoms += shares[:, code]
+        ax.set_ylim(0.0, 1.0)
+        ax.set_ylabel(f"share of {found.target.name}")
+        ax.legend(title=found.target.name, fontsize="small")
+    ax.set_xlim(0.0, 1.0)
+    ax.set_xticks(lefts[1:], [found.variable.format(cut) for cut in found.cut_points.tolist()], rotation=45, ha="right")
+    ax.set_xlabel(f"{found.attribute}: cut points, over the share of the weight")
+    return ax
+
+
+def plot_all(result: BinningResult, columns: int) -> matplotlib.figure.Figure:
+    import matplotlib.pyplot as plt
+
+    ordered = result.by_gain()
+    columns = max(1, min(columns, len(ordered)))
+    rows = max(1, -(-len(ordered) // columns))
+    figure, axes = plt.subplots(rows, columns, figsize=(4.5 * columns, 3.5 * rows), squeeze=False, layout="constrained")
+    for ax, found in zip(axes.flat, ordered):
+        plot_bins(found, ax)
+    for ax in axes.flat[len(ordered) :]:
+        ax.set_axis_off()
+    return figure
+
+
+def _title(found: AttributeBins) -> str:
+    if found.target is None or np.isnan(found.gain):
+        return found.attribute
+    return f"{found.attribute}: gain {found.gain:.3g} bit"

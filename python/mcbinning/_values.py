@@ -1,0 +1,117 @@
+"""Numbers, as the library works on them, and what they stand for."""
+
+from __future__ import annotations
+
+import datetime
+import math
+from collections.abc import Callable
+from typing import Any
+
+import numpy as np
+import numpy.typing as npt
+import pandas as pd
+
+from ._core import MISSING
+
+Floats = npt.NDArray[np.float64]
+Codes = npt.NDArray[np.intp]
+
+_FEW_CUTS = 32
+_ROWS_IN_CACHE = 1 << 14
+
+LARGEST = float(np.finfo(np.float64).max)
+"""What stands for an infinite end in the library."""
+
+
+def figure(value: float) -> float:
+    """A figure of the library's, NaN where it found none."""
+    return math.nan if value == MISSING else value
+
+
+def decode(value: float, kind: str, time_zone: str = "") -> Any:
+    """What the number stands for in a column of this kind: a date, say."""
+    if not math.isfinite(value):
+        return value
+    if kind == "boolean":
+        return bool(value)
+    if kind == "integer":
+        return int(value) if value.is_integer() else value
+    if kind == "date":
+        return datetime.date(1970, 1, 1) + datetime.timedelta(days=value)
+    if kind == "timestamp":
+        stamp = pd.Timestamp(int(value), unit="us")
+        return stamp.tz_localize("UTC").tz_convert(time_zone) if time_zone else stamp
+    return value
+
+
+def encode(value: Any, kind: str) -> float:
+    """The number of a value given by the user, such as one that stands for missing."""
+    if kind == "date":
+        return float((pd.Timestamp(value).normalize() - pd.Timestamp(1970, 1, 1)).days)
+    if kind == "timestamp":
+        stamp = pd.Timestamp(value)
+        utc = stamp.tz_convert("UTC").tz_localize(None) if stamp.tzinfo else stamp
+        return float((utc - pd.Timestamp(1970, 1, 1)) / pd.Timedelta(1, "us"))
+    return float(value)
+
+
+def plain(value: float) -> float | int:
+    """A whole number as an int, so that it is written without a point."""
+    is_whole = math.isfinite(value) and value.is_integer() and abs(value) < 1e15
+    return int(value) if is_whole and not (value == 0 and math.copysign(1, value) < 0) else value
+
+
+def format_value(value: float, kind: str = "float", time_zone: str = "") -> str:
+    """The value in as few digits as read back to the same double; of a date, the date."""
+    if math.isinf(value):
+        return "+inf" if value > 0 else "-inf"
+    if kind in ("date", "timestamp") and not math.isnan(value):
+        return str(decode(value, kind, time_zone))
+    return repr(plain(value))
+
+
+def intervals(cut_points: Floats, closed: str, write: Callable[[float], str]) -> list[str]:
+    """The bins in the usual notation, the bracket on the closed side. Infinite ends are open."""
+    ends = ["-inf", *(write(float(cut)) for cut in cut_points), "+inf"]
+    left, right = ("(", "]") if closed == "right" else ("[", ")")
+    pairs = list(zip(ends, ends[1:]))
+    last = len(pairs) - 1
+    return [
+        f"{'(' if i == 0 else left}{a}, {b}{')' if i == last else right}" for i, (a, b) in enumerate(pairs)
+    ]
+
+
+def bin_numbers(values: Floats, cut_points: Floats, closed: str) -> Codes:
+    """The bin of each value, from 0; one past the last bin for a NaN."""
+    if len(cut_points) <= _FEW_CUTS:
+        bins = _count_cuts(values, cut_points, closed)
+    else:
+        bins = np.searchsorted(cut_points, values, side="left" if closed == "right" else "right")
+    missing = np.isnan(values)
+    if missing.any():
+        bins[missing] = len(cut_points) + 1
+    return bins
+
+
+def _count_cuts(values: Floats, cut_points: Floats, closed: str) -> Codes:
+    """How many cut points each value is beyond. Without a branch for each value this is several times as fast as a search,
+    as long as there are few of them and the rows at hand stay in the cache."""
+    is_beyond = np.greater if closed == "right" else np.greater_equal
+    bins: Codes = np.empty(len(values), dtype=np.intp)
+    for first in range(0, len(values), _ROWS_IN_CACHE):
+        part = np.ascontiguousarray(values[first : first + _ROWS_IN_CACHE])
+        count = np.zeros(len(part), dtype=np.uint8)
+        for cut in cut_points:
+            count += is_beyond(part, cut)
+        bins[first : first + _ROWS_IN_CACHE] = count
+    return bins
+
+
+def entropy(weights: Floats) -> float:
+    """Of a distribution over categories, in bits; NaN without weight. Summed in the order of the categories."""
+    parts = [weight for weight in weights.tolist() if weight > 0]
+    total = sum(parts)
+    bits = 0.0
+    for weight in parts:
+        bits -= weight / total * math.log2(weight / total)
+    return bits if parts else math.nan

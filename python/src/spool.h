@@ -1,0 +1,35 @@
+#ifndef MCBINNING_SPOOL_H
+#define MCBINNING_SPOOL_H
+
+#include "blocks.h"
+#include "variable.h"
+
+#include <cstdio>
+#include <memory>
+#include <string>
+#include <vector>
+
+/// Records that can be read only once and whose categories nobody knows before the end: they go through a file, so that
+/// the codes can follow the order of the categories and not that of the records. The file has no name, and so is gone
+/// with the process, whatever ends it.
+class Spool : public BlockSource
+{
+public:
+    /// Reads `source` to its end. \throw std::system_error if the file can't be made in `directory`, or written.
+    Spool(BlockSource& source, const std::vector<Variable>& variables, const std::string& directory);
+
+    /// \throw std::system_error if the file can't be read.
+    bool Next(Block& block) override;
+
+private:
+    struct Close
+    {
+        void operator()(std::FILE* file) const { std::fclose(file); }
+    };
+
+    std::size_t fNumFields;
+    std::unique_ptr<std::FILE, Close> fFile;
+    std::vector<std::vector<double>> fNewCodes; ///< by field and code of arrival; empty for a field without categories
+};
+
+#endif

@@ -1,0 +1,286 @@
+#include "tableblocks.h"
+
+#include "faults.h"
+
+#include <mcobnqrt/mccommon.h>
+
+#include <algorithm>
+#include <cmath>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+
+namespace
+{
+
+using MCMV::gMissingValue;
+
+/// A tuple of the library holds a code in 8 bits.
+constexpr std::size_t kMaxCategories = 256;
+constexpr double kMissingCode = -1.0;
+
+/// The code of a category that has just been looked up.
+double CheckCode(const Variable& variable, std::size_t code, std::size_t numKnown, std::int64_t row)
+{
+    if (code < numKnown)
+        return static_cast<double>(code);
+    if (variable.isComplete)
+        throw DataFault("there is a category that was not there before", variable.name, row);
+    if (code >= kMaxCategories)
+        throw DataFault("there are more than 256 categories", variable.name, row);
+    return static_cast<double>(code);
+}
+
+class ValueField : public FieldReader
+{
+public:
+    explicit ValueField(std::unique_ptr<ColumnReader> reader) : fReader(std::move(reader)) {}
+
+    void Read(std::size_t first, std::size_t count, std::int64_t, double* values) override
+    {
+        fReader->Read(first, count, values);
+    }
+
+private:
+    std::unique_ptr<ColumnReader> fReader;
+};
+
+/// The library leaves out records of no or a negative weight without a word, which nobody wants to find out later.
+class WeightField : public FieldReader
+{
+public:
+    WeightField(std::unique_ptr<ColumnReader> reader, const Variable& variable)
+        : fReader(std::move(reader)), fVariable(variable)
+    {
+    }
+
+    void Read(std::size_t first, std::size_t count, std::int64_t row, double* values) override
+    {
+        fReader->Read(first, count, values);
+        for (std::size_t i = 0; i < count; ++i)
+        {
+            if (values[i] >= 0.0 && values[i] < HUGE_VAL)
+                continue;
+            if (!fVariable.missingNumbers.Contains(values[i]))
+                throw DataFault(Describe(values[i]), fVariable.name, row + static_cast<std::int64_t>(i));
+        }
+    }
+
+private:
+    static std::string Describe(double weight)
+    {
+        if (weight == gMissingValue || std::isnan(weight))
+            return "the weight is missing";
+        return weight < 0.0 ? "the weight is negative" : "the weight is infinite";
+    }
+
+    std::unique_ptr<ColumnReader> fReader;
+    const Variable& fVariable;
+};
+
+class NumberCategoryField : public FieldReader
+{
+public:
+    NumberCategoryField(std::unique_ptr<ColumnReader> reader, Variable& variable)
+        : fReader(std::move(reader)), fVariable(variable)
+    {
+    }
+
+    void Read(std::size_t first, std::size_t count, std::int64_t row, double* values) override
+    {
+        fReader->Read(first, count, values);
+        for (std::size_t i = 0; i < count; ++i) values[i] = Encode(values[i], row + static_cast<std::int64_t>(i));
+    }
+
+private:
+    double Encode(double value, std::int64_t row)
+    {
+        if (value == gMissingValue || std::isnan(value) || fVariable.missingNumbers.Contains(value))
+            return kMissingCode;
+        const std::size_t numKnown = fVariable.numbers.GetSize();
+        return CheckCode(fVariable, fVariable.numbers.Encode(value), numKnown, row);
+    }
+
+    std::unique_ptr<ColumnReader> fReader;
+    Variable& fVariable;
+};
+
+double EncodeText(Variable& variable, std::optional<std::string_view> text, std::int64_t row)
+{
+    if (!text)
+        return kMissingCode;
+    if (variable.missingTexts.GetNDiscreteValues() > 0 && variable.missingTexts.Contains(std::string(*text)))
+        return kMissingCode;
+    const std::size_t numKnown = variable.texts.GetSize();
+    return CheckCode(variable, variable.texts.Encode(*text), numKnown, row);
+}
+
+class TextCategoryField : public FieldReader
+{
+public:
+    TextCategoryField(TextReader reader, Variable& variable) : fReader(reader), fVariable(variable) {}
+
+    void Read(std::size_t first, std::size_t count, std::int64_t row, double* values) override
+    {
+        for (std::size_t i = 0; i < count; ++i)
+            values[i] = EncodeText(fVariable, fReader.At(first + i), row + static_cast<std::int64_t>(i));
+    }
+
+private:
+    TextReader fReader;
+    Variable& fVariable;
+};
+
+/// A text of a dictionary is looked up once for each batch. What stands in the dictionary alone is no category.
+class DictionaryCategoryField : public FieldReader
+{
+public:
+    DictionaryCategoryField(std::unique_ptr<ColumnReader> places, TextReader texts, std::size_t size,
+                            Variable& variable)
+        : fPlaces(std::move(places)), fTexts(texts), fCodes(size, gMissingValue), fVariable(variable)
+    {
+    }
+
+    void Read(std::size_t first, std::size_t count, std::int64_t row, double* values) override
+    {
+        fPlaces->Read(first, count, values);
+        for (std::size_t i = 0; i < count; ++i)
+        {
+            values[i] = values[i] == gMissingValue
+                            ? kMissingCode
+                            : Encode(static_cast<std::size_t>(values[i]), row + static_cast<std::int64_t>(i));
+        }
+    }
+
+private:
+    double Encode(std::size_t place, std::int64_t row)
+    {
+        double& code = fCodes.at(place);
+        if (code == gMissingValue)
+            code = EncodeText(fVariable, fTexts.At(place), row);
+        return code;
+    }
+
+    std::unique_ptr<ColumnReader> fPlaces;
+    TextReader fTexts;
+    std::vector<double> fCodes; ///< by place; gMissingValue where not looked up yet
+    Variable& fVariable;
+};
+
+/// The type of the variable's column, if it is one for the variable's use.
+ColumnType CheckType(const ArrowSchema& schema, const Variable& variable)
+{
+    if (variable.column >= schema.n_children)
+        throw DataFault("there is no such column", variable.name);
+    const ColumnType type = ReadColumnType(*schema.children[variable.column]);
+    if (type.storage == ColumnType::Storage::kNone)
+        throw DataFault("a column of this type can't be used: " + type.kind, variable.name);
+    if (type.IsText() && variable.use != Variable::Use::kCategory)
+        throw DataFault("the column holds texts, not numbers", variable.name);
+    return type;
+}
+
+} // namespace
+
+TableBlocks::TableBlocks(Batches* batches, std::vector<Variable>& variables)
+    : fBatches(batches), fVariables(variables), fTypes(variables.size())
+{
+    for (std::size_t i = 0; i < variables.size(); ++i)
+    {
+        if (variables[i].column >= 0)
+        {
+            fTypes[i] = CheckType(batches->GetSchema(), variables[i]);
+            continue;
+        }
+        const auto length = static_cast<std::int64_t>(variables[i].array.length);
+        if (fNumArrayRows >= 0 && length != fNumArrayRows)
+            throw DataFault("there are " + std::to_string(length) + " values for " + std::to_string(fNumArrayRows) +
+                                " rows",
+                            variables[i].name);
+        fNumArrayRows = length;
+    }
+}
+
+bool TableBlocks::Next(Block& block)
+{
+    block.numRows = 0;
+    if (fNextRow == fNumRows && !NextBatch())
+        return false;
+    const auto first = static_cast<std::size_t>(fNextRow);
+    block.numRows = std::min(static_cast<std::size_t>(fNumRows - fNextRow), Block::kMaxRows);
+    for (std::size_t i = 0; i < fReaders.size(); ++i)
+        fReaders[i]->Read(first, block.numRows, fFirstRow + fNextRow, block.GetField(i));
+    fNextRow += static_cast<std::int64_t>(block.numRows);
+    return true;
+}
+
+/// Goes on to the next batch that has rows. The arrays alone make one batch.
+bool TableBlocks::NextBatch()
+{
+    while (!fIsAtEnd)
+    {
+        fFirstRow += fNumRows;
+        fNextRow = fNumRows = 0;
+        const ArrowArray* const batch = fBatches != nullptr ? fBatches->Next(fFirstRow) : nullptr;
+        if (batch != nullptr)
+            fNumRows = batch->length;
+        else
+        {
+            fIsAtEnd = true;
+            if (fBatches == nullptr)
+                fNumRows = fNumArrayRows;
+        }
+        const std::int64_t numSeen = fFirstRow + fNumRows;
+        if (fNumArrayRows >= 0 && (numSeen > fNumArrayRows || (fIsAtEnd && numSeen < fNumArrayRows)))
+            throw DataFault("the table has " + std::string(fIsAtEnd ? "" : "at least ") + std::to_string(numSeen) +
+                            " rows, but there are " + std::to_string(fNumArrayRows) + " values beside it");
+        if (fNumRows > 0)
+        {
+            OpenBatch(batch);
+            return true;
+        }
+    }
+    return false;
+}
+
+void TableBlocks::OpenBatch(const ArrowArray* batch)
+{
+    fReaders.clear();
+    for (std::size_t i = 0; i < fVariables.size(); ++i) fReaders.push_back(MakeFieldReader(i, batch));
+}
+
+std::unique_ptr<FieldReader> TableBlocks::MakeFieldReader(std::size_t index, const ArrowArray* batch)
+{
+    Variable& variable = fVariables[index];
+    const ColumnType& type = fTypes[index];
+    std::unique_ptr<ColumnReader> reader;
+    if (variable.column < 0)
+    {
+        StridedArray rest = variable.array;
+        rest.data = static_cast<const char*>(rest.data) + static_cast<std::ptrdiff_t>(fFirstRow) * rest.stride;
+        reader = MakeReader(rest);
+    }
+    else
+    {
+        const ArrowArray& column = *batch->children[variable.column];
+        if (type.IsText() && type.isDictionary)
+            return std::make_unique<DictionaryCategoryField>(
+                MakePlaceReader(column, type, batch->offset), TextReader(*column.dictionary, type.storage, 0),
+                static_cast<std::size_t>(column.dictionary->length), variable);
+        if (type.IsText())
+            return std::make_unique<TextCategoryField>(TextReader(column, type.storage, batch->offset), variable);
+        reader = MakeReader(column, type, batch->offset);
+    }
+    switch (variable.use)
+    {
+    case Variable::Use::kCategory:
+        return std::make_unique<NumberCategoryField>(std::move(reader), variable);
+    case Variable::Use::kWeight:
+        return std::make_unique<WeightField>(std::move(reader), variable);
+    case Variable::Use::kAttribute:
+    case Variable::Use::kCode:
+        break;
+    }
+    return std::make_unique<ValueField>(std::move(reader));
+}

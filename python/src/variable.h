@@ -1,0 +1,51 @@
+#ifndef MCBINNING_VARIABLE_H
+#define MCBINNING_VARIABLE_H
+
+#include "categorytable.h"
+#include "columnreader.h"
+
+#include <mcobnqrt/binnumericusermissing.h>
+#include <mcobnqrt/binstringusermissing.h>
+
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+/// One field of the records: what it is for the analysis, where its values are, and which of them are missing.
+struct Variable
+{
+    enum class Use
+    {
+        kAttribute, ///< a number
+        kCategory,  ///< a number or a text, which gets a code here
+        kCode,      ///< a code already: 0, 1, 2, ... below `numCodes`
+        kWeight
+    };
+
+    std::string name;
+    Use use = Use::kAttribute;
+
+    /// The place of its column in the stream; -1 where it has an array.
+    int column = -1;
+    /// One value for each record of the whole data; borrowed.
+    StridedArray array{};
+
+    int numCodes = 0;
+    NumberCategories numbers;
+    TextCategories texts;
+    /// All categories are known, and another one is an error.
+    bool isComplete = false;
+
+    BINNumericUserMissing missingNumbers;
+    BINStringUserMissing missingTexts;
+
+    std::size_t GetNumCategories() const
+    {
+        return use == Use::kCode ? static_cast<std::size_t>(numCodes) : numbers.GetSize() + texts.GetSize();
+    }
+
+    std::vector<std::size_t> GetRanks() const { return texts.GetSize() > 0 ? texts.GetRanks() : numbers.GetRanks(); }
+};
+
+#endif

@@ -1,0 +1,237 @@
+"""Binning of tables, streams and files."""
+
+from __future__ import annotations
+
+import datetime
+import decimal
+import json
+import re
+import subprocess
+import warnings
+
+import duckdb
+import numpy as np
+import pandas as pd
+import polars as pl
+import pyarrow as pa
+import pyarrow.dataset as ds
+import pyarrow.parquet as pq
+import pytest
+from conftest import IRIS, ROOT
+
+import mcbinning as mb
+
+pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.NoCutPointsWarning")
+
+
+class OnlyStream:
+    """Something that has the stream protocol and nothing else."""
+
+    def __init__(self, reader: pa.RecordBatchReader) -> None:
+        self._reader = reader
+
+    def __arrow_c_stream__(self, requested_schema: object = None) -> object:
+        return self._reader.__arrow_c_stream__()
+
+
+def figures(result: mb.BinningResult) -> list[object]:
+    document = json.loads(result.to_json())
+    return [document["results"], [variable["categories"] for variable in document["variables"]]]
+
+
+def test_every_kind_of_source_gives_the_same_bits(mixed, tmp_path):
+    table = pa.Table.from_pandas(mixed)
+    parquet = tmp_path / "data's.parquet"
+    pq.write_table(table, parquet, row_group_size=300)
+    connection = duckdb.connect()
+    sources = {
+        "arrow": table,
+        "reader": table.to_reader(max_chunksize=77),
+        "stream": OnlyStream(table.to_reader(max_chunksize=77)),
+        "polars": pl.from_arrow(table),
+        "polars categories": pl.from_arrow(table).with_columns(pl.col("y").cast(pl.Categorical)),
+        "pandas categories": mixed.assign(y=pd.Categorical(mixed["y"], ["c", "unused", "b", "a"])),
+        "dictionary": table.set_column(7, "y", table["y"].dictionary_encode()).to_reader(max_chunksize=50),
+        "dataset": ds.dataset(parquet),
+        "scanner": ds.dataset(parquet).scanner(),
+        "duckdb": connection.sql("SELECT * FROM mixed"),
+        "parquet": str(parquet),
+        "glob": tmp_path / "*.parquet",
+    }
+    expected = figures(mb.supervised_bins(mixed, "y"))
+
+    for name, source in sources.items():
+        assert figures(mb.supervised_bins(source, "y")) == expected, name
+
+
+def test_order_of_rows_changes_no_cut_point_and_no_category(mixed):
+    shuffled = mixed.sample(frac=1, random_state=3)
+
+    assert figures(mb.supervised_bins(mixed, "y")) == figures(mb.supervised_bins(shuffled, "y"))
+    assert mb.supervised_bins(mixed, "y")["x"].target.category_names() == ["a", "b", "c"]
+
+
+@pytest.mark.parametrize("closed", ["right", "left"])
+def test_same_bits_as_the_command_line_tool(mcbin, tmp_path, closed):
+    def run(*arguments: str) -> dict[str, object]:
+        call = subprocess.run([mcbin, *arguments, "--format", "json"], capture_output=True, text=True, check=True)
+        return json.loads(call.stdout)
+
+    supervised = run("supervised", str(IRIS), "--target", "species", "--closed", closed)
+    equal = run("equal-frequency", str(IRIS), "--bins", "7", "--closed", closed)
+
+    for native, own in (
+        (supervised, mb.supervised_bins(IRIS, "species", closed=closed)),
+        (equal, mb.equal_frequency_bins(IRIS, n_bins=7, closed=closed)),
+    ):
+        ours = json.loads(own.to_json())["results"]
+        by_name = {entry["attribute"]: entry for entry in ours}
+        for entry in native["results"]:
+            assert by_name[entry["attribute"]] == entry
+        assert json.loads(mb.BinningResult.from_json(json.dumps(native)).to_json())["results"] == native["results"]
+
+
+def test_the_command_line_tool_applies_what_the_package_wrote(mcbin, tmp_path):
+    result = mb.supervised_bins(IRIS, "species", closed="left")
+    result.to_json(tmp_path / "bins.json")
+    subprocess.run([mcbin, "apply", tmp_path / "bins.json", IRIS, "-o", tmp_path / "out.csv"], check=True)
+
+    expected = result.transform(pd.read_csv(IRIS))
+    applied = pd.read_csv(tmp_path / "out.csv")
+    assert all(applied[f"{name}_bin"].tolist() == expected[name].tolist() for name in result)
+
+
+def test_status_words_are_those_of_the_command_line_tool():
+    source = (ROOT / "hosts/mcbin/statuswords.cpp").read_text()
+    codes = (ROOT / "include/mcobnqrt/mcstatus.h").read_text()
+    numbers = {name: int(number) for name, number in re.findall(r"(BINStatus\w+) = (\d+)", codes)}
+    cases = re.findall(r"case MCBinning::(BINStatus\w+):\s*return ((?:\"[^\"]*\"\s*)+);", source)
+
+    assert len(cases) == len(numbers) > 20
+    for name, text in cases:
+        assert mb.Status(numbers[name], "error").words == "".join(re.findall(r'"([^"]*)"', text)), name
+
+
+def test_dates_decimals_and_flags_are_what_the_user_knows():
+    rows = 40
+    table = pa.table(
+        {
+            "day": [datetime.date(2024, 1, 1 + i % 20) for i in range(rows)],
+            "paid": pa.array([decimal.Decimal(i % 20) / 10 for i in range(rows)], pa.decimal128(5, 1)),
+            "at": pa.array([i % 20 for i in range(rows)], pa.timestamp("s", "UTC")),
+            "flag": [i % 20 >= 10 for i in range(rows)],
+        }
+    )
+    result = mb.supervised_bins(table, "flag")
+
+    assert result["day"].labels == ["(-inf, 2024-01-10]", "(2024-01-10, +inf)"]
+    assert result["paid"].cut_points.tolist() == [0.9]
+    assert result["at"].labels[0] == "(-inf, 1970-01-01 00:00:09+00:00]"
+    assert result["day"].target.category_names() == [False, True]
+    assert result.transform(table)["day"].to_pylist() == [int(i % 20 >= 10) for i in range(rows)]
+
+
+def test_declared_values_and_intervals_are_missing():
+    frame = pd.DataFrame({"x": [1, 2, 3, 11, 12, 13, 99, -5, -7] * 4, "y": ["a", "a", "a", "b", "b", "b", "a", "b", "?"] * 4})
+    result = mb.supervised_bins(frame, "y", missing={"x": [99, (-6, -1)], "y": "?"})
+
+    assert result["x"].weights.tolist() == [12.0, 12.0]
+    assert result["x"].missing_weight == 12.0
+    assert result["x"].target.category_names() == ["a", "b"]
+    assert result.transform(frame)["x"][:9].tolist() == [0, 0, 0, 1, 1, 1, pd.NA, pd.NA, 0]
+
+
+def test_pairs_bin_against_many_targets_in_one_pass(mixed):
+    result = mb.supervised_bins(pa.Table.from_pandas(mixed).to_reader(), pairs=[("x", "y"), ("x", "flag"), ("whole", "flag")])
+
+    assert list(result) == [("x", "y"), ("x", "flag"), ("whole", "flag")]
+    assert result["x", "y"].cut_points.tolist() == mb.supervised_bins(mixed, "y")["x"].cut_points.tolist()
+    with pytest.raises(ValueError, match="several targets"):
+        result.transform(mixed)
+
+
+def test_text_is_left_out_unless_it_is_named(mixed):
+    frame = mixed[["x", "y"]].assign(kind=mixed["y"].str.upper())
+
+    assert mb.supervised_bins(frame, "y").left_out == ("kind",)
+    result = mb.supervised_bins(frame, "y", attributes=["kind"])
+    assert result["kind"].labels == ["{A}", "{B}", "{C}"]
+    assert result.transform(frame)["kind"].tolist() == [ord(text) - ord("a") for text in frame["y"]]
+    with pytest.raises(mb.DataError, match="column 'kind', row 2: there is a category that was not there before"):
+        result.transform(pd.DataFrame({"kind": ["A", "C", "D"]}))
+
+
+def failing_reader(table: pa.Table) -> pa.RecordBatchReader:
+    def batches():
+        yield from table.to_batches(max_chunksize=1000)[:1]
+        raise KeyError("line dropped")
+
+    return pa.RecordBatchReader.from_batches(table.schema, batches())
+
+
+@pytest.mark.parametrize(
+    ("data", "options", "error", "message"),
+    [
+        ({"x": [], "y": []}, {"target": "y"}, mb.DataError, "column 'y': no row has a category"),
+        ({"x": []}, {}, mb.BinningError, "no record of positive weight"),
+        ({"x": [1.0, 2.0], "y": ["a", "a"]}, {"target": "y"}, mb.DataError, "'y': there is a single category, 'a'"),
+        ({"x": [1.0, 2.0], "y": ["a", "b"]}, {"target": "z"}, mb.DataError, "column 'z': there is no such column"),
+        ({"x": [1.0], "w": [-0.5]}, {"weight": "w"}, mb.DataError, "column 'w', row 0: the weight is negative"),
+        ({"x": [1.0] * 2, "w": [1.0, None]}, {"weight": "w"}, mb.DataError, "column 'w', row 1: the weight is missing"),
+        ({"x": [1.0], "w": [np.inf]}, {"weight": "w"}, mb.DataError, "column 'w', row 0: the weight is infinite"),
+        ({"x": range(300), "y": range(300)}, {"target": "y"}, mb.DataError, "'y', row 256: there are more than 256"),
+        ({"x": [[1.0], [2.0]]}, {}, mb.DataError, "column 'x': .*nested"),
+        ({"x": [1.0, 2.0]}, {"temp_dir": "/nowhere/at/all"}, mb.BinningError, "directory for temporary files"),
+        ({"x": ["a", "b"]}, {}, mb.DataError, "nothing to bin"),
+    ],
+)
+def test_bad_data_are_refused_with_column_and_row(data, options, error, message):
+    run = mb.supervised_bins if "target" in options else mb.equal_frequency_bins
+    for source in (pa.table(data), pa.table(data).to_reader()):
+        with pytest.raises(error, match=message):
+            run(source, **options)
+
+
+def test_a_stream_that_fails_midway_says_so_and_leaves_no_file(mixed, tmp_path):
+    table = pa.Table.from_pandas(mixed)
+
+    with pytest.raises(KeyError, match="line dropped"):
+        mb.equal_frequency_bins(failing_reader(table), temp_dir=tmp_path)
+    with pytest.raises(KeyError, match="line dropped"):
+        mb.supervised_bins(failing_reader(table), "y", temp_dir=tmp_path)
+    with pytest.raises(mb.StreamError, match="behind 1000 rows: .*line dropped") as caught:
+        mb.equal_frequency_bins(OnlyStream(failing_reader(table)), temp_dir=tmp_path)
+    assert caught.value.row == 1000
+    assert list(tmp_path.iterdir()) == []
+
+
+def test_infinities_are_ordered_and_the_library_s_verdict_is_said_in_words():
+    x = np.array([-np.inf] * 5 + [1.0] * 10)
+    frame = pd.DataFrame({"x": x, "y": np.where(x < 0, "a", "b")})
+
+    result = mb.supervised_bins(frame, "y")
+    assert result["x"].cut_points.tolist() == [-np.inf]
+    assert result.transform(frame)["x"].tolist() == [0] * 5 + [1] * 10
+    assert figures(mb.BinningResult.from_json(result.to_json())) == figures(result)
+    with pytest.warns(mb.BadBinTableWarning, match="'x': the values lie outside all bins"):
+        mb.supervised_bins(frame.assign(x=-x), "y")
+
+
+@pytest.mark.parametrize(
+    ("x", "weights", "warning"),
+    [
+        ([1.0] * 20, [1.0] * 20, mb.SingleValueWarning),
+        ([None] * 20, [1.0] * 20, mb.NoValidValuesWarning),
+        (list(range(20)), [1.0, 0.0] * 10, mb.SingleCategoryWarning),
+        (list(range(20)), [1.0] * 20, mb.NoCutPointsWarning),
+    ],
+)
+def test_what_is_odd_about_an_attribute_is_a_warning_of_its_own_class(x, weights, warning):
+    table = pa.table({"odd": pa.array(x, pa.float64()), "y": ["a", "b"] * 10, "w": weights})
+    with warnings.catch_warnings(record=True) as caught:
+        warnings.simplefilter("always")
+        result = mb.supervised_bins(table, "y", weight="w")
+
+    assert [type(entry.message) for entry in caught] == [warning]
+    assert caught[0].message.attribute == "odd" and caught[0].message.status == result["odd"].status
+    assert caught[0].filename == __file__

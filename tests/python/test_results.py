@@ -1,0 +1,159 @@
+"""What can be done with the bins."""
+
+from __future__ import annotations
+
+import json
+import sqlite3
+
+import duckdb
+import numpy as np
+import pandas as pd
+import pyarrow as pa
+import pytest
+from hypothesis import given, settings
+from hypothesis import strategies as st
+
+import mcbinning as mb
+
+pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
+
+VALUES = st.one_of(st.none(), st.integers(-20, 20).map(lambda n: n / 4), st.floats(-1e6, 1e6))
+ROWS = st.lists(st.tuples(VALUES, st.sampled_from("abc"), st.sampled_from([0.0, 0.5, 1.0, 3.0])), min_size=1, max_size=60)
+
+
+def table_of(rows: list[tuple[float | None, str, float]]) -> pa.Table:
+    x, y, w = zip(*rows)
+    return pa.table({"x": pa.array(x, pa.float64()), "y": y, "w": w})
+
+
+@settings(max_examples=150, deadline=None)
+@given(rows=ROWS, closed=st.sampled_from(["right", "left"]), bins=st.integers(2, 6))
+def test_bins_of_the_same_data_recount_to_the_table(rows, closed, bins):
+    table = table_of(rows + [(0.25, "a", 1.0), (0.75, "b", 1.0)])
+    for result in (
+        mb.supervised_bins(table, "y", ["x"], weight="w", closed=closed, max_distinct=bins, n_bins=bins),
+        mb.equal_frequency_bins(table, ["x"], weight="w", closed=closed, n_bins=bins),
+    ):
+        found = result["x"]
+        placed = table.append_column("bin", result.transform(table)["x"]).to_pandas()
+        weights = placed.groupby("bin")["w"].sum().reindex(range(found.n_bins), fill_value=0.0)
+
+        assert weights.tolist() == found.weights.tolist()
+        assert placed.loc[placed["bin"].isna(), "w"].sum() == found.missing_weight
+        if found.target is not None:
+            for code, category in enumerate(found.target.category_names()):
+                part = placed[placed["y"] == category].groupby("bin")["w"].sum()
+                assert part.reindex(range(found.n_bins), fill_value=0.0).tolist() == found.target_weights[:, code].tolist()
+
+
+@settings(max_examples=60, deadline=None)
+@given(rows=ROWS, closed=st.sampled_from(["right", "left"]))
+def test_json_keeps_every_bit(rows, closed):
+    result = mb.equal_frequency_bins(table_of(rows + [(0.1, "a", 0.3)]), ["x"], weight="w", closed=closed, n_bins=4)
+    again = mb.BinningResult.from_json(result.to_json())
+
+    assert again["x"].cut_points.tobytes() == result["x"].cut_points.tobytes()
+    assert again["x"].weights.tobytes() == result["x"].weights.tobytes()
+    assert again.to_json() == result.to_json()
+
+
+@settings(max_examples=60, deadline=None)
+@given(rows=ROWS, closed=st.sampled_from(["right", "left"]))
+def test_sql_puts_every_row_where_transform_does(rows, closed):
+    table = table_of(rows + [(0.25, "a", 1.0)])
+    result = mb.equal_frequency_bins(table, ["x"], closed=closed, n_bins=4, missing={"x": [-1.5, (2.0, 3.0)]})
+    expected = result.transform(table)["x"].to_pylist()
+    table_of_rows = table  # DuckDB finds it by this name
+    assert len(table_of_rows) == len(expected)
+    database = sqlite3.connect(":memory:")
+    database.execute("CREATE TABLE data (x REAL)")
+    database.executemany("INSERT INTO data VALUES (?)", [(value,) for value in table["x"].to_pylist()])
+
+    assert [row[-1] for row in database.execute(result.to_sql("sqlite", "data"))] == expected
+    assert [row[-1] for row in duckdb.sql(result.to_sql("duckdb", "table_of_rows")).fetchall()] == expected
+
+
+def test_sql_of_dates_texts_and_labels_gives_what_transform_gives(mixed):
+    frame = mixed.assign(kind=mixed["y"].str.upper())
+    result = mb.supervised_bins(frame, "y", ["stamp", "zoned", "day", "flag", "single", "kind"])
+    for labels in (False, True):
+        expected = result.transform(frame, labels=labels)
+        out = duckdb.sql(result.to_sql("duckdb", "frame", labels)).df()
+        for name in expected:
+            assert out[f"{name}_bin"].tolist() == expected[name].tolist(), name
+    with pytest.raises(ValueError, match="dialect"):
+        result.to_sql("klingon")
+
+
+def test_transform_gives_back_the_kind_of_thing_that_it_got(mixed, tmp_path):
+    frame = mixed.set_index(pd.Index(range(5000, 6500)))
+    result = mb.supervised_bins(frame[["x", "whole", "y"]], "y")
+    path = tmp_path / "data.csv"
+    frame.to_csv(path, index=False)
+
+    bins = result.transform(frame)
+    assert bins.index.equals(frame.index) and list(bins) == ["x", "whole"]
+    stream = result.transform(path, labels=True)
+    assert isinstance(stream, pa.RecordBatchReader)
+    labels = stream.read_all()["x"].to_pylist()
+    assert labels == [result["x"].labels[number] for number in bins["x"]]
+    with pytest.raises(mb.DataError, match="column 'whole': there is no such column"):
+        result.transform(frame[["x"]])
+
+
+@pytest.mark.parametrize("closed", ["right", "left"])
+@pytest.mark.parametrize("n_bins", [2, 33, 34, 300])
+def test_many_and_few_cut_points_are_searched_alike(closed, n_bins):
+    values = np.random.default_rng(n_bins).integers(0, 1000, 40_000).astype(float)
+    found = mb.equal_frequency_bins(pa.table({"x": values}), n_bins=n_bins, closed=closed)["x"]
+
+    side = "left" if closed == "right" else "right"
+    assert found.bin_numbers(values).tolist() == np.searchsorted(found.cut_points, values, side=side).tolist()
+
+
+def test_values_outside_the_range_seen_fall_into_the_outer_bins():
+    result = mb.equal_frequency_bins(pa.table({"x": range(100)}), n_bins=4)
+
+    assert result["x"].bin_numbers(np.array([-1e300, -np.inf, 1e300, np.inf, np.nan])).tolist() == [0, 0, 3, 3, 4]
+
+
+def test_summary_and_notebook_show_the_largest_gain_first(iris):
+    result = mb.supervised_bins(iris.rename(columns={"petal_width": "<b>"}), "species")
+
+    assert result.summary()["attribute"].tolist() == ["<b>", "petal_length", "sepal_length", "sepal_width"]
+    assert result.summary()["gain"].is_monotonic_decreasing
+    html = result._repr_html_()
+    assert "&lt;b&gt;" in html and html.index("&lt;b&gt;") < html.index("sepal_width")
+
+
+def test_frames_have_a_row_for_each_bin(iris):
+    result = mb.supervised_bins(iris, "species")
+    frame = result.to_pandas()
+
+    assert len(frame) == sum(found.n_bins for found in result.values())
+    assert frame.groupby("attribute")["weight"].sum().tolist() == [150.0] * 4
+    parts = frame[[f"weight[{name}]" for name in ("setosa", "versicolor", "virginica")]]
+    assert parts.sum(axis=1).tolist() == frame["weight"].tolist()
+    assert result.to_arrow().to_pandas().equals(frame)
+
+
+def test_plots_draw_shares_over_the_weight_of_the_bins(iris):
+    result = mb.supervised_bins(iris, "species")
+    ax = result.plot("petal_width")
+    bars = [(bar.get_x(), bar.get_width(), bar.get_height()) for bar in ax.patches]
+
+    assert len(bars) == 3 * result["petal_width"].n_bins
+    assert sum(width * height for _, width, height in bars) == pytest.approx(1.0)
+    titles = [axes.get_title() for axes in result.plot_all(2).axes]
+    assert titles[0].startswith("petal_width") and titles[-1].startswith("sepal_width")
+
+
+def test_a_reader_refuses_other_json():
+    text = mb.equal_frequency_bins(pa.table({"x": range(9)}), n_bins=2).to_json()
+
+    with pytest.raises(ValueError, match="schema version 2"):
+        mb.BinningResult.from_json(text.replace('"schema_version": 1', '"schema_version": 2'))
+    with pytest.raises(ValueError, match="no JSON of bins"):
+        mb.BinningResult.from_json('{"schema": "x"}')
+    extended = json.loads(text) | {"more": 1}
+    assert mb.BinningResult.from_json(json.dumps(extended)).to_json() == text
