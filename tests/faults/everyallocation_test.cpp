@@ -12,7 +12,8 @@ int failingAllocation = 0; ///< its number, counted from 1; 0 for none
 
 } // namespace
 
-void* operator new(std::size_t size)
+// Not inlined: g++ would see through one of a pair and complain that it doesn't match the other.
+[[gnu::noinline]] void* operator new(std::size_t size)
 {
     void* memory = ++numAllocations != failingAllocation ? std::malloc(size > 0 ? size : 1) : nullptr;
     if (memory == nullptr)
@@ -20,12 +21,12 @@ void* operator new(std::size_t size)
     return memory;
 }
 
-void operator delete(void* memory) noexcept
+[[gnu::noinline]] void operator delete(void* memory) noexcept
 {
     std::free(memory);
 }
 
-void operator delete(void* memory, std::size_t) noexcept
+[[gnu::noinline]] void operator delete(void* memory, std::size_t) noexcept
 {
     std::free(memory);
 }
