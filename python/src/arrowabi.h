@@ -1,7 +1,7 @@
 #ifndef MCBINNING_ARROWABI_H
 #define MCBINNING_ARROWABI_H
 
-// The structures of the Arrow C data and C stream interfaces, as that specification prints them for copying. The guards
+// The structures of the Arrow C data and C stream interfaces, as their definition prints them for copying. The guards
 // are its own, so that another copy in the same source does no harm.
 
 #include <cstdint>
