@@ -152,12 +152,10 @@ const char* CsvReader::FindSpecial(const char* end)
     {
         const char* const quote = Find(std::max(fSpecial, fBegin), end, '"');
         const char* const back = Find(std::max(fSpecial, fBegin), quote, '\r');
-        if (back != quote && back + 2 == end && back[1] == '\n')
-            fSpecial = end;
-        else if (back != quote || quote != end)
+        const bool isLineEnd = back != quote && back + 2 == end && back[1] == '\n';
+        if (!isLineEnd && (back != quote || quote != end))
             return std::min(back, quote);
-        else
-            fSpecial = end;
+        fSpecial = end;
     }
     return end;
 }

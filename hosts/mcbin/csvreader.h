@@ -75,7 +75,7 @@ private:
     void KeepFailure(Work work);
     void AddField(std::string_view text);
     void EndRow(int terminator);
-    const CsvRow& ShowFields(CsvRow& row);
+    static const CsvRow& ShowFields(CsvRow& row);
     void Fail(const std::string& words);
 
     InputFile fFile;

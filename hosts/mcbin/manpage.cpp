@@ -62,7 +62,7 @@ void PrintFooter(std::ostream& os, const CLI::App& app)
 
 void PrintManPage(std::ostream& os, const CLI::App& app)
 {
-    const std::string name = app.get_name();
+    const std::string& name = app.get_name();
     os << ".TH " << ToUpper(name) << " 1\n.SH NAME\n"
        << name << " \\- " << Escape(app.get_description()) << "\n.SH SYNOPSIS\n";
     const std::vector<const CLI::App*> commands = app.get_subcommands([](const CLI::App*) { return true; });

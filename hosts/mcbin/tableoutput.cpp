@@ -81,7 +81,7 @@ std::vector<std::string> MakeHead(const Findings& findings, const Result& result
         return head;
     for (const std::size_t code : codes) head.push_back(Printable(Shorten(target->categories[code])));
     if (codes.size() < target->categories.size())
-        head.push_back("others");
+        head.emplace_back("others");
     if (HasTwoCategories(findings, result))
         head.insert(head.end(), {"rate", "WoE", "IV"});
     return head;

@@ -27,6 +27,9 @@ template<class Interface, class Settings, class Output>
 class BinningDriver : public Interface
 {
 public:
+    BinningDriver(const BinningDriver&) = delete;
+    BinningDriver& operator=(const BinningDriver&) = delete;
+
     std::string GetVersionString() override { return GetComponentVersion(); }
     void SetCancelPointer(MCQueryCancel* query) override { fCancelMonitor.SetCancelPointer(query); }
     void Cancel() override { fCancelMonitor.Cancel(); }
@@ -50,9 +53,6 @@ protected:
           fWeightIndex(fVarList.GetWeightIndex()), fPlatform(platform)
     {
     }
-
-    BinningDriver(const BinningDriver&) = delete;
-    BinningDriver& operator=(const BinningDriver&) = delete;
 
     /// Reads and spools the records in the first call that finds one, and gives the outcome of that again in later
     /// calls. `threshold` is the number of distinct values above which an attribute is pre-binned, 0 for none.

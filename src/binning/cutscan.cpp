@@ -233,7 +233,7 @@ void CutScan::TryAllRows(Range range, CountVector& left, CountVector& right, Bes
     }
 }
 
-void CutScan::TryRow(int row, const CountVector& left, const CountVector& right, Best& best) const
+void CutScan::TryRow(int row, const CountVector& left, const CountVector& right, Best& best)
 {
     const double entropy = PartitionEntropy(left, right);
     // A NaN never replaces a best, and a NaN that came first is never replaced.

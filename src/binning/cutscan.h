@@ -75,7 +75,7 @@ private:
     bool IsCandidate(int row, Range range) const;
     void AddRows(int first, int last, double* categories) const;
     void MoveRows(int first, int last, CountVector& left, CountVector& right) const;
-    void TryRow(int row, const CountVector& left, const CountVector& right, Best& best) const;
+    static void TryRow(int row, const CountVector& left, const CountVector& right, Best& best);
     void TryAllRows(Range range, CountVector& left, CountVector& right, Best& best) const;
 
     void CountBlocks();
