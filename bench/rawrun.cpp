@@ -1,18 +1,13 @@
 // One whole run over a file of doubles, column by column: what the library takes for data that another program has, too.
-//
-//     rawrun FILE RECORDS ATTRIBUTES CATEGORIES BINS DIRECTORY
-//
-// The target's codes come behind the attributes. Without categories it is an equal-frequency run. Prints the seconds.
 
+#include "measure.h"
 #include "workloads.h"
 
-#include <chrono>
 #include <cstdio>
 #include <cstdlib>
 #include <exception>
 #include <fstream>
 #include <stdexcept>
-#include <string>
 
 namespace
 {
@@ -28,6 +23,10 @@ std::vector<double> ReadColumn(std::ifstream& file, std::size_t numRecords)
 
 } // namespace
 
+/// rawrun FILE RECORDS ATTRIBUTES CATEGORIES BINS DIRECTORY
+///
+/// The target's codes come behind the attributes. Without categories it is an equal-frequency run. Prints the seconds of
+/// processor time and the peak of memory, in MiB above the data.
 int main(int argc, char** argv)
 try
 {
@@ -43,13 +42,13 @@ try
     if (workload.fNumCategories > 0)
         workload.fTarget = ReadColumn(file, numRecords);
 
-    const auto start = std::chrono::steady_clock::now();
-    RunWhole(workload, argv[6]);
-    std::printf("%.3f\n", std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count());
+    double seconds = 0.0;
+    const double memory = PeakMemory([&] { seconds = Seconds([&] { RunWhole(workload, argv[6]); }); });
+    std::printf("%.3f %.1f\n", seconds, memory);
     return 0;
 }
-catch (const std::exception& error)
+catch (const std::exception& failure)
 {
-    std::fprintf(stderr, "%s\n", error.what());
+    std::fprintf(stderr, "rawrun: %s\n", failure.what());
     return 1;
 }

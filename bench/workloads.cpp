@@ -1,20 +1,25 @@
 #include "workloads.h"
 
 #include <cmath>
+#include <memory>
 #include <stdexcept>
 
 namespace
 {
 
+/// The seeds of the generators. That of an attribute is kAttributeSeed and its number.
+constexpr std::uint64_t kTargetSeed = 1;
+constexpr std::uint64_t kWeightSeed = 2;
+constexpr std::uint64_t kAttributeSeed = 100;
+
 std::vector<double> MakeTarget(std::size_t numRecords, int numCategories)
 {
-    Numbers numbers(1);
+    Numbers numbers(kTargetSeed);
     std::vector<double> target(numRecords);
     for (double& code : target) code = numbers.Below(numCategories);
     return target;
 }
 
-/// Normal values whose mean moves by `shift` from one category to the next.
 std::vector<double> MakeShifted(const std::vector<double>& target, double shift, std::uint64_t seed)
 {
     Numbers numbers(seed);
@@ -24,26 +29,44 @@ std::vector<double> MakeShifted(const std::vector<double>& target, double shift,
     return values;
 }
 
-void MakeWhole(std::vector<double>& values)
+void MakeWhole(Workload& workload)
 {
-    for (double& value : values) value = std::floor(value * 125.0);
+    for (std::vector<double>& column : workload.fColumns)
+    {
+        for (double& value : column) value = std::floor(value * 125.0);
+    }
 }
 
-template<class Algorithm, class Run>
-void RunAndRequire(std::unique_ptr<Algorithm> algorithm, Run run)
+void ReplaceTargetByWeight(Workload& workload)
+{
+    workload.fTarget.clear();
+    Numbers numbers(kWeightSeed);
+    for (std::size_t i = 0; i < workload.NumRecords(); ++i) workload.fWeight.push_back(0.5 + numbers.Uniform());
+}
+
+template<class Settings>
+Settings SettingsFor(const std::string& directory)
+{
+    Settings settings;
+    settings.SetTempDirName(directory);
+    return settings;
+}
+
+/// Makes one run for each number of bins. \return the number of cut points of all of them.
+template<class Results, class Algorithm, class Run>
+std::size_t RunAll(std::unique_ptr<Algorithm> algorithm, const std::vector<int>& numbersOfBins, Run run)
 {
     if (algorithm == nullptr)
         throw std::runtime_error("no algorithm for this workload");
-    const MCBinning::MCStatus status = run(*algorithm);
-    if (status.IsError())
-        throw std::runtime_error("the run ended with " + std::to_string(status.GetErrorCode()));
-}
-
-template<class Results, class Output>
-std::size_t CountCutPoints(const Output& output)
-{
+    for (const int numberOfBins : numbersOfBins)
+    {
+        algorithm->GetSettings()->SetNumberOfBins(numberOfBins);
+        const MCBinning::MCStatus status = run(*algorithm);
+        if (status.IsError())
+            throw std::runtime_error("the run ended with error " + std::to_string(status.GetErrorCode()));
+    }
     std::vector<Results> results;
-    output.GetAllCutPoints(results);
+    algorithm->GetOutput()->GetAllCutPoints(results);
     std::size_t numCutPoints = 0;
     for (const Results& result : results) numCutPoints += result.GetCutPoints().size();
     return numCutPoints;
@@ -51,49 +74,39 @@ std::size_t CountCutPoints(const Output& output)
 
 } // namespace
 
-Workload MakeContinuous(std::size_t numRecords, int numAttributes, int numCategories)
+Workload MakeContinuous(std::size_t numRecords, const std::vector<double>& shifts, int numCategories)
 {
-    constexpr double kShifts[] = {0.25, 0.5, 1.0, 1.5, 2.0, 0.0, 0.0, 0.0, 0.0, 0.0};
     Workload workload;
     workload.fNumCategories = numCategories;
     workload.fTarget = MakeTarget(numRecords, numCategories);
-    for (int attribute = 0; attribute < numAttributes; ++attribute)
-        workload.fColumns.push_back(
-            MakeShifted(workload.fTarget, kShifts[attribute % 10], 100 + static_cast<std::uint64_t>(attribute)));
+    for (std::size_t attribute = 0; attribute < shifts.size(); ++attribute)
+        workload.fColumns.push_back(MakeShifted(workload.fTarget, shifts[attribute], kAttributeSeed + attribute));
     return workload;
 }
 
-Workload MakeWorkload(const std::string& name, int scale)
+Workload MakeWorkload(const std::string& name, std::size_t scale)
 {
-    const auto scaled = [scale](std::size_t numRecords) { return numRecords / static_cast<std::size_t>(scale); };
-    Workload workload;
-    if (name == "W1")
-        workload = MakeContinuous(scaled(1000000), 10, 3);
-    else if (name == "W2")
-    {
-        workload = MakeContinuous(scaled(1000000), 10, 3);
-        for (std::vector<double>& column : workload.fColumns) MakeWhole(column);
-    }
-    else if (name == "W3")
-        workload = MakeContinuous(scaled(10000), 10, 3);
-    else if (name == "W4")
-    {
-        workload = MakeContinuous(scaled(1000000), 10, 3);
-        workload.fNumCategories = 0;
-        workload.fTarget.clear();
-        workload.fNumbersOfBins = {10, 100};
-        Numbers numbers(2);
-        for (std::size_t i = 0; i < workload.NumRecords(); ++i) workload.fWeight.push_back(0.5 + numbers.Uniform());
-    }
-    else if (name == "W5")
-        workload = MakeContinuous(scaled(200000), 5, 20);
-    else
+    const std::vector<double> informative{0.25, 0.5, 1.0, 1.5, 2.0};
+    const std::vector<double> informativeAndNoise{0.25, 0.5, 1.0, 1.5, 2.0, 0.0, 0.0, 0.0, 0.0, 0.0};
+    if (name == "W3")
+        return MakeContinuous(10000 / scale, informativeAndNoise, 3);
+    if (name == "W5")
+        return MakeContinuous(200000 / scale, informative, 20);
+    if (name != "W1" && name != "W2" && name != "W4")
         throw std::runtime_error("no workload of that name: " + name);
-    workload.fName = name;
+
+    Workload workload = MakeContinuous(1000000 / scale, informativeAndNoise, 3);
+    if (name == "W2")
+        MakeWhole(workload);
+    if (name == "W4")
+    {
+        ReplaceTargetByWeight(workload);
+        workload.fNumbersOfBins = {10, 100};
+    }
     return workload;
 }
 
-ColumnSource::ColumnSource(const Workload& workload) : fNumRecords(workload.NumRecords()), fRecord(0)
+ColumnSource::ColumnSource(const Workload& workload) : fNumRecords(workload.NumRecords())
 {
     if (!workload.fTarget.empty())
         fFields.push_back(workload.fTarget.data());
@@ -113,7 +126,7 @@ const MCCommon::Record* ColumnSource::Next()
 
 BINVarList ListOf(const Workload& workload)
 {
-    // Neither of the rounding options: weights stay as they are, with their fractions.
+    // None of the options that round: the weights stay as they are, with their fractions.
     constexpr auto kUnrounded = static_cast<IBINVariable::BINWRoundingOption>(2);
     BINVarList list;
     if (!workload.fTarget.empty())
@@ -130,35 +143,15 @@ std::size_t RunWhole(const Workload& workload, const std::string& directory)
 {
     BINVarList list = ListOf(workload);
     ColumnSource source(workload);
-    std::size_t numCutPoints = 0;
-    if (workload.fNumCategories > 0)
+    if (workload.fTarget.empty())
     {
-        BINSettings settings;
-        settings.SetNumberOfBins(workload.fNumbersOfBins.front());
-        settings.SetTempDirName(directory);
-        RunAndRequire(std::unique_ptr<IBINAlgorithm>(BINFactory().CreateBINAlgorithm(settings, list)),
-                      [&](IBINAlgorithm& algorithm)
-                      {
-                          const MCBinning::MCStatus status = algorithm.Run(&source, nullptr, nullptr);
-                          numCutPoints = CountCutPoints<BINAttributeTargetResults>(*algorithm.GetOutput());
-                          return status;
-                      });
-        return numCutPoints;
+        auto settings = SettingsFor<EFBINSettings>(directory);
+        std::unique_ptr<IEFBINAlgorithm> algorithm(EFBINFactory().CreateEFBINAlgorithm(settings, list));
+        return RunAll<BINAttributeResults>(std::move(algorithm), workload.fNumbersOfBins,
+                                           [&](IEFBINAlgorithm& made) { return made.Run(&source, nullptr); });
     }
-    EFBINSettings settings;
-    settings.SetNumberOfBins(workload.fNumbersOfBins.front());
-    settings.SetTempDirName(directory);
-    RunAndRequire(std::unique_ptr<IEFBINAlgorithm>(EFBINFactory().CreateEFBINAlgorithm(settings, list)),
-                  [&](IEFBINAlgorithm& algorithm)
-                  {
-                      MCBinning::MCStatus status;
-                      for (const int numberOfBins : workload.fNumbersOfBins)
-                      {
-                          algorithm.GetSettings()->SetNumberOfBins(numberOfBins);
-                          status = algorithm.Run(&source, nullptr);
-                      }
-                      numCutPoints = CountCutPoints<BINAttributeResults>(*algorithm.GetOutput());
-                      return status;
-                  });
-    return numCutPoints;
+    auto settings = SettingsFor<BINSettings>(directory);
+    std::unique_ptr<IBINAlgorithm> algorithm(BINFactory().CreateBINAlgorithm(settings, list));
+    return RunAll<BINAttributeTargetResults>(std::move(algorithm), workload.fNumbersOfBins,
+                                             [&](IBINAlgorithm& made) { return made.Run(&source, nullptr, nullptr); });
 }

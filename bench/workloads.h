@@ -3,13 +3,13 @@
 
 #include <mcobnqrt/mcobnqrt.h>
 
+#include <cstddef>
 #include <cstdint>
-#include <memory>
 #include <string>
 #include <vector>
 
-/// Random numbers that are the same bits on every machine: the generator splitmix64, and nothing but exact arithmetic on
-/// what it gives.
+/// Random numbers that are the same bits on every machine: the generator splitmix64, and nothing but additions and exact
+/// arithmetic on what it gives.
 class Numbers
 {
 public:
@@ -43,28 +43,28 @@ private:
 /// A data set and what is to be done with it. Columns are held as the host would hold them.
 struct Workload
 {
-    std::string fName;
-    std::string fWhat;
-    int fNumCategories = 0;                    ///< of the target; 0: an equal-frequency run
     std::vector<std::vector<double>> fColumns; ///< the attributes
-    std::vector<double> fTarget;               ///< codes; empty without a target
+    std::vector<double> fTarget;               ///< codes; empty: an equal-frequency run
     std::vector<double> fWeight;               ///< empty without a weight
+    int fNumCategories = 0;                    ///< of the target
     std::vector<int> fNumbersOfBins{10};       ///< one run for each
 
     std::size_t NumRecords() const { return fColumns.front().size(); }
 };
 
-/// The workloads W1 to W5, by name; `scale` divides the number of records.
-Workload MakeWorkload(const std::string& name, int scale = 1);
+/// One of the workloads W1 to W5, which README.md tells of; `scale` divides the number of records.
+Workload MakeWorkload(const std::string& name, std::size_t scale = 1);
 
-/// As W1, with any number of records and attributes.
-Workload MakeContinuous(std::size_t numRecords, int numAttributes, int numCategories);
+/// A random target, and for each of the `shifts` an attribute: normal values whose mean moves by so much from one category to
+/// the next.
+Workload MakeContinuous(std::size_t numRecords, const std::vector<double>& shifts, int numCategories);
 
-/// Streams a workload as a host would: target, weight, attributes.
+/// Streams a workload as a host would: target, weight, attributes. The workload outlives it.
 class ColumnSource : public IBINRecordSource
 {
 public:
     explicit ColumnSource(const Workload& workload);
+
     bool HasNext() override { return fNextRow < fNumRecords; }
     const MCCommon::Record* Next() override;
 
@@ -72,12 +72,14 @@ private:
     std::vector<const double*> fFields;
     std::size_t fNumRecords;
     std::size_t fNextRow = 0;
-    MCCommon::Record fRecord;
+    MCCommon::Record fRecord{0};
 };
 
+/// The variables of a workload, in the order of its source.
 BINVarList ListOf(const Workload& workload);
 
-/// A whole run through the factories; the results are kept up to the end. \return the number of cut points found.
+/// A whole run through the factories, with its temporary files in `directory`. \return the number of cut points found.
+/// \throw std::runtime_error if the run ends with an error.
 std::size_t RunWhole(const Workload& workload, const std::string& directory);
 
 #endif
