@@ -3,13 +3,13 @@
 
 #include "workloads.h"
 
+#include "base/bincancelmonitor.h"
 #include "binning/binalgorithm.h"
 #include "binning/binefpreprocess.h"
 #include "binning/cutscan.h"
 #include "data/binattributereader.h"
+#include "data/bindatapreparator.h"
 #include "data/tuplesort.h"
-#include "entry/bincancelmonitor.h"
-#include "metadata/bindatapreparator.h"
 #include "support/tempdir.h"
 
 #include <benchmark/benchmark.h>

@@ -60,7 +60,8 @@ public:
     int GetNumberOfBins() const { return fNumberOfBins; }
 
     /// Where the temporary files go; any name is taken, and Run finds out whether files can be made there. Default: the
-    /// system's directory for temporary files, without trailing separator. Read with the records.
+    /// directory for temporary files that the system names (POSIX: TMPDIR, else /tmp), without trailing separator. Read
+    /// with the records.
     void SetTempDirName(const std::string& name) { fTempDirName = name; }
     std::string GetTempDirName() const { return fTempDirName; }
 

@@ -102,8 +102,8 @@ public:
     ///         variable is not the list's weight.
     bool SetVariableRole(int index, IBINVariable::VariableRole role);
 
-    /// Raises each variable's number of categories to what its encoder has seen. \return their sum, no further than an int
-    /// goes.
+    /// Raises each variable's number of categories to what its encoder has seen. \return their sum, no further than an
+    /// int goes.
     int UpdateNumbersOfCategories();
 
     /// Gives the names of all attributes, in order, and that of the last variable of RoleTarget; `target` is left
@@ -114,7 +114,8 @@ public:
     /// belongs to it; the target and weight indices follow their variables.
     ///
     /// To remove the target or any variable of RoleTarget leaves the list without a target, even if another variable
-    /// has that role. The counter that goes down is the one that the measure level names. Pointers to the removed
+    /// has that role. A target index that SetVariableRole() has put on the weight stays where it is when the weight
+    /// goes; a factory refuses such a list. The counter that goes down is the one that the measure level names. Pointers to the removed
     /// variable dangle, those to the others stay good.
     ///
     /// \return false, and nothing has changed, if there is no such variable.

@@ -11,13 +11,13 @@ class ProgressReport;
 /// It is called from inside Run, on the thread of that call, in two phases:
 ///
 ///     phase                     a report                           "IndexVar"
-///     reading the records       after every nth record, n being    the number of records read so far
+///     reading the records       after every nth turn, n being      the number of records read so far
 ///                               GetNSkippedCasesReports(); with
 ///                               n = 0 never
 ///     binning the attributes    after every (n+1)th attribute,     the variable index of the attribute
 ///                               n being GetNSkippedAttReports()
 ///
-/// "elapsedTime" is in both the seconds since the phase began. An attribute or pair whose result is an error makes no
+/// A turn of reading is a call of IBINRecordSource::Next(), with a record or without one. "elapsedTime" is in both the seconds since the phase began. An attribute or pair whose result is an error makes no
 /// report of its own: a report that is due then comes with the next one that has no error.
 class MCOBNQRT_EXPORT ProgressListener
 {

@@ -142,12 +142,12 @@ void BINAlgorithm::FillCells(const std::vector<double>& values, const std::vecto
 
 /// Decides on the merges, all of them on the table as it is: no decision changes the judgement of another bin. Only
 /// inner bins are judged, and each against the smaller of its neighbours. A small bin joins the side that leaves the
-/// lower entropy.
-std::vector<BINBinMerge> BINAlgorithm::FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const
+/// lower entropy. Gives the left one of each two bins to be joined.
+std::vector<int> BINAlgorithm::FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const
 {
     const std::size_t numCells = NumCategories() + 1;
     const double threshold = fSettings.GetSmallBinDetectionThreshold();
-    std::vector<BINBinMerge> merges;
+    std::vector<int> merges;
     for (std::size_t bin = 1; bin < numCutPoints; ++bin)
     {
         const CountVector previous = RowOf(cells, numCells, bin - 1);
@@ -159,7 +159,7 @@ std::vector<BINBinMerge> BINAlgorithm::FindSmallBins(const std::vector<double>& 
         const double entropyLeft = PartitionEntropy(Sum(own, previous), next);
         const double entropyRight = PartitionEntropy(Sum(own, next), previous);
         const int index = static_cast<int>(bin);
-        merges.push_back(entropyRight < entropyLeft ? BINBinMerge{index, 'R'} : BINBinMerge{index - 1, 'L'});
+        merges.push_back(entropyRight < entropyLeft ? index : index - 1);
     }
     return merges;
 }
@@ -168,10 +168,10 @@ void BINAlgorithm::MergeSmallBins(std::vector<double>& cells, std::set<double>& 
 {
     const std::size_t numCells = NumCategories() + 1;
     int numMerged = 0;
-    for (const BINBinMerge& merge : FindSmallBins(cells, cutPoints.size()))
+    for (const int merge : FindSmallBins(cells, cutPoints.size()))
     {
         // Merges come in the order of the bins, and each one before this has taken a row away in front of it.
-        const auto bin = static_cast<std::size_t>(merge.fBinIndex - numMerged);
+        const auto bin = static_cast<std::size_t>(merge - numMerged);
         AddRow(cells, numCells, bin + 1, bin);
         const auto gone = cells.begin() + static_cast<std::ptrdiff_t>((bin + 1) * numCells);
         cells.erase(gone, gone + static_cast<std::ptrdiff_t>(numCells));

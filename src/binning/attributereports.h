@@ -31,8 +31,7 @@ public:
         --fCountdown;
         if (!isDue || status.IsError())
             return;
-        const double seconds = static_cast<double>(fPlatform->GetTickCount() - fStart) / 1000.0;
-        fReporter.SetValues(static_cast<unsigned int>(attribute), seconds);
+        fReporter.SetValues(static_cast<unsigned int>(attribute), fPlatform->GetSecondsSince(fStart));
         fListener->ReportProgress(fReporter);
         fCountdown = fSettings.GetNSkippedAttReports();
     }

@@ -156,8 +156,7 @@ void BINAlgorithm::BinTuples(PairResult& result)
         return;
     }
     std::vector<double> cuts;
-    std::vector<double> counts;
-    if (fPreProcess->PreBinEqualFrequency(fTuples, fRecordCount, cuts, counts, result.fTotalWeight))
+    if (fPreProcess->PreBinEqualFrequency(fTuples, fRecordCount, cuts, result.fTotalWeight))
         result.fStatus = BinAttributePreBinned(fTuples, cuts, result.fCutPoints, result.fCells, result.fModelEntropy);
 }
 

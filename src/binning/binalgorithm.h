@@ -1,7 +1,6 @@
 #ifndef MCOBNQRT_BINALGORITHM_H
 #define MCOBNQRT_BINALGORITHM_H
 
-#include "binning/binbinmerge.h"
 #include "binning/binningdriver.h"
 
 #include <mcobnqrt/binoutput.h>
@@ -85,7 +84,7 @@ private:
                                 std::set<double>& cutPoints, std::vector<double>& cells, double& modelEntropy);
     void FillCells(const std::vector<double>& values, const std::vector<double>& table,
                    const std::set<double>& cutPoints, std::vector<double>& cells) const;
-    std::vector<BINBinMerge> FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const;
+    std::vector<int> FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const;
     void MergeSmallBins(std::vector<double>& cells, std::set<double>& cutPoints) const;
     void ComputeModelEntropy(const std::vector<double>& cells, double& modelEntropy) const;
 

@@ -209,43 +209,28 @@ BINEFPreProcess::BINEFPreProcess(int numberOfBins, bool rightBorderClosed)
 {
 }
 
-BINEFPreProcess::~BINEFPreProcess() = default;
-
 bool BINEFPreProcess::PreBinEqualFrequency(const std::vector<BINSortTuple>* tuples, unsigned int numTuples,
-                                           std::vector<double>& cuts, std::vector<double>& counts, double totalWeight)
+                                           std::vector<double>& cuts, double totalWeight) const
 {
-    fTargetTuples = tuples;
-    fNumTargetTuples = numTuples;
-    return FindEFCutPoints(cuts, counts, totalWeight);
+    if (tuples == nullptr || !CanBin(numTuples, totalWeight))
+        return false;
+    FindBins(EFWalk<BINSortTuple>(*tuples, numTuples, totalWeight, fNumberOfBins), fRightBorderClosed, cuts, nullptr);
+    return true;
 }
 
 bool BINEFPreProcess::BinEqualFrequency(const std::vector<BINValueTuple>* tuples, unsigned int numTuples,
-                                        std::vector<double>& cuts, std::vector<double>& counts, double totalWeight)
+                                        std::vector<double>& cuts, std::vector<double>& counts,
+                                        double totalWeight) const
 {
-    fValueTuples = tuples;
-    fNumValueTuples = numTuples;
-    return FindEFCutPoints(cuts, counts, totalWeight);
-}
-
-bool BINEFPreProcess::FindEFCutPoints(std::vector<double>& cuts, std::vector<double>& counts, double totalWeight) const
-{
-    const bool hasValueTuples = fValueTuples != nullptr;
-    if (!hasValueTuples && fTargetTuples == nullptr)
+    if (tuples == nullptr || !CanBin(numTuples, totalWeight))
         return false;
-    const unsigned int numTuples = hasValueTuples ? fNumValueTuples : fNumTargetTuples;
-    if (fNumberOfBins <= 0 || numTuples == 0 || !(0.0 < totalWeight))
-        return false;
-
-    if (!hasValueTuples)
-    {
-        FindBins(EFWalk<BINSortTuple>(*fTargetTuples, numTuples, totalWeight, fNumberOfBins), fRightBorderClosed, cuts,
-                 nullptr);
-        return true;
-    }
-    FindBins(EFWalk<BINValueTuple>(*fValueTuples, numTuples, totalWeight, fNumberOfBins), fRightBorderClosed, cuts,
-             &counts);
-    RemoveCutAtEnd(fValueTuples->front().fValue, (*fValueTuples)[numTuples - 1].fValue, fRightBorderClosed, cuts,
-                   counts);
+    FindBins(EFWalk<BINValueTuple>(*tuples, numTuples, totalWeight, fNumberOfBins), fRightBorderClosed, cuts, &counts);
+    RemoveCutAtEnd(tuples->front().fValue, (*tuples)[numTuples - 1].fValue, fRightBorderClosed, cuts, counts);
     RemoveEmptyBins(totalWeight, cuts, counts);
     return true;
+}
+
+bool BINEFPreProcess::CanBin(unsigned int numTuples, double totalWeight) const
+{
+    return fNumberOfBins > 0 && numTuples > 0 && 0.0 < totalWeight;
 }

@@ -16,29 +16,24 @@ class BINEFPreProcess
 {
 public:
     BINEFPreProcess(int numberOfBins, bool rightBorderClosed);
-    virtual ~BINEFPreProcess();
 
     /// The cut list for pre-binning: at most numberOfBins - 1 values in rising order, the value at an end of the data
-    /// among them where that value alone holds a share. `cuts` arrives empty, `counts` stays as it is.
+    /// among them where that value alone holds a share. `cuts` arrives empty.
     ///
     /// \return false, with nothing changed, without tuples, bins or a total weight above 0.
     bool PreBinEqualFrequency(const std::vector<BINSortTuple>* tuples, unsigned int numTuples,
-                              std::vector<double>& cuts, std::vector<double>& counts, double totalWeight);
+                              std::vector<double>& cuts, double totalWeight) const;
 
     /// The bins themselves: cut points in rising order, and the weight of each bin, none of them 0, one more than there
     /// are cuts. Both lists arrive empty. \return as above.
     bool BinEqualFrequency(const std::vector<BINValueTuple>* tuples, unsigned int numTuples, std::vector<double>& cuts,
-                           std::vector<double>& counts, double totalWeight);
+                           std::vector<double>& counts, double totalWeight) const;
 
 private:
-    bool FindEFCutPoints(std::vector<double>& cuts, std::vector<double>& counts, double totalWeight) const;
+    bool CanBin(unsigned int numTuples, double totalWeight) const;
 
     bool fRightBorderClosed;
     int fNumberOfBins;
-    const std::vector<BINValueTuple>* fValueTuples = nullptr; ///< not owned; read in preference to the other
-    const std::vector<BINSortTuple>* fTargetTuples = nullptr; ///< not owned
-    unsigned int fNumValueTuples = 0;
-    unsigned int fNumTargetTuples = 0;
 };
 
 #endif

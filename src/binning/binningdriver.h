@@ -1,11 +1,11 @@
 #ifndef MCOBNQRT_BINNINGDRIVER_H
 #define MCOBNQRT_BINNINGDRIVER_H
 
+#include "base/bincancelmonitor.h"
+#include "base/makestatus.h"
+#include "base/version.h"
 #include "data/binattributereader.h"
-#include "entry/bincancelmonitor.h"
-#include "entry/makestatus.h"
-#include "entry/version.h"
-#include "metadata/bindatapreparator.h"
+#include "data/bindatapreparator.h"
 #include "platform/platform.h"
 
 #include <mcobnqrt/binvarlist.h>

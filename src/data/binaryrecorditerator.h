@@ -34,12 +34,12 @@ public:
     ~BinaryRecordIterator();
 
     /// Whether Next() still has a value to give.
-    virtual bool IsOK();
+    bool IsOK();
 
     /// The next value; 0.0 once IsOK() is false.
-    virtual double Next();
+    double Next();
 
-    virtual int GetStatus();
+    int GetStatus();
 
     /// The values that are read ahead and how many they are, at least one while IsOK().
     const double* GetBlock() const { return fBlock.data() + fNextValue; }
@@ -50,7 +50,7 @@ public:
 
     /// Goes back to the first value, after an end or a failed read too. \return the new status; without a file it stays
     /// kFailed.
-    virtual int Rewind();
+    int Rewind();
 
     /// Whether the file could be opened.
     bool HasFile() const { return fFile != nullptr; }

@@ -1,8 +1,8 @@
 #include "data/binattributereader.h"
 
+#include "base/makestatus.h"
+#include "data/bindatapreparator.h"
 #include "data/tuplesort.h"
-#include "entry/makestatus.h"
-#include "metadata/bindatapreparator.h"
 
 #include <mcobnqrt/binvarlist.h>
 
@@ -69,9 +69,8 @@ MCStatus BINAttributeReader::ReadRecords()
     if (status.IsError())
         return status;
     const BINVarList& list = *fPreparator->GetVarList();
-    const bool listHasTarget = list.GetTargetIndex() >= 0;
     fHasWeight = list.GetWeightIndex() >= 0;
-    fHasTarget = fTupleKind == TupleKind::kWithTarget || (fTupleKind == TupleKind::kByList && listHasTarget);
+    fHasTarget = fTupleKind == TupleKind::kWithTarget;
     fNumRecords = fPreparator->GetNumRecords();
     fFileNames = fPreparator->GetFileNames();
 
@@ -82,8 +81,7 @@ MCStatus BINAttributeReader::ReadRecords()
     if (fTargetTuples == nullptr && fValueTuples == nullptr)
         return MakeError(MCBinning::BINStatusOutOfMemory);
 
-    fVariableIndex = &fPreparator->GetVariableIndex();
-    if (fHasTarget && listHasTarget)
+    if (fHasTarget && list.GetTargetIndex() >= 0)
         fTargetIterator = OpenPosition(fTargetPosition);
     if (fHasWeight)
     {

@@ -18,7 +18,6 @@ class IBINRecordSource;
 /// Which tuples a reader makes of the spooled records.
 enum class TupleKind
 {
-    kByList,       ///< with a target if the list has one
     kWithTarget,   ///< for pairs; a list without a target takes any categorical variable as one
     kWithoutTarget ///< for attributes alone; a target of the list is a variable like any other
 };
@@ -32,7 +31,7 @@ class BINAttributeReader
 {
 public:
     /// Does no work. The source is used once, by ReadRecords(); the preparator outlives the reader.
-    BINAttributeReader(IBINRecordSource* source, BINDataPreparator* preparator, TupleKind kind = TupleKind::kByList);
+    BINAttributeReader(IBINRecordSource* source, BINDataPreparator* preparator, TupleKind kind);
     BINAttributeReader(const BINAttributeReader&) = delete;
     BINAttributeReader& operator=(const BINAttributeReader&) = delete;
     ~BINAttributeReader();
@@ -103,8 +102,7 @@ private:
     IBINRecordSource* fRecordSource; ///< the host's; used once
     BINDataPreparator* fPreparator;  ///< the algorithm's; not owned
     bool fUseThreshold = false;
-    std::vector<std::string> fFileNames;              ///< by position
-    const std::vector<int>* fVariableIndex = nullptr; ///< the preparator's: variable index to position
+    std::vector<std::string> fFileNames; ///< by position
     unsigned int fNumTuples = 0;
     unsigned int fNumDistinct = 0;
     unsigned int fNumRecords = 0; ///< accepted by the pass, and the size of the tuple vector

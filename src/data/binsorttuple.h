@@ -11,9 +11,4 @@ struct BINSortTuple
     double fWeight;           ///< above 0; 1.0 in a list without a weight variable
 };
 
-inline bool operator<(const BINSortTuple& left, const BINSortTuple& right)
-{
-    return left.fValue < right.fValue;
-}
-
 #endif

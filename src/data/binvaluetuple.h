@@ -8,9 +8,4 @@ struct BINValueTuple
     double fWeight; ///< above 0; 1.0 in a list without a weight variable
 };
 
-inline bool operator<(const BINValueTuple& left, const BINValueTuple& right)
-{
-    return left.fValue < right.fValue;
-}
-
 #endif

@@ -3,9 +3,9 @@
 // Only a missing weight drops a record. All other missing data stay in the files as gMissingValue, since a record
 // without one attribute is good for the others.
 
-#include "entry/bincancelmonitor.h"
-#include "entry/makestatus.h"
-#include "metadata/bindatapreparator.h"
+#include "base/bincancelmonitor.h"
+#include "base/makestatus.h"
+#include "data/bindatapreparator.h"
 
 #include <mcobnqrt/binnumericusermissing.h>
 #include <mcobnqrt/binprogressreporter.h>
@@ -57,7 +57,7 @@ public:
     {
         if (fListener == nullptr || --fCountdown != 0)
             return;
-        fReporter.SetValues(numReceived, static_cast<double>(fPlatform->GetTickCount() - fStart) / 1000.0);
+        fReporter.SetValues(numReceived, fPlatform->GetSecondsSince(fStart));
         fListener->ReportProgress(fReporter);
         fCountdown = fInterval;
     }

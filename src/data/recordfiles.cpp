@@ -3,9 +3,9 @@
 // A name is picked before the pass and becomes ours when its file is made, which fails if anything bears the name by
 // then. Until a file is made nothing is read, written or removed under its name; from then on only that very file is.
 
-#include "entry/bincancelmonitor.h"
-#include "entry/makestatus.h"
-#include "metadata/bindatapreparator.h"
+#include "base/bincancelmonitor.h"
+#include "base/makestatus.h"
+#include "data/bindatapreparator.h"
 #include "metadata/recordlayout.h"
 
 #include <array>

@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_CREATEALGORITHM_H
 #define MCOBNQRT_CREATEALGORITHM_H
 
-#include "entry/makestatus.h"
+#include "base/makestatus.h"
 #include "metadata/recordlayout.h"
 
 #include <mcobnqrt/binvarlist.h>

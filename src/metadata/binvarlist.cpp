@@ -54,14 +54,6 @@ bool DeclareUserMissing(IBINVariable& variable, IBINUserMissing::DataType type, 
     return true;
 }
 
-/// Where `index` points after the variable at `removed` has gone.
-int IndexAfterRemoval(int index, int removed)
-{
-    if (index == removed)
-        return kNone;
-    return index > removed ? index - 1 : index;
-}
-
 } // namespace
 
 BINVarList::BINVarList() = default;
@@ -261,8 +253,16 @@ bool BINVarList::RemoveVar(int index)
         --fNumContVars;
     else if (!isWeight)
         --fNumCatVars;
-    fTargetIndex = isTarget ? kNone : IndexAfterRemoval(fTargetIndex, index);
-    fWeightIndex = IndexAfterRemoval(fWeightIndex, index);
+    // The target index goes with any variable of RoleTarget, and with no other. One that SetVariableRole() has put on the
+    // weight stays, and FindVariableWithoutPosition() sees to it that such a list is not analysed.
+    if (isTarget)
+        fTargetIndex = kNone;
+    else if (index < fTargetIndex)
+        --fTargetIndex;
+    if (isWeight)
+        fWeightIndex = kNone;
+    else if (index < fWeightIndex)
+        --fWeightIndex;
     return true;
 }
 

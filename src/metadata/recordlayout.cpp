@@ -31,5 +31,5 @@ int FindVariableWithoutPosition(const BINVarList& list)
         if (!HasPosition(list, i))
             return i;
     }
-    return -1;
+    return list.GetTargetIndex() < size ? -1 : list.GetTargetIndex();
 }

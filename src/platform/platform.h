@@ -36,6 +36,9 @@ public:
     /// Milliseconds of a steady clock, from an unspecified start.
     virtual std::int64_t GetTickCount() = 0;
 
+    /// `start` is an earlier GetTickCount().
+    double GetSecondsSince(std::int64_t start) { return static_cast<double>(GetTickCount() - start) / 1000.0; }
+
     /// Tells whether a file could be made as `path`. Makes nothing, and doesn't wait on what it finds.
     virtual NameState ProbeName(const std::string& path) = 0;
 

@@ -59,7 +59,7 @@ MCStatus BINOutput::SetAttributeTargetResults(MCStatus status, const std::set<do
                                               double modelEntropy)
 {
     if (!IsPair(attribute, target))
-        return StoreError(MCBinning::BINStatusIndexOutOfRange);
+        return MakeError(MCBinning::BINStatusIndexOutOfRange);
 
     BINAttributeTargetResults entry;
     entry.fStatus = status;
@@ -88,7 +88,7 @@ MCStatus BINOutput::GetAttributeTargetCutPoints(int attribute, int target, BINAt
     // Only pairs are ever stored, so what is none is not found.
     const auto found = fResultIndex.find({attribute, target});
     if (found == fResultIndex.end())
-        return StoreError(MCBinning::BINStatusIndexOutOfRange);
+        return MakeError(MCBinning::BINStatusIndexOutOfRange);
     return CopyEntry(fResults[static_cast<std::size_t>(found->second)], results);
 }
 
@@ -99,7 +99,7 @@ MCStatus BINOutput::GetAttributeCutPoints(int attribute, std::vector<BINAttribut
         if (entry.GetAttributeIndex() == attribute)
             found.push_back(entry);
     if (found.empty())
-        return StoreError(MCBinning::BINStatusIndexOutOfRange);
+        return MakeError(MCBinning::BINStatusIndexOutOfRange);
 
     const MCStatus lastStatus = found.back().GetStatus();
     results.reserve(results.size() + found.size()); // the last allocation

@@ -29,7 +29,7 @@ MCStatus EFBINOutput::SetAttributeResults(MCStatus status, const std::vector<dou
                                           double totalWeightWithMissing, double minimum, double maximum)
 {
     if (attribute < 0)
-        return StoreError(MCBinning::BINStatusBadAttributeIndex);
+        return MakeError(MCBinning::BINStatusBadAttributeIndex);
 
     BINAttributeResults entry;
     entry.fStatus = status;
@@ -51,7 +51,7 @@ MCStatus EFBINOutput::GetAttributeCutPoints(int attribute, BINAttributeResults& 
         std::find_if(fResults.begin(), fResults.end(),
                      [attribute](const BINAttributeResults& entry) { return entry.GetAttributeIndex() == attribute; });
     if (found == fResults.end())
-        return StoreError(MCBinning::BINStatusIndexOutOfRange);
+        return MakeError(MCBinning::BINStatusIndexOutOfRange);
     return CopyEntry(*found, results);
 }
 

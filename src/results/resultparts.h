@@ -1,6 +1,8 @@
 #ifndef MCOBNQRT_RESULTPARTS_H
 #define MCOBNQRT_RESULTPARTS_H
 
+#include "base/makestatus.h"
+
 #include <mcobnqrt/mcstatus.h>
 
 #include <ostream>
@@ -11,18 +13,12 @@
 /// BINAttributeTargetResults or BINAttributeResults, whose displays differ only in the lines that one of them hasn't
 /// got.
 
-/// An error; the stores give no warnings of their own.
-inline MCBinning::MCStatus StoreError(MCBinning::BINStatusCode code)
-{
-    return MCBinning::MCStatus(code, false);
-}
-
 /// Replaces `results` by a copy of the entries of a store.
 template<class Results>
 MCBinning::MCStatus CopyAllEntries(const std::vector<Results>& entries, std::vector<Results>& results)
 {
     if (entries.empty())
-        return StoreError(MCBinning::BINStatusNoResults);
+        return MakeError(MCBinning::BINStatusNoResults);
     results = std::vector<Results>(entries); // by way of a copy: a failing allocation leaves `results` whole
     return MCBinning::MCStatus();
 }

@@ -1,9 +1,9 @@
 #ifndef MCOBNQRT_TESTS_PREPARATORPEER_H
 #define MCOBNQRT_TESTS_PREPARATORPEER_H
 
+#include "base/bincancelmonitor.h"
 #include "data/binaryrecorditerator.h"
-#include "entry/bincancelmonitor.h"
-#include "metadata/bindatapreparator.h"
+#include "data/bindatapreparator.h"
 #include "support/faultyplatform.h"
 #include "support/hostdata.h"
 #include "support/tempdir.h"

@@ -12,7 +12,7 @@ namespace
 class LoadedReader
 {
 public:
-    LoadedReader(const BINVarList& list, RecordTable records, TupleKind kind = TupleKind::kByList)
+    LoadedReader(const BINVarList& list, RecordTable records, TupleKind kind = TupleKind::kWithTarget)
         : fRecords(std::move(records)), fPreparator(list), fReader(&fRecords, &*fPreparator, kind)
     {
         EXPECT_TRUE(fReader.ReadRecords().IsOK());

@@ -125,7 +125,9 @@ TEST(VarList, IndicesFollowTheirVariablesOnRemoval)
     EXPECT_EQ(kWeight, list.GetVariableRole(1));
     EXPECT_EQ(1, FindVariableWithoutPosition(list));
     ASSERT_TRUE(list.RemoveVar(1));
-    EXPECT_EQ(-1, list.GetTargetIndex());
+    EXPECT_EQ(1, list.GetTargetIndex());
+    EXPECT_EQ(nullptr, list.GetTargetVariable());
+    EXPECT_EQ(1, FindVariableWithoutPosition(list));
 }
 
 TEST(VarList, UserMissingValuesAndOneIntervalMeetInOneObject)

@@ -1,4 +1,4 @@
-#include "entry/bincancelmonitor.h"
+#include "base/bincancelmonitor.h"
 
 #include <mcobnqrt/mcquerycancel.h>
 

@@ -1,6 +1,6 @@
-#include "metadata/bindatapreparator.h"
+#include "data/bindatapreparator.h"
 
-#include "entry/makestatus.h"
+#include "base/makestatus.h"
 
 #include <mcobnqrt/binvarlist.h>
 #include <mcobnqrt/ibinencoder.h>

@@ -1,4 +1,4 @@
-#include "entry/version.h"
+#include "base/version.h"
 
 std::string GetComponentVersion()
 {
