@@ -110,13 +110,13 @@ public:
     /// alone if there is none.
     void GetVarNames(std::vector<std::string>& attributes, std::string& target) const;
 
-    /// Removes the variable. Every later one moves down by one, and with it the field of the host's record that
-    /// belongs to it; the target and weight indices follow their variables.
+    /// Removes the variable. Every later one moves down by one, and with it the field of the host's record that belongs
+    /// to it; the target and weight indices follow their variables.
     ///
     /// To remove the target or any variable of RoleTarget leaves the list without a target, even if another variable
     /// has that role. A target index that SetVariableRole() has put on the weight stays where it is when the weight
-    /// goes; a factory refuses such a list. The counter that goes down is the one that the measure level names. Pointers to the removed
-    /// variable dangle, those to the others stay good.
+    /// goes; a factory refuses such a list. The counter that goes down is the one that the measure level names.
+    /// Pointers to the removed variable dangle, those to the others stay good.
     ///
     /// \return false, and nothing has changed, if there is no such variable.
     bool RemoveVar(int index);

@@ -46,9 +46,9 @@ public:
     /// allocation passes through; if it ended the reading of the source, the object has no data and later calls say so.
     ///
     /// \return OK; the warning BINStatusSomeResultsFlagged if a result of this or an earlier call carries a status of
-    ///         its own, to be read there; BINStatusCancelled, with the results found so far kept; or the error that stopped
-    ///         the call before a result was made: BINStatusBadNumberOfBins, BINStatusBadAttributeIndex (no entry can be
-    ///         binned), BINStatusNoRecords (no record, none of positive weight, or no source),
+    ///         its own, to be read there; BINStatusCancelled, with the results found so far kept; or the error that
+    ///         stopped the call before a result was made: BINStatusBadNumberOfBins, BINStatusBadAttributeIndex (no
+    ///         entry can be binned), BINStatusNoRecords (no record, none of positive weight, or no source),
     ///         BINStatusTooManyCategories, BINStatusTempDirNotFound, BINStatusCannotOpenTempFile, BINStatusOutOfMemory.
     ///         A call after a failed reading of the source gives that failure again.
     virtual MCBinning::MCStatus Run(IBINRecordSource* source, const std::vector<int>* attributes) = 0;

@@ -17,8 +17,9 @@ class ProgressReport;
 ///     binning the attributes    after every (n+1)th attribute,     the variable index of the attribute
 ///                               n being GetNSkippedAttReports()
 ///
-/// A turn of reading is a call of IBINRecordSource::Next(), with a record or without one. "elapsedTime" is in both the seconds since the phase began. An attribute or pair whose result is an error makes no
-/// report of its own: a report that is due then comes with the next one that has no error.
+/// A turn of reading is a call of IBINRecordSource::Next(), with a record or without one. "elapsedTime" is in both the
+/// seconds since the phase began. An attribute or pair whose result is an error makes no report of its own: a report
+/// that is due then comes with the next one that has no error.
 class MCOBNQRT_EXPORT ProgressListener
 {
 public:

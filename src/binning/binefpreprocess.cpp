@@ -156,9 +156,9 @@ void FindBins(EFWalk<Tuple> walk, bool rightBorderClosed, std::vector<double>& c
     }
 }
 
-/// Takes out a cut at an end of the data, where a single value holds the last share or, with the left border closed, the
-/// first. The bin that it cuts off has no weight, unless the cut is the midpoint of two neighbouring doubles, which is one
-/// of them: then its weight goes to the bin beside it.
+/// Takes out a cut at an end of the data, where a single value holds the last share or, with the left border closed,
+/// the first. The bin that it cuts off has no weight, unless the cut is the midpoint of two neighbouring doubles, which
+/// is one of them: then its weight goes to the bin beside it.
 void RemoveCutAtEnd(double smallest, double largest, bool rightBorderClosed, std::vector<double>& cuts,
                     std::vector<double>& counts)
 {

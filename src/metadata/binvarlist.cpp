@@ -253,8 +253,8 @@ bool BINVarList::RemoveVar(int index)
         --fNumContVars;
     else if (!isWeight)
         --fNumCatVars;
-    // The target index goes with any variable of RoleTarget, and with no other. One that SetVariableRole() has put on the
-    // weight stays, and FindVariableWithoutPosition() sees to it that such a list is not analysed.
+    // The target index goes with any variable of RoleTarget, and with no other. One that SetVariableRole() has put on
+    // the weight stays, and FindVariableWithoutPosition() sees to it that such a list is not analysed.
     if (isTarget)
         fTargetIndex = kNone;
     else if (index < fTargetIndex)
