@@ -49,10 +49,8 @@ public:
     }
 
 private:
-    struct Cut
+    struct Sides
     {
-        int fRow;
-        int fLastLeft;
         Counts fLeft;
         Counts fRight;
     };
@@ -74,6 +72,8 @@ private:
         b = b - Entropy(r) * kR;
         return Log2(std::pow(3.0, k) - 2.0) - b;
     }
+
+    int LastLeft(int row) const { return fRightBorderClosed ? row : row - 1; }
 
     Counts Total(int first, int last) const
     {
@@ -100,9 +100,9 @@ private:
         return both == 1 && one == 0;
     }
 
-    std::optional<Cut> Best(int first, int last) const
+    /// The candidate with the lowest partition entropy, none if there is no candidate.
+    std::optional<int> BestRow(int first, int last, const Counts& totals) const
     {
-        const Counts totals = Total(first, last);
         Counts l(totals.size(), 0.0);
         Counts r = totals;
         std::optional<int> best;
@@ -112,10 +112,9 @@ private:
         {
             if (!((i < last && !SamePure(i)) || (i > first && !SamePure(i - 1))))
                 continue;
-            const int lastLeft = fRightBorderClosed ? i : i - 1;
             for (std::size_t c = 1; c < l.size(); ++c)
             {
-                for (int j = next; j <= lastLeft; ++j)
+                for (int j = next; j <= LastLeft(i); ++j)
                 {
                     const double cell = fRows[static_cast<std::size_t>(j)][c - 1];
                     l[0] += cell;
@@ -124,7 +123,7 @@ private:
                     r[c] -= cell;
                 }
             }
-            next = lastLeft + 1;
+            next = LastLeft(i) + 1;
             const double w = PartitionEntropy(l, r);
             if (!best || bestEntropy > w)
             {
@@ -132,15 +131,19 @@ private:
                 bestEntropy = w;
             }
         }
-        if (!best)
-            return std::nullopt;
+        return best;
+    }
 
-        const int lastLeft = fRightBorderClosed ? *best : *best - 1;
-        const bool leftIsShorter = (first + last) * 0.5 >= *best;
-        Counts summed = leftIsShorter ? Total(first, lastLeft) : Total(lastLeft + 1, last);
-        Counts rest(totals.size());
+    /// The two sides of a cut at the row: the shorter one summed, the other what it leaves of the totals.
+    Sides SidesOf(int row, int first, int last, const Counts& totals) const
+    {
+        const bool leftIsShorter = (first + last) * 0.5 >= row;
+        Sides sides{totals, totals};
+        Counts& summed = leftIsShorter ? sides.fLeft : sides.fRight;
+        Counts& rest = leftIsShorter ? sides.fRight : sides.fLeft;
+        summed = leftIsShorter ? Total(first, LastLeft(row)) : Total(LastLeft(row) + 1, last);
         for (std::size_t c = 0; c < totals.size(); ++c) rest[c] = totals[c] - summed[c];
-        return leftIsShorter ? Cut{*best, lastLeft, summed, rest} : Cut{*best, lastLeft, rest, summed};
+        return sides;
     }
 
     void Split(int first, int last)
@@ -148,18 +151,19 @@ private:
         if (last <= first)
             return;
         const Counts totals = Total(first, last);
-        const std::optional<Cut> cut = Best(first, last);
-        if (!cut || cut->fLastLeft < first || cut->fLastLeft == last)
+        const std::optional<int> best = BestRow(first, last, totals);
+        if (!best || LastLeft(*best) < first || LastLeft(*best) == last)
             return;
+        const Sides sides = SidesOf(*best, first, last, totals);
         const double entropy = Entropy(totals);
         const double n = totals[0];
-        const double gain = entropy - PartitionEntropy(cut->fLeft, cut->fRight);
-        const double threshold = (Log2(n - 1.0) / n) + (Delta(cut->fLeft, cut->fRight, entropy) / n);
+        const double gain = entropy - PartitionEntropy(sides.fLeft, sides.fRight);
+        const double threshold = (Log2(n - 1.0) / n) + (Delta(sides.fLeft, sides.fRight, entropy) / n);
         if (!(threshold < gain))
             return;
-        fCutPoints.insert(fValues[static_cast<std::size_t>(cut->fRow)]);
-        Split(first, cut->fLastLeft);
-        Split(cut->fLastLeft + 1, last);
+        fCutPoints.insert(fValues[static_cast<std::size_t>(*best)]);
+        Split(first, LastLeft(*best));
+        Split(LastLeft(*best) + 1, last);
     }
 
     std::vector<double> fValues;
