@@ -42,10 +42,14 @@
 namespace
 {
 
-constexpr int kBlockSize = 64; ///< rows of a segment
+// Rows of a segment. What a bound gives away grows with the square of the segment's share of the rows: in a small table
+// long segments are seldom left out, and in a large one short ones cost more than they save.
+constexpr int kLongBlock = 64;
+constexpr int kShortBlock = 16;
+constexpr int kFewestRowsForLongBlocks = 40000; ///< of the table
 
-/// Ranges with fewer rows are walked over: the bounds cost as much as they save.
-constexpr int kFewestBoundedRows = 4 * kBlockSize;
+/// Ranges with fewer blocks are walked over: the bounds cost as much as they save.
+constexpr int kFewestBoundedBlocks = 4;
 
 constexpr double kLargestWhole = 9007199254740992.0; ///< 2^53: a double holds all whole numbers up to it
 constexpr double kLargestSpread = 4294967296.0;      ///< of weights with fractions; beyond it the margin says nothing
@@ -85,9 +89,10 @@ void CutScan::Side::Set(const double* counts, std::size_t size)
 }
 
 CutScan::CutScan(const std::vector<double>& table, std::size_t numCategories, bool rightBorderClosed)
-    : fTable(table), fNumCategories(numCategories), fRightBorderClosed(rightBorderClosed)
+    : fTable(table), fNumCategories(numCategories), fRightBorderClosed(rightBorderClosed),
+      fBlockSize(table.size() / numCategories < kFewestRowsForLongBlocks ? kShortBlock : kLongBlock)
 {
-    if (fTable.size() >= static_cast<std::size_t>(kFewestBoundedRows) * fNumCategories)
+    if (fTable.size() >= static_cast<std::size_t>(kFewestBoundedBlocks * fBlockSize) * fNumCategories)
         CountBlocks();
 }
 
@@ -99,7 +104,7 @@ void CutScan::CountBlocks()
     std::uint64_t fractionBits = 0;
     for (int row = 0; row < numRows; ++row)
     {
-        if (row % kBlockSize == 0)
+        if (row % fBlockSize == 0)
             fRowsBefore.insert(fRowsBefore.end(), counts.begin(), counts.end());
         const double* const cells = Row(row);
         for (std::size_t c = 0; c < fNumCategories; ++c)
@@ -119,11 +124,11 @@ void CutScan::CountBlocks()
 /// The counts of all rows before `row`, of an exact table.
 void CutScan::CountRowsBefore(int row, double* categories) const
 {
-    const int block = std::min(row / kBlockSize, static_cast<int>(fRowsBefore.size() / fNumCategories) - 1);
+    const int block = std::min(row / fBlockSize, static_cast<int>(fRowsBefore.size() / fNumCategories) - 1);
     const auto before =
         fRowsBefore.begin() + static_cast<std::ptrdiff_t>(static_cast<std::size_t>(block) * fNumCategories);
     std::copy(before, before + static_cast<std::ptrdiff_t>(fNumCategories), categories);
-    AddRows(block * kBlockSize, row - 1, categories);
+    AddRows(block * fBlockSize, row - 1, categories);
 }
 
 void CutScan::AddRows(int first, int last, double* categories) const
@@ -244,7 +249,7 @@ void CutScan::TryRow(int row, const CountVector& left, const CountVector& right,
 
 bool CutScan::CanBeBounded(Range range, double weight) const
 {
-    const bool isLongEnough = range.fLast - range.fFirst + 1 >= kFewestBoundedRows;
+    const bool isLongEnough = range.fLast - range.fFirst + 1 >= kFewestBoundedBlocks * fBlockSize;
     return isLongEnough && (fIsExact || weight < kLargestSpread * fSmallestCell);
 }
 
@@ -287,7 +292,7 @@ CutScan::Best CutScan::FindBounded(Range range, const CountVector& totals)
 void CutScan::FindStates(Range range, const CountVector& totals)
 {
     fBoundaries.assign(1, range.fFirst);
-    for (int row = (range.fFirst / kBlockSize + 1) * kBlockSize; row <= range.fLast; row += kBlockSize)
+    for (int row = (range.fFirst / fBlockSize + 1) * fBlockSize; row <= range.fLast; row += fBlockSize)
         fBoundaries.push_back(row);
     fBoundaries.push_back(range.fLast + 1);
     fStates.resize(fBoundaries.size() * StateSize());

@@ -95,6 +95,7 @@ private:
     const std::vector<double>& fTable;
     std::size_t fNumCategories;
     bool fRightBorderClosed;
+    int fBlockSize;             ///< rows of a segment
     bool fIsExact = false;      ///< the cells are whole numbers with exact sums: any order of additions gives the same
     double fSmallestCell = 0.0; ///< of those above 0
     std::vector<double>

@@ -57,14 +57,14 @@ double RandomWeight(Dice& dice, Cells kind)
     return std::ldexp(1.0 + dice.Fraction(), dice.Below(120) - 60);
 }
 
-/// Rows that lean to a category which changes now and then, with runs of pure rows and some empty ones.
-Rows RandomRows(Dice& dice, int numRows, int numCategories, Cells kind)
+/// Rows that lean to a category which changes every `numAlike` rows or so, with runs of pure rows and some empty ones.
+Rows RandomRows(Dice& dice, int numRows, int numCategories, Cells kind, int numAlike = 4)
 {
     Rows rows;
     int leaning = 0;
     for (int i = 0; i < numRows; ++i)
     {
-        if (dice.Below(4) == 0)
+        if (dice.Below(numAlike) == 0)
             leaning = dice.Below(numCategories);
         std::vector<double> row(static_cast<std::size_t>(numCategories), 0.0);
         if (dice.Below(8) != 0)
@@ -181,6 +181,17 @@ void Mirror(Rows& rows)
     for (std::size_t row = rows.size(); row > 0; --row) rows.push_back(rows[row - 1]);
 }
 
+/// Takes one category after the other out of the later rows: where sums round, something is left of it to their end,
+/// above or below 0.
+void UseUp(Rows& rows)
+{
+    for (std::size_t row = 0; row < rows.size(); ++row)
+    {
+        const std::size_t numUsedUp = row * rows[row].size() / rows.size();
+        std::fill_n(rows[row].begin(), numUsedUp, 0.0);
+    }
+}
+
 std::string CaseName(Cells kind, unsigned int seed)
 {
     return "kind " + std::to_string(static_cast<int>(kind)) + " seed " + std::to_string(seed);
@@ -216,12 +227,28 @@ TEST(EntropySplit, EqualsThePlainFormOnTablesLongEnoughForBounds)
         {
             Dice dice(seed);
             const int numCategories = seed % 40 == 0 ? 100 : 2 + dice.Below(seed % 5 == 0 ? 12 : 3);
-            Rows rows = RandomRows(dice, 256 + dice.Below(400), numCategories, kind);
+            Rows rows = RandomRows(dice, 64 + dice.Below(500), numCategories, kind);
+            if (seed % 3 == 0)
+                UseUp(rows);
             if (seed % 4 == 0)
                 dice.Shuffle(rows); // noise: no cut stands out
             if (seed % 7 == 0)
                 Mirror(rows);
             EqualsThePlainForm(rows, CaseName(kind, seed));
+        }
+    }
+}
+
+TEST(EntropySplit, EqualsThePlainFormOnTablesOfLongSegments)
+{
+    for (const Cells kind : {Cells::kWhole, Cells::kFractional})
+    {
+        for (const int numRows : {39999, 40000}) // the last with short segments, and the first with long ones
+        {
+            Dice dice(static_cast<unsigned int>(numRows));
+            Rows rows = RandomRows(dice, numRows, 4, kind, numRows / 10);
+            UseUp(rows);
+            EXPECT_TRUE(EqualsThePlainForm(rows, CaseName(kind, static_cast<unsigned int>(numRows))));
         }
     }
 }
