@@ -336,7 +336,8 @@ std::size_t CutScan::FindBounds()
         const double* const nextState = fStates.data() + (segment + 1) * StateSize();
         nextLeft.Set(nextState, size);
         nextRight.Set(nextState + size, size);
-        fBounds[segment] = BoundOf(left, right, nextLeft, nextRight);
+        fBounds[segment] = IsAllNaN(right, nextRight) ? std::numeric_limits<double>::infinity()
+                                                      : BoundOf(left, right, nextLeft, nextRight);
         if (left.fEntropy + right.fEntropy < lowest)
         {
             promising = segment;
@@ -346,6 +347,17 @@ std::size_t CutScan::FindBounds()
         std::swap(right, nextRight);
     }
     return promising;
+}
+
+/// Whether no candidate of a segment can be the best, as each one's partition entropy is a NaN: with fractions the
+/// subtractions can leave less than nothing of a category on the right. It stays so, since rows hold nothing below 0 and
+/// rounding keeps order; for the same reason the weight of the right side is above 0 at every row if it is at the next
+/// boundary. So the category's share is below 0 throughout, and not too small for a double: a residual is no finer than
+/// the last bit of the smallest cell, and the weight less than 2^32 such cells.
+bool CutScan::IsAllNaN(const Side& right, const Side& nextRight)
+{
+    return nextRight.fCounts[0] > 0.0 &&
+           std::any_of(right.fCounts.begin() + 1, right.fCounts.end(), [](double count) { return count < 0.0; });
 }
 
 double CutScan::BoundOf(const Side& left, const Side& right, const Side& nextLeft, const Side& nextRight) const

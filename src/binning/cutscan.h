@@ -85,6 +85,7 @@ private:
     Best FindBounded(Range range, const CountVector& totals);
     void FindStates(Range range, const CountVector& totals);
     std::size_t FindBounds();
+    static bool IsAllNaN(const Side& right, const Side& nextRight);
     double BoundOf(const Side& left, const Side& right, const Side& nextLeft, const Side& nextRight) const;
     void TrySegment(std::size_t segment, Range range, double margin, Best& best) const;
     void MoveRow(int row, CountVector& left, CountVector& right, Estimate& estimate) const;
