@@ -10,7 +10,8 @@
 /// code.
 ///
 /// What it finds is what a walk over all rows would find that works out the partition entropy of every candidate. It
-/// only leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp.
+/// only leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp. Only among weights so near
+/// the smallest double that products lose their last bits it may find another one: such a range is too light to be cut.
 class CutScan
 {
 public:
