@@ -23,8 +23,29 @@ inline EFBINSettings EqualFrequencySettings(int numberOfBins)
     return settings;
 }
 
+/// An algorithm and what it has found: what both kinds of runs have in common.
+template<class Algorithm, class Results>
+class AlgorithmRun
+{
+public:
+    AlgorithmRun() = default;
+    explicit AlgorithmRun(std::unique_ptr<Algorithm> algorithm) : fAlgorithm(std::move(algorithm)) {}
+
+    std::vector<Results> All()
+    {
+        std::vector<Results> results;
+        fAlgorithm->GetOutput()->GetAllCutPoints(results);
+        return results;
+    }
+
+    Algorithm* operator->() { return fAlgorithm.get(); }
+
+protected:
+    std::unique_ptr<Algorithm> fAlgorithm;
+};
+
 /// A supervised algorithm, made through its factory unless a test brings its own.
-class Supervised
+class Supervised : public AlgorithmRun<IBINAlgorithm, BINAttributeTargetResults>
 {
 public:
     explicit Supervised(BINVarList list, BINSettings settings = SupervisedSettings())
@@ -34,7 +55,7 @@ public:
         EXPECT_NE(nullptr, fAlgorithm) << factory.GetStatus().GetErrorCode();
     }
 
-    explicit Supervised(std::unique_ptr<IBINAlgorithm> algorithm) : fAlgorithm(std::move(algorithm)) {}
+    using AlgorithmRun::AlgorithmRun;
 
     MCBinning::MCStatus Run(IBINRecordSource& source) { return fAlgorithm->Run(&source, nullptr, nullptr); }
 
@@ -55,22 +76,10 @@ public:
         fAlgorithm->GetOutput()->GetAttributeTargetCutPoints(attribute, target, results);
         return results;
     }
-
-    std::vector<BINAttributeTargetResults> All()
-    {
-        std::vector<BINAttributeTargetResults> results;
-        fAlgorithm->GetOutput()->GetAllCutPoints(results);
-        return results;
-    }
-
-    IBINAlgorithm* operator->() { return fAlgorithm.get(); }
-
-private:
-    std::unique_ptr<IBINAlgorithm> fAlgorithm;
 };
 
 /// An equal-frequency algorithm, made through its factory unless a test brings its own.
-class EqualFrequency
+class EqualFrequency : public AlgorithmRun<IEFBINAlgorithm, BINAttributeResults>
 {
 public:
     EqualFrequency(BINVarList list, EFBINSettings settings)
@@ -80,7 +89,7 @@ public:
         EXPECT_NE(nullptr, fAlgorithm) << factory.GetStatus().GetErrorCode();
     }
 
-    explicit EqualFrequency(std::unique_ptr<IEFBINAlgorithm> algorithm) : fAlgorithm(std::move(algorithm)) {}
+    using AlgorithmRun::AlgorithmRun;
 
     MCBinning::MCStatus Run(IBINRecordSource& source) { return fAlgorithm->Run(&source, nullptr); }
 
@@ -95,18 +104,6 @@ public:
         fAlgorithm->GetOutput()->GetAttributeCutPoints(attribute, results);
         return results;
     }
-
-    std::vector<BINAttributeResults> All()
-    {
-        std::vector<BINAttributeResults> results;
-        fAlgorithm->GetOutput()->GetAllCutPoints(results);
-        return results;
-    }
-
-    IEFBINAlgorithm* operator->() { return fAlgorithm.get(); }
-
-private:
-    std::unique_ptr<IEFBINAlgorithm> fAlgorithm;
 };
 
 /// The code of a result, 0 for OK, made readable in a failure message.
