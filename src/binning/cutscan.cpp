@@ -163,22 +163,38 @@ int CutScan::FindBestCut(int first, int last, CountVector& left, CountVector& ri
     if (CanBeBounded(range, totals[0]))
         best = FindBounded(range, totals);
     else
-        TryAllRows(range, left, right, best);
-    if (best.fRow == kNoRow)
-        return kNoRow;
+        TryRows(first, last, range, left, right, best);
+    if (best.fRow != kNoRow)
+        SumSides(best.fRow, range, totals, left, right);
+    return best.fRow;
+}
 
-    // The sides are those of another row by now, with the roundings of all subtractions. The shorter one is summed
-    // afresh, the other is what it leaves of the totals.
-    const int lastLeft = LastLeftRow(best.fRow);
-    const bool isLeftShorter = (static_cast<double>(first) + last) * 0.5 >= best.fRow;
+int CutScan::FindBestInnerCut(int first, int last, CountVector& left, CountVector& right) const
+{
+    const Range range{first, last};
+    const CountVector totals = right;
+    Best best;
+    if (fRightBorderClosed)
+        TryRows(first, last - 1, range, left, right, best);
+    else
+        TryRows(first + 1, last, range, left, right, best);
+    if (best.fRow != kNoRow)
+        SumSides(best.fRow, range, totals, left, right);
+    return best.fRow;
+}
+
+/// After a scan the sides are those of another row, with the roundings of all subtractions. The shorter one is summed
+/// afresh, the other is what it leaves of the totals.
+void CutScan::SumSides(int row, Range range, const CountVector& totals, CountVector& left, CountVector& right) const
+{
+    const bool isLeftShorter = (static_cast<double>(range.fFirst) + range.fLast) * 0.5 >= row;
     CountVector& summed = isLeftShorter ? left : right;
     CountVector& rest = isLeftShorter ? right : left;
     if (isLeftShorter)
-        SumRows(first, lastLeft, summed);
+        SumRows(range.fFirst, LastLeftRow(row), summed);
     else
-        SumRows(lastLeft + 1, last, summed);
+        SumRows(LastLeftRow(row) + 1, range.fLast, summed);
     std::transform(totals.begin(), totals.end(), summed.begin(), rest.begin(), std::minus<>());
-    return best.fRow;
 }
 
 /// Whether the row and the next one hold weight in one column only, the same for both.
@@ -224,11 +240,11 @@ void CutScan::MoveRows(int first, int last, CountVector& left, CountVector& righ
     right[0] = rightWeight;
 }
 
-/// Works out every candidate of the range.
-void CutScan::TryAllRows(Range range, CountVector& left, CountVector& right, Best& best) const
+/// Works out every candidate from `firstRow` to `lastRow`.
+void CutScan::TryRows(int firstRow, int lastRow, Range range, CountVector& left, CountVector& right, Best& best) const
 {
     int nextRow = range.fFirst;
-    for (int row = range.fFirst; row <= range.fLast; ++row)
+    for (int row = firstRow; row <= lastRow; ++row)
     {
         if (!IsCandidate(row, range))
             continue;
@@ -350,10 +366,10 @@ std::size_t CutScan::FindBounds()
 }
 
 /// Whether no candidate of a segment can be the best, as each one's partition entropy is a NaN: with fractions the
-/// subtractions can leave less than nothing of a category on the right. It stays so, since rows hold nothing below 0 and
-/// rounding keeps order; for the same reason the weight of the right side is above 0 at every row if it is at the next
-/// boundary. So the category's share is below 0 throughout, and not too small for a double: a residual is no finer than
-/// the last bit of the smallest cell, and the weight less than 2^32 such cells.
+/// subtractions can leave less than nothing of a category on the right. It stays so, since rows hold nothing below 0
+/// and rounding keeps order; for the same reason the weight of the right side is above 0 at every row if it is at the
+/// next boundary. So the category's share is below 0 throughout, and not too small for a double: a residual is no finer
+/// than the last bit of the smallest cell, and the weight less than 2^32 such cells.
 bool CutScan::IsAllNaN(const Side& right, const Side& nextRight)
 {
     return nextRight.fCounts[0] > 0.0 &&

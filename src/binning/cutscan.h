@@ -10,8 +10,9 @@
 /// code.
 ///
 /// What it finds is what a walk over all rows would find that works out the partition entropy of every candidate. It
-/// only leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp. Only among weights so near
-/// the smallest double that products lose their last bits it may find another one: such a range is too light to be cut.
+/// only leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp. Only among weights so
+/// near the smallest double that products lose their last bits it may find another one: such a range is too light to be
+/// cut.
 class CutScan
 {
 public:
@@ -28,6 +29,12 @@ public:
     /// in one and the same category. `left` arrives all zero and `right` with SumRows of the range; both leave with the
     /// two sides of the row. The range holds two rows at least.
     int FindBestCut(int first, int last, CountVector& left, CountVector& right);
+
+    /// The same among the cuts that leave rows on both sides. Every one of them is worked out.
+    int FindBestInnerCut(int first, int last, CountVector& left, CountVector& right) const;
+
+    /// Whether a cut at `row` leaves rows of the range on both sides.
+    bool IsInnerCut(int row, int first, int last) const { return LastLeftRow(row) >= first && LastLeftRow(row) < last; }
 
     /// The last row on the left of a cut at `row`: with the right border closed the row's own border is the cut, and
     /// the row lies on the left.
@@ -77,7 +84,8 @@ private:
     void AddRows(int first, int last, double* categories) const;
     void MoveRows(int first, int last, CountVector& left, CountVector& right) const;
     static void TryRow(int row, const CountVector& left, const CountVector& right, Best& best);
-    void TryAllRows(Range range, CountVector& left, CountVector& right, Best& best) const;
+    void TryRows(int firstRow, int lastRow, Range range, CountVector& left, CountVector& right, Best& best) const;
+    void SumSides(int row, Range range, const CountVector& totals, CountVector& left, CountVector& right) const;
 
     void CountBlocks();
     void CountRowsBefore(int row, double* categories) const;

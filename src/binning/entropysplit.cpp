@@ -30,10 +30,16 @@ int FindAcceptedCut(CutScan& scan, int first, int last, CountVector& left, Count
     const double entropy = Entropy(right);
     const double weight = right[0];
 
-    const int cut = scan.FindBestCut(first, last, left, right);
-    // A cut with all rows on one side would bring the same range back for ever. It gains nothing, but where the weight
-    // is below 2 even that can be above the threshold.
-    if (cut == CutScan::kNoRow || scan.LastLeftRow(cut) < first || scan.LastLeftRow(cut) == last)
+    int cut = scan.FindBestCut(first, last, left, right);
+    // A cut with all rows on one side gains nothing and is never taken: it would bring the same range back for ever.
+    // Where the weight is below 2 no gain can be above the threshold, and then a cut that is only as good may pass.
+    if (cut != CutScan::kNoRow && !scan.IsInnerCut(cut, first, last) && weight < 2.0)
+    {
+        std::fill(left.begin(), left.end(), 0.0);
+        scan.SumRows(first, last, right);
+        cut = scan.FindBestInnerCut(first, last, left, right);
+    }
+    if (cut == CutScan::kNoRow || !scan.IsInnerCut(cut, first, last))
         return CutScan::kNoRow;
     const double gain = entropy - PartitionEntropy(left, right);
     const double threshold = Log2(weight - 1.0) / weight + MDLDelta(left, right, entropy) / weight;

@@ -100,8 +100,10 @@ private:
         return both == 1 && one == 0;
     }
 
+    bool IsInner(int row, int first, int last) const { return LastLeft(row) >= first && LastLeft(row) < last; }
+
     /// The candidate with the lowest partition entropy, none if there is no candidate.
-    std::optional<int> BestRow(int first, int last, const Counts& totals) const
+    std::optional<int> BestRow(int first, int last, const Counts& totals, bool onlyInner) const
     {
         Counts l(totals.size(), 0.0);
         Counts r = totals;
@@ -111,6 +113,8 @@ private:
         for (int i = first; i <= last; ++i)
         {
             if (!((i < last && !SamePure(i)) || (i > first && !SamePure(i - 1))))
+                continue;
+            if (onlyInner && !IsInner(i, first, last))
                 continue;
             for (std::size_t c = 1; c < l.size(); ++c)
             {
@@ -151,8 +155,10 @@ private:
         if (last <= first)
             return;
         const Counts totals = Total(first, last);
-        const std::optional<int> best = BestRow(first, last, totals);
-        if (!best || LastLeft(*best) < first || LastLeft(*best) == last)
+        std::optional<int> best = BestRow(first, last, totals, false);
+        if (best && !IsInner(*best, first, last) && totals[0] < 2.0)
+            best = BestRow(first, last, totals, true);
+        if (!best || !IsInner(*best, first, last))
             return;
         const Sides sides = SidesOf(*best, first, last, totals);
         const double entropy = Entropy(totals);

@@ -128,12 +128,16 @@ TEST(EntropySplit, WeightOfExactlyOneAlwaysPasses)
     EXPECT_EQ(std::set<double>{2.0}, CutPoints({{0.5, 0}, {0, 0.5}}, false));
 }
 
-TEST(EntropySplit, LightRangeWithoutTwoSidesEnds)
+TEST(EntropySplit, LightRangeIsCutBetweenRowsThoughACutBesideAllRowsIsAsGood)
 {
-    // An empty pre-bin beside a weight of 1: only the cut in front of all rows is best, and it would bring the range
-    // back.
-    EXPECT_TRUE(CutPoints({{0, 0}, {1, 0}}, false).empty());
-    EXPECT_EQ(std::set<double>{1.0}, CutPoints({{0, 0}, {1, 0}}, true));
+    // With the border open the cut in front of all rows comes first, gains as much, and would bring the range back.
+    for (const Rows& rows : {Rows{{0, 0}, {1, 0}}, Rows{{0.25, 0.25}, {0.25, 0.25}}})
+    {
+        EXPECT_EQ(std::set<double>{1.0}, CutPoints(rows, true));
+        EXPECT_EQ(std::set<double>{2.0}, CutPoints(rows, false));
+    }
+    // A gain of 0 pays for the cut beside all rows, with one entropy to tell, but not for one with two.
+    EXPECT_TRUE(CutPoints({{0.275, 0.275}, {0.275, 0.275}}, false).empty());
 }
 
 TEST(EntropySplit, LowestOfEqualRowsIsCut)
