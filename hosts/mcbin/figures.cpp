@@ -30,6 +30,22 @@ std::vector<double> GetCategoryWeights(const Result& result)
     return sums;
 }
 
+bool HasTwoCategories(const Findings& findings, const Result& result)
+{
+    const Variable* const target = findings.FindTarget(result);
+    return target && target->categories.size() == 2;
+}
+
+std::vector<std::size_t> GetHeaviest(const std::vector<double>& weights, std::size_t number)
+{
+    std::vector<std::size_t> codes(weights.size());
+    std::iota(codes.begin(), codes.end(), std::size_t(0));
+    std::stable_sort(codes.begin(), codes.end(), [&](std::size_t a, std::size_t b) { return weights[a] > weights[b]; });
+    codes.resize(std::min(codes.size(), number));
+    std::sort(codes.begin(), codes.end());
+    return codes;
+}
+
 double GetGain(const Result& result)
 {
     return result.targetEntropy && result.modelEntropy ? *result.targetEntropy - *result.modelEntropy : 0.0;
@@ -88,17 +104,22 @@ std::string FormatInterval(const Findings& findings, const Bin& bin)
            (isLast ? "+inf)" : FormatNumber(bin.right) + (isRightClosed ? "]" : ")"));
 }
 
+std::vector<std::string> GetBinCategories(const Findings& findings, const Result& result, const Bin& bin)
+{
+    const std::vector<std::string>& all = findings.GetAttribute(result).categories;
+    const auto place = static_cast<std::size_t>(&bin - result.bins.data());
+    std::vector<std::string> categories;
+    for (std::size_t code = 0; code < all.size(); ++code)
+        if (FindBin(result.cutPoints, findings.settings.isRightClosed, static_cast<double>(code)) == place)
+            categories.push_back(all[code]);
+    return categories;
+}
+
 std::string FormatBin(const Findings& findings, const Result& result, const Bin& bin)
 {
-    const Variable& attribute = findings.GetAttribute(result);
-    if (!attribute.IsCategorical())
+    if (!findings.GetAttribute(result).IsCategorical())
         return FormatInterval(findings, bin);
-    std::vector<std::string> categories;
-    const auto place = static_cast<std::size_t>(&bin - result.bins.data());
-    for (std::size_t code = 0; code < attribute.categories.size(); ++code)
-        if (FindBin(result.cutPoints, findings.settings.isRightClosed, static_cast<double>(code)) == place)
-            categories.push_back(attribute.categories[code]);
-    return "{" + Join(categories, ", ") + "}";
+    return "{" + Join(GetBinCategories(findings, result, bin), ", ") + "}";
 }
 
 std::string GetBinColumn(const Findings& findings, const Result& result)

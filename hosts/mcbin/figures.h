@@ -17,6 +17,12 @@ double GetEntropy(const std::vector<double>& weights);
 /// The weight of each category of the target over all bins.
 std::vector<double> GetCategoryWeights(const Result& result);
 
+/// Whether the result has a target of two categories, the second of which is the event of the rates.
+bool HasTwoCategories(const Findings& findings, const Result& result);
+
+/// Of categories with these weights: the codes of the heaviest `number`, in ascending order.
+std::vector<std::size_t> GetHeaviest(const std::vector<double>& weights, std::size_t number);
+
 /// By how many bits the bins lower the entropy of the target; 0 where that wasn't worked out.
 double GetGain(const Result& result);
 
@@ -39,6 +45,10 @@ std::vector<const Result*> GetUncut(const Findings& findings);
 
 /// "(1.5, 4]", with the bracket at the end that is closed; "(-inf, 1.5]" and "(4, +inf)" at the outside.
 std::string FormatInterval(const Findings& findings, const Bin& bin);
+
+/// The categories of a categorical attribute that are in the bin, which must be one of the result's; of another attribute
+/// none.
+std::vector<std::string> GetBinCategories(const Findings& findings, const Result& result, const Bin& bin);
 
 /// The interval, or for a categorical attribute its categories in the bin, as in "{a, b}".
 std::string FormatBin(const Findings& findings, const Result& result, const Bin& bin);

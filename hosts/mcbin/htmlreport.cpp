@@ -23,12 +23,6 @@ bool HasTarget(const Findings& findings)
     return findings.settings.method == Method::kSupervised;
 }
 
-bool HasTwoCategories(const Findings& findings, const Result& result)
-{
-    const Variable* const target = findings.FindTarget(result);
-    return target && target->categories.size() == 2;
-}
-
 std::string GetHeading(const Findings& findings, const Result& result)
 {
     const Variable* const target = findings.FindTarget(result);
@@ -36,14 +30,9 @@ std::string GetHeading(const Findings& findings, const Result& result)
     return target ? name + " <small>by " + EscapeHtml(target->name) + "</small>" : name;
 }
 
-std::string FormatFigure(const std::optional<double>& figure)
-{
-    return figure ? FormatNumber(*figure) : "none";
-}
-
 std::string FormatMissing(const Result& result)
 {
-    return fmt::format("{:.12g}", result.weightWithMissing - result.weight);
+    return FormatDifference(result.weightWithMissing - result.weight);
 }
 
 /// Of a file: its name without the directories.

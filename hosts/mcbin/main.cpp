@@ -16,6 +16,7 @@
 #include "terminal.h"
 
 #include <algorithm>
+#include <clocale>
 #include <exception>
 #include <iostream>
 #include <new>
@@ -121,6 +122,8 @@ int Run(int argc, char** argv)
 
 int main(int argc, char** argv)
 {
+    // Text is UTF-8 whatever the user's locale is: for the width of characters, and for ? in a pattern.
+    std::setlocale(LC_CTYPE, "C.UTF-8");
     CatchSignals();
     try
     {

@@ -1,5 +1,7 @@
 #include "numbers.h"
 
+#include <fmt/format.h>
+
 #include <array>
 #include <charconv>
 #include <cmath>
@@ -63,4 +65,14 @@ std::string FormatNumber(double value)
         isPlain ? std::to_chars(text.data(), text.data() + text.size(), value, std::chars_format::fixed)
                 : std::to_chars(text.data(), text.data() + text.size(), value);
     return std::string(text.data(), result.ptr);
+}
+
+std::string FormatFigure(const std::optional<double>& figure)
+{
+    return figure ? FormatNumber(*figure) : "none";
+}
+
+std::string FormatDifference(double value)
+{
+    return fmt::format("{:.12g}", value);
 }

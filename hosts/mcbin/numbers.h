@@ -15,4 +15,10 @@ bool IsNumber(std::string_view text);
 /// The number in as few digits as read back to the same double. Infinities are "inf" and "-inf".
 std::string FormatNumber(double value);
 
+/// The same of a figure that may be lacking: "none" then.
+std::string FormatFigure(const std::optional<double>& figure);
+
+/// A difference of such numbers, in 12 digits: 1 - 0.1 - 0.2 must not end in a row of digits that no one has weighed.
+std::string FormatDifference(double value);
+
 #endif

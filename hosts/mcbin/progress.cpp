@@ -3,6 +3,7 @@
 #include "interrupt.h"
 #include "terminal.h"
 #include "text.h"
+#include "utf8.h"
 
 #include <mcobnqrt/progressreport.h>
 
@@ -10,6 +11,9 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <string_view>
+
+#include <unistd.h>
 
 namespace
 {
@@ -73,8 +77,8 @@ void Progress::Show(const std::string& text)
 {
     if (!fIsShown)
         return;
-    const std::string line = text.substr(0, GetTerminalWidth(2).value_or(80) - 1);
-    std::fputs(("\r\x1b[K" + line).c_str(), stderr);
+    const std::string_view line = Clip(text, GetTerminalWidth(STDERR_FILENO).value_or(80) - 1);
+    std::fputs(("\r\x1b[K" + std::string(line)).c_str(), stderr);
     std::fflush(stderr);
     fIsOnScreen = true;
 }

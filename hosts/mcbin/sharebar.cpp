@@ -15,11 +15,11 @@ constexpr std::array<const char*, 4> kShades{"█", "▓", "▒", "░"};
 /// Blue, yellow, magenta and grey, which most colour-blind people can tell apart.
 constexpr std::array<const char*, 4> kColours{"\x1b[34m", "\x1b[33m", "\x1b[35m", "\x1b[90m"};
 
-double GetHeaviest(const Result& result)
+double GetLargestWeight(const Result& result)
 {
-    double heaviest = 0.0;
-    for (const Bin& bin : result.bins) heaviest = std::max(heaviest, bin.weight);
-    return heaviest;
+    double largest = 0.0;
+    for (const Bin& bin : result.bins) largest = std::max(largest, bin.weight);
+    return largest;
 }
 
 } // namespace
@@ -28,13 +28,8 @@ ShareBar::ShareBar(const Findings& findings, const Result& result, std::size_t w
     : fFindings(findings), fResult(result), fWidth(width), fHasColours(hasColours)
 {
     const std::vector<double> weights = GetCategoryWeights(result);
-    for (std::size_t i = 0; i < weights.size(); ++i) fCodes.push_back(i);
-    std::stable_sort(fCodes.begin(), fCodes.end(),
-                     [&](std::size_t a, std::size_t b) { return weights[a] > weights[b]; });
-    fHasOthers = fCodes.size() > kShades.size();
-    if (fHasOthers)
-        fCodes.resize(kShades.size() - 1);
-    std::sort(fCodes.begin(), fCodes.end());
+    fHasOthers = weights.size() > kShades.size();
+    fCodes = GetHeaviest(weights, fHasOthers ? kShades.size() - 1 : kShades.size());
 }
 
 std::string ShareBar::Draw(const Bin& bin) const
@@ -73,7 +68,7 @@ std::string ShareBar::GetLegend() const
 std::vector<double> ShareBar::GetParts(const Bin& bin) const
 {
     if (bin.weights.empty())
-        return {GetShare(bin.weight, GetHeaviest(fResult))};
+        return {GetShare(bin.weight, GetLargestWeight(fResult))};
     std::vector<double> parts;
     double others = bin.weight;
     for (const std::size_t code : fCodes)

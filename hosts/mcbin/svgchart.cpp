@@ -51,12 +51,7 @@ Layout MakeLayout(const Result& result)
 std::vector<std::size_t> ChooseColours(const Result& result)
 {
     const std::vector<double> weights = GetCategoryWeights(result);
-    std::vector<std::size_t> codes(weights.size());
-    for (std::size_t i = 0; i < codes.size(); ++i) codes[i] = i;
-    std::stable_sort(codes.begin(), codes.end(), [&](std::size_t a, std::size_t b) { return weights[a] > weights[b]; });
-    codes.resize(std::min(codes.size(), kNumColours));
-    std::sort(codes.begin(), codes.end());
-
+    const std::vector<std::size_t> codes = GetHeaviest(weights, kNumColours);
     std::vector<std::size_t> colours(weights.size(), kOthersColour);
     for (std::size_t i = 0; i < codes.size(); ++i) colours[codes[i]] = i;
     return colours;

@@ -1,5 +1,9 @@
 #include "text.h"
 
+#include "utf8.h"
+
+#include <fmt/format.h>
+
 #include <algorithm>
 
 #include <fnmatch.h>
@@ -7,9 +11,10 @@
 namespace
 {
 
-bool IsFirstByte(char c)
+/// Those of ASCII, and those of Latin-1, which some terminals obey as well.
+bool IsControl(char32_t value)
 {
-    return (static_cast<unsigned char>(c) & 0xC0) != 0x80;
+    return value < 0x20 || (value >= 0x7F && value < 0xA0);
 }
 
 std::string MakePadding(const std::string& text, std::size_t width)
@@ -21,15 +26,16 @@ std::string MakePadding(const std::string& text, std::size_t width)
 
 std::string Printable(std::string_view text)
 {
-    constexpr char kDigits[] = "0123456789abcdef";
     std::string printable;
-    for (const char c : text)
+    while (!text.empty())
     {
-        const auto byte = static_cast<unsigned char>(c);
-        if (byte >= 0x20 && byte != 0x7F)
-            printable += c;
+        const CodePoint point = GetFirst(text);
+        const std::string_view bytes = text.substr(0, point.size);
+        text.remove_prefix(point.size);
+        if (point.isValid && !IsControl(point.value))
+            printable += bytes;
         else
-            printable += {'\\', 'x', kDigits[byte / 16], kDigits[byte % 16]};
+            for (const char c : bytes) printable += fmt::format("\\x{:02x}", static_cast<unsigned char>(c));
     }
     return printable;
 }
@@ -64,17 +70,9 @@ std::string EscapeHtml(std::string_view text)
 
 std::string Shorten(std::string_view text)
 {
-    constexpr std::size_t kLongest = 30;
-    if (text.size() <= kLongest)
-        return std::string(text);
-    std::size_t size = kLongest;
-    while (size > 0 && !IsFirstByte(text[size])) --size; // not inside a code point
-    return std::string(text.substr(0, size)) + "...";
-}
-
-std::size_t GetWidth(std::string_view text)
-{
-    return static_cast<std::size_t>(std::count_if(text.begin(), text.end(), IsFirstByte));
+    constexpr std::size_t kWidest = 30;
+    const std::string_view beginning = Clip(text, kWidest);
+    return std::string(beginning) + (beginning.size() < text.size() ? "..." : "");
 }
 
 std::string PadLeft(const std::string& text, std::size_t width)

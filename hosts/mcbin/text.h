@@ -6,7 +6,8 @@
 #include <string_view>
 #include <vector>
 
-/// Text of the data made fit for a terminal line: control characters, such as line ends, become escapes like "\x0a".
+/// Text of the data made fit for a terminal line: control characters, such as line ends, and bytes that are no UTF-8
+/// become escapes like "\x0a".
 std::string Printable(std::string_view text);
 
 /// The same in single quotes, for a message.
@@ -15,11 +16,8 @@ std::string Quote(std::string_view text);
 /// The same as text of a page, or of an attribute in double quotes.
 std::string EscapeHtml(std::string_view text);
 
-/// The beginning of a text of more than some 30 bytes, with "..." behind it.
+/// The beginning of a text that is more than 30 columns wide, with "..." behind it.
 std::string Shorten(std::string_view text);
-
-/// How many columns of a terminal the text takes. Each code point of UTF-8 counts as one.
-std::size_t GetWidth(std::string_view text);
 
 /// The text with spaces in front of it, or behind it, until it is `width` wide.
 std::string PadLeft(const std::string& text, std::size_t width);
