@@ -66,13 +66,23 @@ void ThrowIfTaken(const TableReader& table, const std::vector<BinColumn>& column
                                     " already; --in-place-columns makes no new ones");
 }
 
+/// A line of a single empty field would be a blank one, which no reader counts.
+void EndLine(std::string& line)
+{
+    if (line.empty())
+        line = "\"\"";
+    line += '\n';
+}
+
 std::string MakeHeader(const TableReader& table, const std::vector<BinColumn>& columns, bool isInPlace)
 {
     std::vector<std::string> names;
-    for (const std::string& name : table.GetColumnNames()) names.push_back(QuoteField(name, table.GetDelimiter()));
+    for (const std::string& name : table.GetHeader()) names.push_back(QuoteField(name, table.GetDelimiter()));
     if (!isInPlace)
         for (const BinColumn& column : columns) names.push_back(QuoteField(column.name, table.GetDelimiter()));
-    return Join(names, std::string(1, table.GetDelimiter())) + "\n";
+    std::string header = Join(names, std::string(1, table.GetDelimiter()));
+    EndLine(header);
+    return header;
 }
 
 [[noreturn]] void ThrowBadField(const TableReader& table, const CsvRow& row, const BinColumn& column)
@@ -118,10 +128,8 @@ public:
         }
         if (!fOptions.isInPlace)
             for (BinColumn& column : fColumns) Append(FindField(fTable, row, column, fOptions.isBadMissing));
-        // A line of a single empty field would be a blank one, which no reader counts.
-        fLine.back() = '\n';
-        if (fLine.size() == 1)
-            fLine = "\"\"\n";
+        fLine.pop_back(); // the delimiter behind the last field
+        EndLine(fLine);
         return fLine;
     }
 

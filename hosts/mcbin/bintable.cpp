@@ -81,7 +81,7 @@ std::string MakeLabel(const Findings& findings, const Result& result, const Bin&
     std::vector<std::string> categories = GetBinCategories(findings, result, bin);
     if (categories.empty() || GetWidth(label) <= width)
         return label;
-    for (std::string& category : categories) category = Printable(Shorten(category));
+    for (std::string& category : categories) category = Printable(Shorten(category, width / 2));
     const std::size_t number = categories.size();
     const auto format = [&]
     {

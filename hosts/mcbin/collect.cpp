@@ -4,7 +4,6 @@
 #include "figures.h"
 #include "findings.h"
 #include "numbers.h"
-#include "text.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 
@@ -113,13 +112,8 @@ void AddPlan(Findings& findings, const ColumnPlan& plan)
 {
     findings.records = plan.nRows;
     findings.missingText = plan.missingTexts;
-    for (const Column& column : plan.columns)
-    {
-        AddMissingTexts(findings, column);
-        if (column.nTexts > 0 && !column.IsUsed())
-            findings.leftOut.push_back(Printable(column.name) + " (" + Quote(Shorten(column.firstText)) + " in line " +
-                                       std::to_string(column.firstTextLine) + ")");
-    }
+    findings.leftOut = plan.DescribeLeftOut();
+    for (const Column& column : plan.columns) AddMissingTexts(findings, column);
 }
 
 void AddVariables(Findings& findings, const BINVarList& list, IBINVariable::BINWRoundingOption rounding)

@@ -5,6 +5,7 @@
 #include "options.h"
 #include "tablereader.h"
 #include "text.h"
+#include "utf8.h"
 
 #include <algorithm>
 #include <limits>
@@ -108,7 +109,9 @@ void SetPairs(ColumnPlan& plan, const TableReader& table, const ColumnOptions& o
                               Quote(pattern + ":" + plan.columns[target].name));
             column.isAttribute = true;
             column.isNamed = column.isNamed || isNamed;
-            plan.pairs.emplace_back(i, target);
+            const std::pair<std::size_t, std::size_t> found(i, target);
+            if (std::find(plan.pairs.begin(), plan.pairs.end(), found) == plan.pairs.end())
+                plan.pairs.push_back(found);
         }
 }
 
@@ -177,7 +180,35 @@ void DeclareMissing(ColumnPlan& plan, const TableReader& table, const std::strin
             DeclareMissing(plan.columns[column], value, declaration);
 }
 
+void ThrowUnlessText(const std::string& text, const std::string& what)
+{
+    if (!IsText(text))
+        throw Failure(what + " " + Quote(text) + " is not UTF-8 text");
+}
+
+/// What isn't UTF-8 couldn't be handed on: JSON and the page can't hold it.
+void ThrowUnlessText(const ColumnPlan& plan)
+{
+    for (const std::string& text : plan.missingTexts) ThrowUnlessText(text, "the text for missing values");
+    for (const Column& column : plan.columns)
+    {
+        if (column.IsUsed())
+            ThrowUnlessText(column.name, "the name of column");
+        for (const std::string& text : column.missingTexts) ThrowUnlessText(text, "the text for missing values");
+    }
+}
+
 } // namespace
+
+std::vector<std::string> ColumnPlan::DescribeLeftOut() const
+{
+    std::vector<std::string> described;
+    for (const Column& column : columns)
+        if (column.nTexts > 0 && !column.IsUsed())
+            described.push_back(Printable(column.name) + " (" + Quote(Shorten(column.firstText)) + " in line " +
+                                std::to_string(column.firstTextLine) + ")");
+    return described;
+}
 
 bool ColumnPlan::IsIn(const std::vector<std::string>& texts, std::string_view field)
 {
@@ -201,5 +232,6 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     else
         SetPairs(plan, table, options);
     for (const std::string& declaration : options.missing) DeclareMissing(plan, table, declaration);
+    ThrowUnlessText(plan);
     return plan;
 }

@@ -60,11 +60,15 @@ struct ColumnPlan
                (!column.missingTexts.empty() && IsIn(column.missingTexts, field));
     }
 
+    /// Columns of text that could have been attributes, each with an example of what it holds.
+    std::vector<std::string> DescribeLeftOut() const;
+
     static bool IsIn(const std::vector<std::string>& texts, std::string_view field);
 };
 
 /// Gives the columns of the table their parts.
-/// \throw Failure if a name or pattern fits no column, or parts contradict each other.
+/// \throw Failure if a name or pattern fits no column, parts contradict each other, or the name of a column that has a
+///        part, or a text for missing values, is not UTF-8.
 ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options);
 
 #endif

@@ -1,5 +1,6 @@
 #include "csvreader.h"
 
+#include "delimiter.h"
 #include "failure.h"
 
 #include <algorithm>
@@ -59,9 +60,12 @@ void CsvReader::ParserDeleter::operator()(csv_parser* parser) const
 }
 
 CsvReader::CsvReader(InputFile file, char delimiter)
-    : fFile(std::move(file)), fDelimiter(delimiter), fParser(MakeParser(delimiter)), fBuffer(kBufferSize), fRows(1)
+    : fFile(std::move(file)), fDelimiter(delimiter), fBuffer(kBufferSize), fRows(1)
 {
-    Rewind();
+    ReadBeginning();
+    if (fDelimiter == '\0')
+        fDelimiter = DetectDelimiter(MakeView(fBegin, fEnd));
+    fParser.reset(MakeParser(fDelimiter));
 }
 
 const CsvRow* CsvReader::NextRow()
@@ -88,13 +92,21 @@ const CsvRow* CsvReader::NextRow()
 void CsvReader::Rewind()
 {
     fFile.Rewind();
+    ReadBeginning();
+}
+
+void CsvReader::ReadBeginning()
+{
     fBegin = fEnd = fSpecial = fBuffer.data();
     fFileRead = false;
     fLine = 1;
     fLastTerminator = 0;
     Refill();
-    if (MakeView(fBegin, fEnd).substr(0, kUtf8Mark.size()) == kUtf8Mark)
+    const std::string_view beginning = MakeView(fBegin, fEnd);
+    if (beginning.substr(0, kUtf8Mark.size()) == kUtf8Mark)
         fBegin += kUtf8Mark.size();
+    if (beginning.substr(0, 2) == "\xFF\xFE" || beginning.substr(0, 2) == "\xFE\xFF")
+        throw Failure(GetName() + ": the file is UTF-16; make it UTF-8 first, as by iconv -f UTF-16 -t UTF-8");
     fSpecial = fBegin;
 }
 

@@ -42,13 +42,14 @@ private:
 class CsvReader
 {
 public:
+    /// A `delimiter` of '\0' stands for the one that the beginning of the file shows.
     CsvReader(InputFile file, char delimiter);
 
     /// The next row, which stays the reader's and is good until the next call, or null at the end.
     /// \throw Failure for a bad row, once all rows before it have been handed out, or if the file can't be read.
     const CsvRow* NextRow();
 
-    /// Goes back to the first row. Only to be called when NextRow() has given null.
+    /// Goes back to the first row of a file that can be rewound. Only to be called when NextRow() has given null.
     void Rewind();
 
     const std::string& GetName() const { return fFile.GetName(); }
@@ -63,6 +64,7 @@ private:
     static void OnField(void* text, std::size_t size, void* reader);
     static void OnRowEnd(int terminator, void* reader);
 
+    void ReadBeginning();
     bool FindLine();
     bool Refill();
     const char* FindSpecial(const char* end);

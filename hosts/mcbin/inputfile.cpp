@@ -10,6 +10,7 @@
 #include <utility>
 
 #include <stdlib.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace
@@ -20,17 +21,10 @@ Failure MakeFailure(const std::string& name)
     return Failure(name + ": " + std::strerror(errno));
 }
 
+/// Standard input by a descriptor of its own, as the owner closes what it gets. Null if the system refuses.
 std::FILE* Open(const std::string& path)
 {
-    // Asked first, as to open a pipe would wait for its other end.
-    std::error_code error;
-    const std::filesystem::file_status status = std::filesystem::status(path, error);
-    if (std::filesystem::exists(status) && !std::filesystem::is_regular_file(status))
-        throw Failure(path + ": not a regular file; it has to be one, as it is read twice. Use - for standard input");
-    std::FILE* const file = std::fopen(path.c_str(), "rb");
-    if (!file)
-        throw MakeFailure(path);
-    return file;
+    return path == "-" ? fdopen(dup(STDIN_FILENO), "rb") : std::fopen(path.c_str(), "rb");
 }
 
 std::FILE* OpenNameless(const std::string& directory)
@@ -52,37 +46,52 @@ std::FILE* OpenNameless(const std::string& directory)
 
 } // namespace
 
-InputFile::InputFile(const std::string& path) : InputFile(path, Open(path)) {}
-
-InputFile::InputFile(std::string name, std::FILE* file) : fName(std::move(name)), fFile(file) {}
-
-InputFile InputFile::SpoolStandardInput(const std::string& directory)
+InputFile::InputFile(const std::string& path) : fName(path == "-" ? "standard input" : path), fFile(Open(path))
 {
-    InputFile spool("standard input", OpenNameless(directory));
+    ThrowIfInterrupted(); // while it waited for the other end of a named pipe
+    if (!fFile)
+        throw MakeFailure(fName);
+}
+
+void InputFile::MakeRewindable(const std::string& directory)
+{
+    struct stat status = {};
+    const bool isRegular = fstat(fileno(fFile.get()), &status) == 0 && S_ISREG(status.st_mode);
+    if (isRegular && lseek(fileno(fFile.get()), 0, SEEK_CUR) == 0)
+        return;
+    std::unique_ptr<std::FILE, Closer> spool(OpenNameless(directory));
+    CopyTo(spool.get());
+    fFile = std::move(spool);
+    Rewind();
+}
+
+void InputFile::CopyTo(std::FILE* spool)
+{
     std::array<char, 1 << 16> block;
     for (;;)
     {
         ThrowIfInterrupted();
-        const ssize_t size = read(STDIN_FILENO, block.data(), block.size());
-        if (size < 0 && errno == EINTR)
-            continue;
-        if (size < 0)
-            throw MakeFailure(spool.fName);
-        const auto wanted = static_cast<std::size_t>(size);
-        if (std::fwrite(block.data(), 1, wanted, spool.fFile.get()) != wanted ||
-            (size == 0 && std::fflush(spool.fFile.get()) != 0))
-            throw MakeFailure("cannot write the temporary copy of standard input");
-        if (size == 0)
-            return spool;
+        const std::size_t size = Read(block.data(), block.size());
+        if (std::fwrite(block.data(), 1, size, spool) != size || (size < block.size() && std::fflush(spool) != 0))
+            throw MakeFailure("cannot write the temporary copy of " + fName);
+        if (size < block.size())
+            return;
     }
 }
 
 std::size_t InputFile::Read(char* buffer, std::size_t size)
 {
-    const std::size_t read = std::fread(buffer, 1, size, fFile.get());
-    if (std::ferror(fFile.get()))
-        throw MakeFailure(fName);
-    return read;
+    std::size_t read = 0;
+    for (;;)
+    {
+        read += std::fread(buffer + read, 1, size - read, fFile.get());
+        if (!std::ferror(fFile.get()))
+            return read;
+        if (errno != EINTR)
+            throw MakeFailure(fName);
+        ThrowIfInterrupted();
+        std::clearerr(fFile.get());
+    }
 }
 
 void InputFile::Rewind()

@@ -6,20 +6,23 @@
 #include <memory>
 #include <string>
 
-/// A file that can be read more than once. All operations throw a Failure that names it where the system refuses.
+/// A file that is read from its beginning to its end. All operations throw a Failure that names it where the system
+/// refuses, and Interrupted where a signal ends the wait for it.
 class InputFile
 {
 public:
-    /// Opens the file, which must be a regular one.
+    /// Opens the file. "-" stands for standard input.
     explicit InputFile(const std::string& path);
 
-    /// Copies standard input to a file in `directory` that no other process can open and that has no name, so that it
-    /// can't stay behind. An empty `directory` stands for the system's.
-    static InputFile SpoolStandardInput(const std::string& directory);
+    /// Makes sure that it can be rewound: what is no regular file, such as a pipe, is copied to a file in `directory`
+    /// that no other process can open and that has no name, so that it can't stay behind. An empty `directory` stands
+    /// for the system's. Only to be called before anything is read.
+    void MakeRewindable(const std::string& directory);
 
     /// Fills `buffer` unless the file ends before, and gives the number of bytes.
     std::size_t Read(char* buffer, std::size_t size);
 
+    /// Only to be called after MakeRewindable().
     void Rewind();
 
     const std::string& GetName() const { return fName; }
@@ -30,7 +33,7 @@ private:
         void operator()(std::FILE* file) const { std::fclose(file); }
     };
 
-    InputFile(std::string name, std::FILE* file);
+    void CopyTo(std::FILE* spool);
 
     std::string fName;
     std::unique_ptr<std::FILE, Closer> fFile;

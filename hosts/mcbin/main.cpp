@@ -75,6 +75,7 @@ int Bin(const BinOptions& options)
 {
     Progress progress(IsTerminal(STDERR_FILENO) && !options.output.isQuiet);
     TableOptions tableOptions = options.table;
+    tableOptions.isReadTwice = true;
     tableOptions.spoolDirectory = options.settings.tempDirectory;
     TableReader table(tableOptions);
     const Findings findings = FindBins(table, options, progress);

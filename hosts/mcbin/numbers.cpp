@@ -6,6 +6,7 @@
 #include <charconv>
 #include <cmath>
 #include <cstdint>
+#include <cstdlib>
 #include <cstring>
 
 namespace
@@ -31,15 +32,20 @@ const char* SkipDigits(const char* at, const char* end)
 
 std::optional<double> ParseNumber(std::string_view text)
 {
+    // Within quotes the reader leaves them.
+    while (!text.empty() && text.front() == ' ') text.remove_prefix(1);
+    while (!text.empty() && text.back() == ' ') text.remove_suffix(1);
     // The sign that from_chars doesn't take. Behind it must not stand another one.
     if (text.size() > 1 && text[0] == '+' && text[1] != '-')
         text.remove_prefix(1);
     double value = 0.0;
     const char* const end = text.data() + text.size();
     const std::from_chars_result result = std::from_chars(text.data(), end, value);
-    if (result.ec != std::errc() || result.ptr != end || !std::isfinite(value))
-        return std::nullopt;
-    return value;
+    // Too large a number and too small a one are the same to from_chars.
+    if (result.ec == std::errc::result_out_of_range)
+        value = std::strtod(std::string(text).c_str(), nullptr);
+    const bool isNumber = result.ec != std::errc::invalid_argument && result.ptr == end && std::isfinite(value);
+    return isNumber ? std::optional(value) : std::nullopt;
 }
 
 bool IsNumber(std::string_view text)

@@ -5,6 +5,7 @@
 #include "progress.h"
 #include "tablereader.h"
 #include "text.h"
+#include "utf8.h"
 
 #include <string_view>
 
@@ -32,6 +33,9 @@ void ProfileCategory(const TableReader& table, Column& column, std::size_t place
 {
     if (column.categories.find(field) != column.categories.end())
         return;
+    if (!IsText(field))
+        throw table.MakeFailure(
+            line, place, Quote(Shorten(field)) + " is not UTF-8 text; convert the file first, for instance with iconv");
     column.categories.emplace(field);
     if (column.categories.size() > kMostCategories)
         throw table.MakeFailure(line, place,

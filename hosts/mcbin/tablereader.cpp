@@ -1,6 +1,6 @@
 #include "tablereader.h"
 
-#include "delimiter.h"
+#include "numbers.h"
 #include "text.h"
 
 #include <algorithm>
@@ -9,26 +9,20 @@
 namespace
 {
 
-std::vector<std::string> NameColumns(const CsvRow& header)
+std::vector<std::string> NameColumns(std::vector<std::string> names)
 {
-    std::vector<std::string> names;
-    for (std::size_t i = 0; i < header.Size(); ++i)
-        names.push_back(header[i].empty() ? "column " + std::to_string(i + 1) : std::string(header[i]));
+    for (std::size_t i = 0; i < names.size(); ++i)
+        if (names[i].empty())
+            names[i] = "column " + std::to_string(i + 1);
     return names;
 }
 
 CsvReader Open(const TableOptions& options)
 {
-    InputFile file =
-        options.file == "-" ? InputFile::SpoolStandardInput(options.spoolDirectory) : InputFile(options.file);
-    char delimiter = options.delimiter;
-    if (delimiter == '\0')
-    {
-        std::string beginning(1 << 16, '\0');
-        beginning.resize(file.Read(beginning.data(), beginning.size()));
-        delimiter = DetectDelimiter(beginning);
-    }
-    return CsvReader(std::move(file), delimiter);
+    InputFile file(options.file);
+    if (options.isReadTwice)
+        file.MakeRewindable(options.spoolDirectory);
+    return CsvReader(std::move(file), options.delimiter);
 }
 
 } // namespace
@@ -38,7 +32,8 @@ TableReader::TableReader(const TableOptions& options) : fReader(Open(options))
     const CsvRow* const header = fReader.NextRow();
     if (!header)
         throw MakeFailure("the file is empty; its first line should name the columns");
-    fColumnNames = NameColumns(*header);
+    for (std::size_t i = 0; i < header->Size(); ++i) fHeader.emplace_back((*header)[i]);
+    fColumnNames = NameColumns(fHeader);
     for (auto name = fColumnNames.begin(); name != fColumnNames.end(); ++name)
         if (std::find(fColumnNames.begin(), name, *name) != name)
             throw MakeFailure(header->GetLine(), "two columns are named " + Quote(*name));
@@ -86,7 +81,12 @@ Failure TableReader::MakeFailure(long line, std::size_t column, const std::strin
 
 Failure TableReader::MakeNotANumber(long line, std::size_t column, std::string_view field) const
 {
+    std::string withoutCommas(field);
+    withoutCommas.erase(std::remove(withoutCommas.begin(), withoutCommas.end(), ','), withoutCommas.end());
+    const bool hasCommas = withoutCommas.size() < field.size() && IsNumber(withoutCommas);
     return MakeFailure(line, column,
-                       Quote(Shorten(field)) + " is not a number; if it stands for a missing value, say so with " +
-                           "--missing-text, and with --bad missing for all such fields");
+                       Quote(Shorten(field)) +
+                           (hasCommas ? " is not a number: it has a comma, and numbers are written as in 1234.5"
+                                      : " is not a number; if it stands for a missing value, say so with "
+                                        "--missing-text, and with --bad missing for all such fields"));
 }

@@ -14,7 +14,8 @@ struct TableOptions
 {
     std::string file;           ///< "-" for standard input
     char delimiter = '\0';      ///< '\0' for finding it
-    std::string spoolDirectory; ///< for standard input; empty for the system's
+    bool isReadTwice = false;   ///< Rewind() will be called
+    std::string spoolDirectory; ///< for a copy of what can't be read twice by itself; empty for the system's
 };
 
 /// Reads a table: a delimited file whose first row names the columns, and whose every other row has a field for each of
@@ -26,6 +27,8 @@ public:
     explicit TableReader(const TableOptions& options);
 
     const std::vector<std::string>& GetColumnNames() const { return fColumnNames; }
+    /// The first row as it stands in the file, where a column may be without a name.
+    const std::vector<std::string>& GetHeader() const { return fHeader; }
     char GetDelimiter() const { return fReader.GetDelimiter(); }
     const std::string& GetName() const { return fReader.GetName(); }
 
@@ -36,7 +39,8 @@ public:
     /// reader's and is good until the next call. \throw Failure if the row is bad or can't be read.
     const CsvRow* NextRow();
 
-    /// Goes back to the first row below the header. Only to be called when NextRow() has given null.
+    /// Goes back to the first row below the header of a table that is read twice. Only to be called when NextRow() has
+    /// given null.
     void Rewind();
 
     /// What is wrong with the file, with the row, or with a field in it, with the place put in front.
@@ -49,6 +53,7 @@ public:
 
 private:
     CsvReader fReader;
+    std::vector<std::string> fHeader;
     std::vector<std::string> fColumnNames;
 };
 

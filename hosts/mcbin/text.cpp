@@ -68,10 +68,9 @@ std::string EscapeHtml(std::string_view text)
     return escaped;
 }
 
-std::string Shorten(std::string_view text)
+std::string Shorten(std::string_view text, std::size_t width)
 {
-    constexpr std::size_t kWidest = 30;
-    const std::string_view beginning = Clip(text, kWidest);
+    const std::string_view beginning = Clip(text, width);
     return std::string(beginning) + (beginning.size() < text.size() ? "..." : "");
 }
 

@@ -16,8 +16,8 @@ std::string Quote(std::string_view text);
 /// The same as text of a page, or of an attribute in double quotes.
 std::string EscapeHtml(std::string_view text);
 
-/// The beginning of a text that is more than 30 columns wide, with "..." behind it.
-std::string Shorten(std::string_view text);
+/// The beginning of a text that is wider than `width` columns, with "..." behind it.
+std::string Shorten(std::string_view text, std::size_t width = 30);
 
 /// The text with spaces in front of it, or behind it, until it is `width` wide.
 std::string PadLeft(const std::string& text, std::size_t width);

@@ -76,7 +76,11 @@ Variables MakeVariables(const ColumnPlan& plan, IBINVariable::BINWRoundingOption
         variables.columns.push_back(i);
     }
     if (!hasAttribute)
-        throw Failure("there is nothing to bin: no column that could be an attribute has numbers");
+    {
+        const std::vector<std::string> leftOut = plan.DescribeLeftOut();
+        throw Failure("there is nothing to bin: no column that could be an attribute has numbers" +
+                      (leftOut.empty() ? "" : "; they hold text: " + Join(leftOut, ", ")));
+    }
     AddPairs(variables, plan, variableOfColumn);
     return variables;
 }

@@ -70,10 +70,16 @@ TEST_F(McbinInput, LineEndsDelimitersAndAUtf8MarkMakeNoDifference)
     }
 }
 
-TEST_F(McbinInput, StandardInputIsReadTwice)
+TEST_F(McbinInput, WhatCannotBeRewoundIsReadTwiceAllTheSame)
 {
     Write("data.csv", kHeights);
-    EXPECT_EQ(kHeightsBySize, Shell("cat data.csv | mcbin supervised - --target size").out);
+    for (const char* command :
+         {"cat data.csv | mcbin supervised - --target size", "mcbin supervised - --target size <data.csv",
+          "mkfifo pipe; cat data.csv >pipe & mcbin supervised pipe --target size"})
+        EXPECT_EQ(kHeightsBySize, Shell(command).out) << command;
+    // Standard input that stands behind its first line begins there.
+    EXPECT_NE(std::string::npos, Shell("{ read -r line; mcbin supervised - --target size; } <data.csv")
+                                     .err.find("standard input: no column is named 'size'; there are '1.5', "));
 }
 
 TEST_F(McbinInput, OrderOfRowsMakesNoDifference)
@@ -123,6 +129,13 @@ TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
         {"x,y\n1,a,b\n2,5\" disk\n", ", line 2: wrong number of fields: 3, but the header has 2"},
         {"x,y\n1,a\n2,5\" disk\n", ", line 3: a quote in the wrong place: a field that holds one must be quoted, and "
                                    "the quote in it doubled"},
+        {"x,y\n1,a\n2,m\xFCnster\n",
+         ", line 3: column 'y': 'm\\xfcnster' is not UTF-8 text; convert the file first, for "
+         "instance with iconv"},
+        {"\xFF\xFEx", ": the file is UTF-16; make it UTF-8 first, as by iconv -f UTF-16 -t UTF-8"},
+        {"x;y\n1;a\n2,5;b\n3;b\n",
+         ", line 3: column 'x': '2,5' is not a number: it has a comma, and numbers are written "
+         "as in 1234.5"},
         {"x,y\n1,a\n2,b\nmany,a\n", ", line 4: column 'x': 'many' is not a number; if it stands for a missing value, "
                                     "say so with --missing-text, and with --bad missing for all such fields"},
     };
@@ -135,6 +148,58 @@ TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
     }
     EXPECT_EQ("mcbin: none.csv: No such file or directory\n", Run("supervised none.csv --target y").err);
     EXPECT_EQ(1, Run("supervised . --target y").exitCode);
+}
+
+TEST_F(McbinInput, NumbersAreThoseOfADoubleWithADecimalPoint)
+{
+    for (const char* number :
+         {"+5", "-.5", "5.", "2.5e-3", "\" 7 \"", "1e-400", "12345678901234567890123456789012345678901"})
+    {
+        const std::string data = "x\n1\n2\n" + std::string(number) + "\n";
+        EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "--bins 2").out.find("  3 distinct values"))
+            << number;
+    }
+    for (const char* text : {"1e400", "inf", "nan", "0x10", "+-5", "1 2", "5x", "--5", ".", "-", "e5"})
+    {
+        const std::string data = "x\n1\n2\n" + std::string(text) + "\n";
+        EXPECT_EQ(
+            0u,
+            RunOn(data, "equal-frequency", "").err.find("mcbin: data.csv, line 4: column 'x': '" + std::string(text)))
+            << text;
+    }
+    EXPECT_EQ(
+        "mcbin: there is nothing to bin: no column that could be an attribute has numbers; they hold text: x ('1,5' in "
+        "line 2)\n",
+        RunOn("x;y\n1,5;a\n2,5;b\n", "supervised", "--target y").err);
+}
+
+TEST_F(McbinInput, WhatIsNotUtf8DoesNoHarmWhereItIsNotUsed)
+{
+    const std::string data = "x,y,\xE4,z\n1,a,\xFF,\xFC\n2,a,,\xFC\n3,b,,\xFC\n4,b,,\xFC\n";
+
+    EXPECT_EQ(0, RunOn(data, "supervised", "--target y --attributes x --format json").exitCode);
+    EXPECT_EQ("mcbin: the name of column '\\xe4' is not UTF-8 text\n", RunOn(data, "supervised", "--target y").err);
+    EXPECT_EQ("mcbin: the text for missing values '\\xff' is not UTF-8 text\n",
+              RunOn(data, "supervised", "--target y --attributes x --missing-text '\xFF'").err);
+}
+
+TEST_F(McbinInput, ManyDistinctValuesAreBinnedBeforeAndSmallBinsMergedAfterwards)
+{
+    std::string data = "x,y\n";
+    for (int i = 1; i <= 210; ++i) data += std::to_string(i) + (i <= 100 ? ",a\n" : i <= 110 ? ",b\n" : ",c\n");
+    const auto cutPoints = [&](const std::string& options)
+    {
+        RunOn(data, "supervised", "--target y --format csv " + options + " >bins.csv");
+        return Shell("sed '1d;$d;s/\"[^\"]*\"//' bins.csv | cut -d, -f6 | tr '\\n' ' '").out;
+    };
+
+    EXPECT_EQ("100 110 ", cutPoints(""));
+    EXPECT_EQ("100 110 ", cutPoints("--distinct-threshold 210 --bins 3"));
+    // Three bins of 70 have their borders between 70 and 71 and between 140 and 141.
+    EXPECT_EQ("70.5 140.5 ", cutPoints("--distinct-threshold 209 --bins 3"));
+    // The bin of b has a tenth of the weight of either neighbour.
+    EXPECT_EQ("100 110 ", cutPoints("--small-bins 0.09"));
+    EXPECT_EQ("110 ", cutPoints("--small-bins 0.11"));
 }
 
 TEST_F(McbinInput, ATargetHasFrom2To256Categories)
@@ -206,7 +271,7 @@ TEST_F(McbinInput, PairsBinForSeveralTargetsInOnePass)
     for (int i = 0; i < 40; ++i)
         data += std::to_string(i) + "," + std::to_string(-i) + (i < 20 ? ",no" : ",yes") + (i < 10 ? ",lo\n" : ",hi\n");
 
-    const Outcome outcome = RunOn(data, "supervised", "--pairs '*:p' --pairs b:q --format csv");
+    const Outcome outcome = RunOn(data, "supervised", "--pairs '*:p' --pairs b:q,a:p --format csv");
 
     EXPECT_EQ(
         "attribute,target,bin,label,left,right,closed,weight,share,weight:p=no,weight:p=yes,weight:q=hi,weight:q=lo\n"
