@@ -26,7 +26,7 @@ constexpr const char* kData = "A delimited text file whose first line names the 
 
 constexpr const char* kSupervisedExamples = R"(Examples:
   mcbin supervised iris.csv --target species
-  mcbin supervised people.csv --target income --weight weight --missing-text ? --report people.html
+  mcbin supervised people.csv --target income --weight weight --missing-text '?' --report people.html
   mcbin supervised loans.csv --target default --format json > bins.json
   mcbin supervised survey.csv --pairs 'age:bought,income:bought,age:returned' --missing age=-9:-1)";
 
@@ -155,6 +155,8 @@ void AddOutput(CLI::App& command, OutputOptions& output)
         ->option_text("FORMAT")
         ->group("Output");
     command.add_option("--report", output.report, "Write a page with tables and charts, too")
+        ->check(CLI::Validator(
+            [](const std::string& file) { return file == "-" ? "standard output is for the bins" : ""; }, "", ""))
         ->option_text("FILE.html")
         ->group("Output");
     command.add_flag("--strict", output.isStrict, "End with exit code 3 if an attribute carries a warning or an error")

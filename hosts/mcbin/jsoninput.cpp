@@ -6,6 +6,7 @@
 #include "numbers.h"
 #include "text.h"
 
+#include <fmt/format.h>
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
@@ -48,10 +49,26 @@ std::optional<double> GetFigure(const Json& json)
     return json.is_null() ? std::nullopt : std::optional(GetNumber(json));
 }
 
+/// Whole numbers are written without a point, and a conversion would be undefined for large ones.
+long GetInteger(const Json& json)
+{
+    if (!json.is_number_integer())
+        throw Failure(Quote(json.dump()) + " stands where a whole number should be");
+    return json.get<long>();
+}
+
+/// What is no array would be gone through as one of a single element.
+const Json& GetArray(const Json& json)
+{
+    if (!json.is_array())
+        throw Failure(Quote(Shorten(json.dump())) + " stands where a list should be");
+    return json;
+}
+
 std::vector<double> GetNumbers(const Json& json)
 {
     std::vector<double> numbers;
-    for (const Json& number : json) numbers.push_back(GetNumber(number));
+    for (const Json& number : GetArray(json)) numbers.push_back(GetNumber(number));
     return numbers;
 }
 
@@ -73,22 +90,22 @@ SettingOptions GetSettings(const Json& json)
     made.method = Choose<Method>(json.at("method"),
                                  {{"supervised", Method::kSupervised}, {"equal-frequency", Method::kEqualFrequency}});
     made.isRightClosed = Choose<bool>(settings.at("closed"), {{"right", true}, {"left", false}});
-    made.bins = settings.at("bins").is_null() ? 0 : settings.at("bins").get<int>();
+    made.bins = settings.at("bins").is_null() ? 0 : static_cast<int>(GetInteger(settings.at("bins")));
     if (!settings.at("distinct_threshold").is_null())
-        made.distinctThreshold = settings.at("distinct_threshold").get<int>();
+        made.distinctThreshold = static_cast<int>(GetInteger(settings.at("distinct_threshold")));
     made.smallBins = GetFigure(settings.at("small_bins")).value_or(0.0);
     return made;
 }
 
 MCBinning::MCStatus GetStatus(const Json& json)
 {
-    const auto code = json.at("code").get<long>();
+    const auto code = GetInteger(json.at("code"));
     MCBinning::MCStatus status;
     if (json.at("severity") != "ok")
         status = MCBinning::MCStatus(code, json.at("severity") == "warning");
     for (unsigned int i = 0; i < 3; ++i)
     {
-        status.SetDiscreteDatum(i, json.at("discrete").at(i).get<long>());
+        status.SetDiscreteDatum(i, GetInteger(json.at("discrete").at(i)));
         status.SetScaleDatum(i, GetNumber(json.at("scale").at(i)));
     }
     return status;
@@ -97,14 +114,14 @@ MCBinning::MCStatus GetStatus(const Json& json)
 void SetCategories(Variable& variable, const Json& categories)
 {
     if (variable.IsCategorical())
-        for (const Json& category : categories)
+        for (const Json& category : GetArray(categories))
             variable.categories.push_back(category.is_string() ? category.get<std::string>()
                                                                : FormatNumber(category.get<double>()));
 }
 
 void SetMissing(Variable& variable, const Json& missing)
 {
-    for (const Json& value : missing.at("values"))
+    for (const Json& value : GetArray(missing.at("values")))
     {
         if (variable.kind == VariableKind::kStringCategorical)
             variable.missingTexts.push_back(value.get<std::string>());
@@ -155,15 +172,30 @@ Bin GetBin(const Json& json)
     return bin;
 }
 
+/// Whether the bins lie between the cut points, which so can't be NaN, and hold a weight for each category of the target.
+bool AreBetween(const std::vector<Bin>& bins, const std::vector<double>& cuts, std::size_t nCategories)
+{
+    constexpr double kInfinity = std::numeric_limits<double>::infinity();
+    if (bins.empty())
+        return cuts.empty();
+    double left = -kInfinity;
+    for (std::size_t i = 0; i < bins.size(); ++i)
+    {
+        const double right = i < cuts.size() ? cuts[i] : kInfinity;
+        if (bins[i].left != left || bins[i].right != right || bins[i].weights.size() != nCategories)
+            return false;
+        left = right;
+    }
+    return bins.size() == cuts.size() + 1;
+}
+
 void ThrowIfInconsistent(const Findings& findings, const Result& result)
 {
     const std::vector<double>& cuts = result.cutPoints;
+    const Variable* const target = findings.FindTarget(result);
     const bool isAscending =
         std::adjacent_find(cuts.begin(), cuts.end(), [](double a, double b) { return !(a < b); }) == cuts.end();
-    const Variable* const target = findings.FindTarget(result);
-    const auto fits = [&](const Bin& bin) { return bin.weights.size() == (target ? target->categories.size() : 0); };
-    if (!isAscending || (!cuts.empty() && result.bins.size() != cuts.size() + 1) ||
-        !std::all_of(result.bins.begin(), result.bins.end(), fits))
+    if (!isAscending || !AreBetween(result.bins, cuts, target ? target->categories.size() : 0))
         throw Failure("the bins of " + Quote(findings.GetAttribute(result).name) +
                       " don't fit its cut points or its target");
 }
@@ -175,7 +207,7 @@ Result GetResult(const Findings& findings, const Json& json)
     if (!json.at("target").is_null())
         result.target = FindVariable(findings, json.at("target"));
     result.status = GetStatus(json.at("status"));
-    result.distinctValues = json.at("distinct_values").get<long>();
+    result.distinctValues = GetInteger(json.at("distinct_values"));
     result.weight = GetNumber(json.at("weight"));
     result.weightWithMissing = GetNumber(json.at("weight_with_missing"));
     result.minimum = GetFigure(json.at("minimum"));
@@ -183,7 +215,7 @@ Result GetResult(const Findings& findings, const Json& json)
     result.targetEntropy = GetFigure(json.at("target_entropy"));
     result.modelEntropy = GetFigure(json.at("model_entropy"));
     result.cutPoints = GetNumbers(json.at("cut_points"));
-    for (const Json& bin : json.at("bins")) result.bins.push_back(GetBin(bin));
+    for (const Json& bin : GetArray(json.at("bins"))) result.bins.push_back(GetBin(bin));
     ThrowIfInconsistent(findings, result);
     return result;
 }
@@ -192,19 +224,21 @@ Findings GetFindings(const Json& json)
 {
     if (!json.is_object() || json.value("schema", "") != kSchema)
         throw Failure("it is no file of bins, as --format json writes it");
-    if (json.at("schema_version").get<int>() > kSchemaVersion)
-        throw Failure("it was written by a later version, whose form isn't known here");
+    const long version = GetInteger(json.at("schema_version"));
+    if (version < 1 || version > kSchemaVersion)
+        throw Failure(
+            fmt::format("it has schema version {}, and this tool knows versions up to {}", version, kSchemaVersion));
     Findings findings;
     findings.componentVersion = json.at("component_version").get<std::string>();
     findings.settings = GetSettings(json);
     const Json& data = json.at("data");
     findings.dataName = data.at("name").is_null() ? "" : data.at("name").get<std::string>();
     if (!data.at("records").is_null())
-        findings.records = data.at("records").get<long>();
+        findings.records = GetInteger(data.at("records"));
     findings.missingText = data.at("missing_text").get<std::vector<std::string>>();
-    for (const Json& variable : json.at("variables")) findings.variables.push_back(GetVariable(variable));
+    for (const Json& variable : GetArray(json.at("variables"))) findings.variables.push_back(GetVariable(variable));
     findings.status = GetStatus(json.at("status"));
-    for (const Json& result : json.at("results")) findings.results.push_back(GetResult(findings, result));
+    for (const Json& result : GetArray(json.at("results"))) findings.results.push_back(GetResult(findings, result));
     return findings;
 }
 
@@ -218,7 +252,9 @@ Findings ReadJson(const std::string& path)
     }
     catch (const Json::exception& error) // not JSON, or a member is lacking or of another kind
     {
-        throw Failure(path + ": " + error.what());
+        const std::string words = error.what(); // begins with "[json.exception....] "
+        throw Failure(path +
+                      ": it is no file of bins, as --format json writes it: " + words.substr(words.find(']') + 2));
     }
     catch (const Failure& failure)
     {

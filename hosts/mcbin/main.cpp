@@ -20,6 +20,7 @@
 #include <exception>
 #include <iostream>
 #include <new>
+#include <optional>
 #include <sstream>
 
 #include <unistd.h>
@@ -53,9 +54,9 @@ std::string Print(const Findings& findings, Format format)
     return os.str();
 }
 
-void Write(const std::string& path, const std::string& text)
+void WriteOut(const std::string& text)
 {
-    OutputFile output(path);
+    OutputFile output("-");
     output.Write(text);
     output.Commit();
 }
@@ -71,6 +72,14 @@ int GetExitCode(const Findings& findings, bool isStrict)
     return isStrict && std::any_of(findings.results.begin(), findings.results.end(), isFlagged) ? kFlagged : 0;
 }
 
+void WriteReport(OutputFile& report, const Findings& findings)
+{
+    std::ostringstream page;
+    PrintHtml(page, findings);
+    report.Write(page.str());
+    report.Commit();
+}
+
 int Bin(const BinOptions& options)
 {
     Progress progress(IsTerminal(STDERR_FILENO) && !options.output.isQuiet);
@@ -78,14 +87,24 @@ int Bin(const BinOptions& options)
     tableOptions.isReadTwice = true;
     tableOptions.spoolDirectory = options.settings.tempDirectory;
     TableReader table(tableOptions);
-    const Findings findings = FindBins(table, options, progress);
+    // A name that can't be written is found out before the work, and a full disk is no reason to lose the tables.
+    std::optional<OutputFile> report;
     if (!options.output.report.empty())
+        report.emplace(options.output.report);
+    const Findings findings = FindBins(table, options, progress);
+    std::exception_ptr failure;
+    try
     {
-        std::ostringstream page;
-        PrintHtml(page, findings);
-        Write(options.output.report, page.str());
+        if (report)
+            WriteReport(*report, findings);
     }
-    Write("-", Print(findings, options.output.format));
+    catch (const Failure&)
+    {
+        failure = std::current_exception();
+    }
+    WriteOut(Print(findings, options.output.format));
+    if (failure)
+        std::rethrow_exception(failure);
     return GetExitCode(findings, options.output.isStrict);
 }
 
@@ -99,7 +118,9 @@ int Run(int argc, char** argv)
     }
     catch (const CLI::Success& help)
     {
-        app->exit(help);
+        std::ostringstream text;
+        app->exit(help, text, text);
+        WriteOut(text.str());
         return 0;
     }
     catch (const CLI::ParseError& error)
@@ -109,7 +130,9 @@ int Run(int argc, char** argv)
     }
     if (request.isManPage)
     {
-        PrintManPage(std::cout, *app);
+        std::ostringstream page;
+        PrintManPage(page, *app);
+        WriteOut(page.str());
         return 0;
     }
     if (request.command != Request::Command::kApply)

@@ -1,6 +1,7 @@
 #include "outputfile.h"
 
 #include "failure.h"
+#include "interrupt.h"
 
 #include <cerrno>
 #include <cstring>
@@ -89,5 +90,7 @@ void OutputFile::Fail() const
 {
     if (errno == EPIPE)
         throw PipeClosed();
+    if (errno == EINTR)
+        ThrowIfInterrupted();
     throw Failure("cannot write " + fPath + ": " + std::strerror(errno));
 }

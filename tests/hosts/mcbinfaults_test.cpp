@@ -1,10 +1,19 @@
 #include "hosts/mcbinrun.h"
+#include "hosts/mcbinterminal.h"
 
 #include <array>
 #include <csignal>
+#include <filesystem>
+#include <fstream>
+#include <functional>
+#include <optional>
 #include <string>
+#include <vector>
 
-#include <pty.h>
+#include <fcntl.h>
+#include <sched.h>
+#include <sys/ioctl.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 // What can go wrong around the tool: nothing is lost, and nothing stays behind.
@@ -26,61 +35,61 @@ std::string MakeTable(int rows, int columns)
     return data;
 }
 
-/// A program on a terminal of its own.
-class Terminal
+/// The program with a pipe for its standard output and standard error. Its input must fill the pipe.
+class Piped
 {
 public:
-    Terminal(const std::string& directory, const std::string& temporary, const std::string& arguments)
+    Piped(const std::string& directory, const std::vector<std::string>& arguments)
     {
-        winsize size = {};
-        size.ws_row = 24;
-        size.ws_col = 100;
-        fProcess = forkpty(&fMaster, nullptr, nullptr, &size);
+        EXPECT_EQ(0, pipe(fPipe.data()));
+        fProcess = fork();
         if (fProcess == 0)
         {
-            setenv("TMPDIR", temporary.c_str(), 1);
-            setenv("TERM", "xterm", 1);
-            unsetenv("NO_COLOR");
-            const std::string script = "cd " + directory + " && exec '" MCBIN_PATH "' " + arguments;
-            execl("/bin/sh", "sh", "-c", script.c_str(), nullptr);
+            std::vector<const char*> words{MCBIN_PATH};
+            for (const std::string& argument : arguments) words.push_back(argument.c_str());
+            words.push_back(nullptr);
+            dup2(fPipe[1], STDOUT_FILENO);
+            dup2(fPipe[1], STDERR_FILENO);
+            if (chdir(directory.c_str()) == 0)
+                execv(MCBIN_PATH, const_cast<char**>(words.data()));
             _exit(127);
         }
+        close(fPipe[1]);
+        while (CountWaiting() < fcntl(fPipe[0], F_GETPIPE_SZ)) sched_yield();
     }
-    Terminal(const Terminal&) = delete;
-    Terminal& operator=(const Terminal&) = delete;
-    ~Terminal() { close(fMaster); }
+    Piped(const Piped&) = delete;
+    Piped& operator=(const Piped&) = delete;
+    ~Piped() { close(fPipe[0]); }
 
-    /// Reads until the text has come, or to the end of the program. \return whether it has come.
-    bool WaitFor(const std::string& text)
+    void Interrupt() const { EXPECT_EQ(0, kill(fProcess, SIGINT)); }
+
+    /// Reads to the end of the program.
+    std::string ReadAll() const
     {
+        std::string text;
         std::array<char, 4096> block;
-        while (fText.find(text) == std::string::npos)
-        {
-            const ssize_t size = read(fMaster, block.data(), block.size());
-            if (size <= 0)
-                return false;
-            fText.append(block.data(), static_cast<std::size_t>(size));
-        }
-        return true;
+        for (ssize_t size; (size = read(fPipe[0], block.data(), block.size())) > 0;)
+            text.append(block.data(), static_cast<std::size_t>(size));
+        return text;
     }
 
-    /// As the key does.
-    void PressCtrlC() const { EXPECT_EQ(1, write(fMaster, "\x03", 1)); }
-
-    int GetExitCode()
+    /// \return whether it has ended, and then the status of its end.
+    std::optional<int> FindEnd(int options) const
     {
-        WaitFor("\xFF"); // never comes
         int status = 0;
-        waitpid(fProcess, &status, 0);
-        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+        return waitpid(fProcess, &status, options) == fProcess ? std::optional(status) : std::nullopt;
     }
-
-    const std::string& GetText() const { return fText; }
 
 private:
-    int fMaster = -1;
+    int CountWaiting() const
+    {
+        int size = 0;
+        ioctl(fPipe[0], FIONREAD, &size);
+        return size;
+    }
+
+    std::array<int, 2> fPipe{};
     pid_t fProcess = -1;
-    std::string fText;
 };
 
 using McbinFaults = Mcbin;
@@ -96,7 +105,7 @@ TEST_F(McbinFaults, BadArgumentsAreAUsageError)
           "equal-frequency data.csv --bins many", "supervised data.csv more --target y",
           "supervised data.csv --target y --pairs x:y", "supervised data.csv --target y --closed both",
           "supervised data.csv --target y --small-bins 2", "equal-frequency data.csv --delimiter ab",
-          "apply bins.json"})
+          "equal-frequency data.csv --report -", "apply bins.json"})
     {
         const Outcome outcome = Run(arguments);
         EXPECT_EQ(2, outcome.exitCode) << arguments;
@@ -125,7 +134,13 @@ TEST_F(McbinFaults, WhatCannotBeWrittenIsAFailureAndLeavesNothing)
     EXPECT_EQ("mcbin: cannot write standard output: No space left on device\n",
               Run("apply bins.json data.csv >/dev/full").err);
     EXPECT_EQ(1, Shell("(ulimit -f 64; mcbin apply bins.json data.csv -o out.csv)").exitCode);
-    EXPECT_EQ(1, Run("supervised data.csv --target y --report none/page.html").exitCode);
+    EXPECT_EQ(1, Run("--help >/dev/full").exitCode);
+    const Outcome noPage = Run("supervised data.csv --target y --report none/page.html");
+    EXPECT_EQ("mcbin: cannot write none/page.html: No such file or directory\n", noPage.err);
+    EXPECT_EQ("", noPage.out) << "found out before the work";
+    const Outcome fullPage = Run("supervised data.csv --target y --report /dev/full");
+    EXPECT_EQ("mcbin: cannot write /dev/full: No space left on device\n", fullPage.err);
+    EXPECT_EQ(Run("supervised data.csv --target y").out, fullPage.out) << "the tables are not lost";
     const Outcome noRoom = Shell("(ulimit -f 64; mcbin supervised data.csv --target y)");
     EXPECT_EQ(1, noRoom.exitCode);
     EXPECT_EQ("mcbin: error 120021: a temporary file cannot be opened, written or read; the disk may be full\n",
@@ -150,6 +165,70 @@ TEST_F(McbinFaults, ADirectoryThatTakesNoFilesIsAFailureInWords)
     }
 }
 
+TEST_F(McbinFaults, ADirectoryThatMayOnlyBeReadIsAFailureInWords)
+{
+    const std::string locked = fData.File("locked");
+    std::filesystem::create_directory(locked);
+    chmod(locked.c_str(), 0555);
+    Write("data.csv", "x,y\n1,a\n2,a\n3,b\n4,b\n");
+    Run("supervised data.csv --target y --format json >bins.json");
+    // Root may write everywhere, unless that is taken away.
+    const std::string lead =
+        std::string(geteuid() == 0 ? "setpriv --bounding-set -dac_override " : "") + "'" MCBIN_PATH "'";
+    struct Case
+    {
+        const char* arguments;
+        const char* err;
+    };
+    const Case cases[] = {
+        {"supervised data.csv --target y --temp-dir locked",
+         "error 120001: the directory for temporary files does not exist, or no file can be made in it"},
+        {"supervised - --target y --temp-dir locked < <(cat data.csv)",
+         "cannot make a temporary file in locked: Permission denied"},
+        {"supervised data.csv --target y --report locked/page.html",
+         "cannot write locked/page.html: Permission denied"},
+        {"apply bins.json data.csv -o locked/out.csv", "cannot write locked/out.csv: Permission denied"},
+    };
+    for (const Case& c : cases)
+    {
+        const Outcome outcome = Shell("bash -c \"" + lead + " " + c.arguments + "\"");
+        EXPECT_EQ(1, outcome.exitCode) << c.arguments;
+        EXPECT_EQ("", outcome.out) << c.arguments;
+        EXPECT_EQ("mcbin: " + std::string(c.err) + "\n", outcome.err);
+    }
+    EXPECT_TRUE(std::filesystem::is_empty(locked));
+}
+
+TEST_F(McbinFaults, AFileThatChangesBetweenThePassesIsAFailureAndOneThatVanishesIsNot)
+{
+    const std::string data = MakeTable(200000, 6);
+    const auto end = static_cast<std::streamoff>(data.size());
+    struct Case
+    {
+        const char* what;
+        std::function<void(const std::string&)> change;
+        int exitCode;
+    };
+    const Case cases[] = {
+        {"shorter", [&](const std::string& path) { std::filesystem::resize_file(path, data.size() - 100); }, 1},
+        {"longer", [&](const std::string& path) { std::ofstream(path, std::ios::app) << "a,1,1,1,1,1,1\n"; }, 1},
+        {"another category",
+         [&](const std::string& path) { (std::fstream(path).seekp(end - 100) << "\nx,1,1,1,1,1,1\n"); }, 1},
+        {"gone", [](const std::string& path) { std::filesystem::remove(path); }, 0},
+    };
+    for (const Case& c : cases)
+    {
+        Write("data.csv", data);
+
+        Terminal terminal(fData.Path(), fTemporary.Path(), "supervised data.csv --target y");
+        ASSERT_TRUE(terminal.WaitFor("reading the records: 50000 rows")) << terminal.GetText();
+        c.change(fData.File("data.csv"));
+
+        EXPECT_EQ(c.exitCode, terminal.GetExitCode()) << c.what;
+        EXPECT_EQ(c.exitCode == 0, terminal.GetText().find("mcbin: data.csv") == std::string::npos) << c.what;
+    }
+}
+
 TEST_F(McbinFaults, AClosedPipeEndsTheToolWithoutAWord)
 {
     Write("data.csv", MakeTable(20000, 3));
@@ -166,9 +245,6 @@ TEST_F(McbinFaults, BinsThatDontFitTheDataAreAFailureInWords)
     ASSERT_EQ(0, RunOn("x,g,y\n1,a,0\n2,a,0\n3,a,0\n4,b,1\n5,b,1\n6,b,1\n7,b,1\n", "supervised",
                        "--target y --categorical g --format json >bins.json")
                      .exitCode);
-    Write("cut.json", "{\"schema\": ");
-    Write("other.json", "{\"schema\": \"something\"}");
-
     EXPECT_NE(std::string::npos, RunOn("x\n1\n", "apply bins.json", "").err.find("no column is named 'g'"));
     EXPECT_NE(std::string::npos,
               RunOn("x,g\n1,a\nten,a\n", "apply bins.json", "").err.find("line 3: column 'x': 'ten' is not a number"));
@@ -179,12 +255,42 @@ TEST_F(McbinFaults, BinsThatDontFitTheDataAreAFailureInWords)
     EXPECT_EQ("g,x,id\n{b},\"(3, +inf)\",\"a,b\"\n",
               RunOn("g,x,id\nb,1e9,\"a,b\"\n", "apply bins.json", "--labels --in-place-columns").out);
     EXPECT_NE(std::string::npos, RunOn("x,g,x_bin\n1,a,1\n", "apply bins.json", "").err.find("already"));
-    for (const char* bins : {"cut.json", "other.json", "none.json", "data.csv"})
+}
+
+TEST_F(McbinFaults, ADamagedFileOfBinsIsRefusedInWordsThatNameIt)
+{
+    struct Case
     {
-        const Outcome outcome = Run(std::string("apply ") + bins + " data.csv");
-        EXPECT_EQ(1, outcome.exitCode) << bins;
-        EXPECT_EQ("mcbin: " + std::string(bins) + ": ", outcome.err.substr(0, 9 + std::string(bins).size()));
+        const char* change; ///< what sed does to a good file
+        const char* words;
+    };
+    const Case cases[] = {
+        {"9,$d", "it is no file of bins, as --format json writes it: parse error"},
+        {"s/mcobnqrt-bins/other/", "it is no file of bins, as --format json writes it"},
+        {"s/\"schema_version\": 1/\"schema_version\": 2/",
+         "it has schema version 2, and this tool knows versions up to 1"},
+        {"s/\"schema_version\": 1/\"schema_version\": 1e99/", "'1e+99' stands where a whole number should be"},
+        {"s/\"cut_points\"/\"cuts\"/", "it is no file of bins, as --format json writes it: key 'cut_points' not found"},
+        {"s/\"cut_points\": .3./\"cut_points\": 3/", "'3' stands where a list should be"},
+        {"s/\"cut_points\": .3./\"cut_points\": [\"nan\"]/", "the bins of 'x' don't fit its cut points or its target"},
+        {"s/\"cut_points\": .3./\"cut_points\": [3, 4]/", "the bins of 'x' don't fit its cut points or its target"},
+        {"s/\"left\": 3/\"left\": 2/", "the bins of 'x' don't fit its cut points or its target"},
+        {"s/\"weights\": .3, 0./\"weights\": [3]/", "the bins of 'x' don't fit its cut points or its target"},
+        {"s/\"attribute\": \"x\"/\"attribute\": \"z\"/", "it has a result for a variable that it doesn't describe"},
+        {"s/\"closed\": \"right\"/\"closed\": \"both\"/", "it has 'both', which is not known here"},
+    };
+    RunOn("x,y\n1,0\n2,0\n3,0\n4,1\n5,1\n6,1\n7,1\n", "supervised", "--target y --format json >good.json");
+    ASSERT_EQ(0, Run("apply good.json data.csv").exitCode);
+
+    for (const Case& c : cases)
+    {
+        const Outcome outcome =
+            Shell("sed '" + std::string(c.change) + "' good.json >bins.json; mcbin apply bins.json data.csv");
+        EXPECT_EQ(1, outcome.exitCode) << c.change;
+        EXPECT_EQ("", outcome.out) << c.change;
+        EXPECT_EQ(0u, outcome.err.find("mcbin: bins.json: " + std::string(c.words))) << c.change << outcome.err;
     }
+    EXPECT_EQ("mcbin: none.json: No such file or directory\n", Run("apply none.json data.csv").err);
 }
 
 TEST_F(McbinFaults, CtrlCAmongTheAttributesPrintsWhatWasFound)
@@ -216,11 +322,39 @@ TEST_F(McbinFaults, CtrlCInAPassEndsItWithoutResults)
     }
 }
 
-TEST_F(McbinFaults, OnATerminalTablesAreColouredAndAsWideAsIt)
+TEST_F(McbinFaults, CtrlCWhileBinsAreAppliedLeavesTheFormerFile)
 {
-    Terminal terminal(fData.Path(), fTemporary.Path(), std::string("supervised ") + kIris + " --target species");
+    Write("data.csv", MakeTable(200000, 6));
+    Run("supervised data.csv --target y --format json >bins.json");
+    Write("out.csv", "former");
+    const std::size_t numFiles = fData.FileNames().size();
 
-    EXPECT_EQ(0, terminal.GetExitCode());
-    EXPECT_NE(std::string::npos, terminal.GetText().find("\x1b[1mpetal_width by species\x1b[0m: gain 1.3784 bits"));
-    EXPECT_NE(std::string::npos, terminal.GetText().find("\x1b[34m█"));
+    Terminal terminal(fData.Path(), fTemporary.Path(), "apply bins.json data.csv -o out.csv");
+    ASSERT_TRUE(terminal.WaitFor("applying the bins: 65536 rows")) << terminal.GetText();
+    terminal.PressCtrlC();
+
+    EXPECT_EQ(130, terminal.GetExitCode());
+    EXPECT_EQ("former", ReadFile(fData.File("out.csv")));
+    EXPECT_EQ(numFiles, fData.FileNames().size());
+}
+
+TEST_F(McbinFaults, OneCtrlCEndsAWaitForTheReaderOfAPipeAndASecondOneEndsAllElseAtOnce)
+{
+    Write("data.csv", MakeTable(200000, 3));
+    Run("supervised data.csv --target y --format json >bins.json");
+    const std::vector<std::string> arguments{"apply", "bins.json", "data.csv"};
+
+    const Piped read(fData.Path(), arguments);
+    read.Interrupt();
+    EXPECT_NE(std::string::npos, read.ReadAll().find("mcbin: interrupted"));
+    const int status = read.FindEnd(0).value_or(-1);
+    EXPECT_TRUE(WIFEXITED(status));
+    EXPECT_EQ(130, WEXITSTATUS(status));
+
+    // Nobody reads the message of the first one, so the program waits for that.
+    const Piped unread(fData.Path(), arguments);
+    std::optional<int> end;
+    while (!(end = unread.FindEnd(WNOHANG))) unread.Interrupt();
+    EXPECT_TRUE(WIFSIGNALED(*end));
+    EXPECT_EQ(SIGINT, WTERMSIG(*end));
 }

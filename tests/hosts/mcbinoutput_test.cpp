@@ -1,4 +1,5 @@
 #include "hosts/mcbinrun.h"
+#include "hosts/mcbinterminal.h"
 
 #include <string>
 
@@ -163,4 +164,64 @@ TEST_F(McbinOutput, HelpAndManualPageHaveTheSameTexts)
     }
     EXPECT_NE(std::string::npos, page.out.find(".TP\n.B \\-\\-target \\fINAME\\fR\n"));
     EXPECT_EQ(0u, Run("--version").out.find("mcbin "));
+}
+
+TEST_F(McbinOutput, OnATerminalTablesAreColouredUnlessThatIsUnwanted)
+{
+    const std::string run = "supervised '" EXAMPLE_DATA "/iris.csv' --target species";
+
+    Terminal coloured(fData.Path(), fTemporary.Path(), run);
+    EXPECT_EQ(0, coloured.GetExitCode());
+    EXPECT_NE(std::string::npos, coloured.GetText().find("\x1b[1mpetal_width by species\x1b[0m: gain 1.3784 bits"));
+    EXPECT_NE(std::string::npos, coloured.GetText().find("\x1b[34m█"));
+    EXPECT_NE(std::string::npos, coloured.GetText().find("\r\x1b[Kbinned 4 of 4: petal_width\r\x1b[K"));
+    for (const char* setting : {"NO_COLOR=1", "TERM=dumb"})
+    {
+        Terminal plain(fData.Path(), fTemporary.Path(), run + " --quiet", setting);
+        EXPECT_EQ(0, plain.GetExitCode());
+        EXPECT_EQ(std::string::npos, plain.GetText().find('\x1b')) << setting;
+    }
+}
+
+TEST_F(McbinOutput, TablesFitTheTerminalAndStandStraightWithWideCharacters)
+{
+    const char* const places[] = {"東京", "大阪", "emoji😀", "e\u0301te\u0301", "a very long name of a category"};
+    std::string data = "値,place,ja\n";
+    for (int i = 0; i < 60; ++i)
+        data += std::to_string(1000 * i) + "," + places[i / 12] + "," + (i < 24 ? "nein" : "ja") + "\n";
+    Write("data.csv", data + "61000,大阪,nein\n");
+    const auto print = [&](const std::string& options, unsigned short width)
+    {
+        Terminal terminal(fData.Path(), fTemporary.Path(), "supervised data.csv --quiet " + options, "NO_COLOR=1",
+                          width);
+        EXPECT_EQ(0, terminal.GetExitCode());
+        std::string text;
+        for (const char c : terminal.GetText())
+            if (c != '\r')
+                text += c;
+        const std::size_t begin = text.find("  bin ");
+        return text.substr(begin, text.find("\n\n", begin) + 1 - begin);
+    };
+
+    // Of many categories the heaviest keep their columns, of two the rate tells more than both.
+    EXPECT_EQ(R"(  bin             weight  share  大阪  others
+  (-inf, 11000]       12  19.7%     0      12  ░░░░░░░░░░░░░
+  (11000, 23000]      12  19.7%    12       0  ▒▒▒▒▒▒▒▒▒▒▒▒▒
+  (23000, 35000]      12  19.7%     0      12  ▓▓▓▓▓▓▓▓▓▓▓▓▓
+  (35000, 47000]      12  19.7%     0      12  ░░░░░░░░░░░░░
+  (47000, +inf)       13  21.3%     1      12  ████████████▒
+  █ a very long name of a category ▓ emoji😀 ▒ 大阪 ░ others
+)",
+              print("--target place", 60));
+    EXPECT_EQ(R"(  bin                        weight  share    rate
+  {a very long ..., 2 more}      36  59.0%    0.0%
+  {大阪, 東京}                   25  41.0%  100.0%
+  rate and WoE of 'nein'; information value inf
+)",
+              print("--target ja --attributes place --categorical place", 50));
+    EXPECT_EQ(R"(  bin                      weight  share
+  {a very lon..., 2 more}      36  59.0%
+  {大阪, 東京}                 25  41.0%
+)",
+              print("--target ja --attributes place --categorical place", 40));
 }
