@@ -9,22 +9,24 @@
 namespace
 {
 
-/// Rows with weights of 1, missing values of each kind, and values on cut points. The category "k1" to "k3" of the rows
-/// rises with x, and "grade" with it.
+/// Rows with weights, missing values of each kind, and values on cut points. The category "k1" to "k3" of the rows rises
+/// with x, and "grade" with it.
 std::string MakeCustomers()
 {
-    std::string data = "id,x,\"od\"\"d\",grade,y\n";
+    std::string data = "id,x,\"od\"\"d\",grade,y,w\n";
     for (int i = 0; i < 300; ++i)
     {
         const std::string x = i % 29 == 0 ? "" : i % 31 == 0 ? "?" : i % 37 == 0 ? "-9" : std::to_string(i / 2 * 0.5);
-        const std::string grade = i % 41 == 0 ? "" : i < 120 ? "a" : i < 200 ? "b" : "c";
+        const std::string grade = i % 41 == 0 ? "" : i % 43 == 0 ? "it's" : i < 120 ? "a" : i < 200 ? "b" : "c";
         const char* y = (i < 100) != (i % 17 == 0) ? "k1" : (i < 200) != (i % 13 == 0) ? "k2" : "k3";
-        data += std::to_string(i) + "," + x + "," + std::to_string(i / 7) + "," + grade + "," + y + "\n";
+        data += std::to_string(i) + "," + x + "," + std::to_string(i / 7) + "," + grade + "," + y + "," +
+                std::to_string(i % 4) + "\n";
     }
     return data;
 }
 
-constexpr const char* kOptions = "--target y --exclude id --categorical grade --missing-text '?' --missing x=-99:-1 ";
+constexpr const char* kOptions = "--target y --exclude id --categorical grade --missing-text '?' --missing x=-99:-1 "
+                                 "--missing '*d=7,9' --missing grade=\"it's\" --weight w ";
 
 class McbinApply : public Mcbin, public testing::WithParamInterface<const char*>
 {
@@ -53,28 +55,29 @@ TEST_P(McbinApply, GivesTheWeightsOfTheTablesAndWhatTheSqlGives)
     const std::string closed = std::string(" --closed ") + GetParam();
     const Outcome json = RunOn(MakeCustomers(), "supervised", kOptions + closed + " --format json");
     Write("bins.json", json.out);
-    Write("bins.sql", "CREATE TABLE t (id, x REAL, \"od\"\"d\" REAL, grade, y);\n.mode csv\n.import data.csv t\n"
-                      "UPDATE t SET x = NULL WHERE x IN ('', '?');\nUPDATE t SET grade = NULL WHERE grade = '';\n"
-                      "DELETE FROM t WHERE id = 'id';\nSELECT *, " +
-                          Run("supervised data.csv " + (kOptions + closed) + " --format sql").out +
-                          "FROM t ORDER BY CAST(id AS INTEGER);\n");
+    Write("bins.sql",
+          "CREATE TABLE t (id, x REAL, \"od\"\"d\" REAL, grade, y, w INTEGER);\n.mode csv\n.import data.csv t\n"
+          "UPDATE t SET x = NULL WHERE x IN ('', '?');\nUPDATE t SET grade = NULL WHERE grade = '';\n"
+          "DELETE FROM t WHERE id = 'id';\nSELECT *, " +
+              Run("supervised data.csv " + (kOptions + closed) + " --format sql").out +
+              "FROM t ORDER BY CAST(id AS INTEGER);\n");
 
     const Outcome applied = Run("apply bins.json data.csv -o -");
     ASSERT_EQ(0, applied.exitCode) << json.err << applied.err;
 
-    std::map<std::string, std::vector<int>> counts; // by column and bin
+    std::map<std::string, std::vector<int>> weights; // by column and bin
     const auto rows = Cells(applied.out);
     EXPECT_EQ(301u, rows.size());
     std::string bins;
     for (std::size_t i = 1; i < rows.size(); ++i)
-        for (std::size_t column = 5; column < rows[i].size(); ++column)
+        for (std::size_t column = 6; column < rows[i].size(); ++column)
         {
             bins += rows[i][column] + (column + 1 < rows[i].size() ? "," : "\n");
             if (rows[i][column].empty())
                 continue;
-            std::vector<int>& binCounts = counts[rows[0][column]];
-            binCounts.resize(std::max<std::size_t>(binCounts.size(), std::stoul(rows[i][column]) + 1));
-            ++binCounts[std::stoul(rows[i][column])];
+            std::vector<int>& binWeights = weights[rows[0][column]];
+            binWeights.resize(std::max<std::size_t>(binWeights.size(), std::stoul(rows[i][column]) + 1));
+            binWeights[std::stoul(rows[i][column])] += std::stoi(rows[i][5]);
         }
     std::map<std::string, std::vector<int>> tables;
     for (const auto& row :
@@ -82,8 +85,57 @@ TEST_P(McbinApply, GivesTheWeightsOfTheTablesAndWhatTheSqlGives)
         if (row[0] != "attribute")
             tables[(row[0] == "\"od\"\"d\"" ? "\"od\"\"d_bin\"" : row[0] + "_bin")].push_back(std::stoi(row[7]));
     EXPECT_EQ(3u, tables.size());
-    EXPECT_EQ(tables, counts);
-    EXPECT_EQ(bins, Shell("sqlite3 :memory: <bins.sql | cut -d, -f6- | tr -d '\\r'").out);
+    EXPECT_EQ(tables, weights);
+    EXPECT_EQ(bins, Shell("sqlite3 :memory: <bins.sql | cut -d, -f7- | tr -d '\\r'").out);
 }
 
 INSTANTIATE_TEST_SUITE_P(Closed, McbinApply, testing::Values("right", "left"));
+
+TEST_F(Mcbin, AppliesWhatThePythonPackageHasWritten)
+{
+    // Numeric categories and a label, which the tool itself doesn't write, and a member that it doesn't know.
+    Write("bins.json", R"({"schema": "mcobnqrt-bins", "schema_version": 1, "component_version": "", "new": [],
+      "method": "equal-frequency",
+      "settings": {"closed": "left", "bins": 3, "distinct_threshold": null, "small_bins": null},
+      "data": {"name": null, "records": null, "missing_text": []},
+      "variables": [{"name": "grade", "label": "of the paper", "kind": "numeric-categorical", "role": "attribute",
+                     "categories": [1, 1.5, 2, 30], "rounding": null, "missing": {"values": [9], "interval": ["-inf", -2]}},
+                    {"name": "grade", "label": "", "kind": "weight", "role": "weight", "categories": null,
+                     "rounding": "none", "missing": {"values": [], "interval": null}}],
+      "status": {"code": 0, "severity": "ok", "words": "OK", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
+      "results": [{"attribute": "grade", "target": null,
+                   "status": {"code": 0, "severity": "ok", "words": "OK", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
+                   "distinct_values": 4, "weight": 40, "weight_with_missing": 41, "minimum": 0, "maximum": 3,
+                   "target_entropy": null, "model_entropy": null, "cut_points": [1, 3],
+                   "bins": [{"left": "-inf", "right": 1, "weight": 10, "weights": null},
+                            {"left": 1, "right": 3, "weight": 20.5, "weights": null},
+                            {"left": 3, "right": "inf", "weight": 10, "weights": null}]}]})");
+
+    EXPECT_EQ(
+        "grade\n{1}\n{1}\n\"{1.5, 2}\"\n{30}\n\"\"\n\"\"\n\"\"\n",
+        RunOn("grade\n1\n1.0\n2\n3e1\n9\n-3\nx\n", "apply bins.json", "--labels --in-place-columns --bad missing").out);
+    EXPECT_EQ(
+        "mcbin: data.csv, line 2: column 'grade': '3' is a category that the bins don't know; with --bad missing it "
+        "counts as missing\n",
+        RunOn("grade\n3\n", "apply bins.json", "").err);
+}
+
+TEST_F(Mcbin, AppliesToOtherColumnsInAnotherOrderAndSaysWhatDoesNotFit)
+{
+    std::string data = "a,b,p,q\n";
+    for (int i = 0; i < 40; ++i)
+        data += std::to_string(i) + "," + std::to_string(-i) + (i < 20 ? ",no" : ",yes") + (i < 10 ? ",lo\n" : ",hi\n");
+    ASSERT_EQ(0, RunOn(data, "supervised", "--pairs a:p,b:p,b:q --format json >bins.json").exitCode);
+
+    // The names tell the targets apart; a column without a name stays one; values far outside are in the outer bins.
+    EXPECT_EQ("b;;a;a_bin;b_by_p_bin;b_by_q_bin\n-15;\"x;\"\"y\";1e9;1;1;0\n;;19;0;;\n",
+              RunOn("b;;a\n -15 ;\"x;\"\"y\";1e9\n;;19\n", "apply bins.json", "").out);
+    EXPECT_EQ("mcbin: column 'b' has been binned for more than one target, so its bins can't take its place\n",
+              RunOn(data, "apply bins.json", "--in-place-columns").err);
+    EXPECT_EQ("mcbin: data.csv: there is a column 'b_by_q_bin' already; --in-place-columns makes no new ones\n",
+              RunOn("a,b,b_by_q_bin\n1,2,3\n", "apply bins.json", "").err);
+    // Read once, both may be pipes.
+    Write("data.csv", "a,b\n1,-1\n");
+    EXPECT_EQ("a,b,a_bin,b_by_p_bin,b_by_q_bin\n1,-1,0,1,1\n",
+              Shell("mkfifo pipe; cat bins.json >pipe & cat data.csv | mcbin apply pipe -").out);
+}
