@@ -29,10 +29,24 @@ Indices FindColumns(const TableReader& table, const std::string& pattern)
     return found;
 }
 
-Indices FindColumns(const TableReader& table, const std::vector<std::string>& patterns)
+/// The names and patterns of a list, split at its commas where it isn't the name of a column as it stands.
+std::vector<std::string> SplitNames(const TableReader& table, const std::vector<std::string>& lists)
+{
+    const std::vector<std::string>& columns = table.GetColumnNames();
+    std::vector<std::string> names;
+    for (const std::string& list : lists)
+    {
+        const bool isName = std::find(columns.begin(), columns.end(), list) != columns.end();
+        const std::vector<std::string> parts = isName ? std::vector<std::string>{list} : Split(list, ',');
+        names.insert(names.end(), parts.begin(), parts.end());
+    }
+    return names;
+}
+
+Indices FindColumns(const TableReader& table, const std::vector<std::string>& lists)
 {
     Indices found;
-    for (const std::string& pattern : patterns)
+    for (const std::string& pattern : SplitNames(table, lists))
         for (const std::size_t column : FindColumns(table, pattern)) found.push_back(column);
     return found;
 }
@@ -117,7 +131,8 @@ void SetPairs(ColumnPlan& plan, const TableReader& table, const ColumnOptions& o
 
 void SetAttributes(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
 {
-    for (const std::string& pattern : options.attributes.empty() ? std::vector<std::string>{"*"} : options.attributes)
+    const std::vector<std::string> all{"*"};
+    for (const std::string& pattern : SplitNames(table, options.attributes.empty() ? all : options.attributes))
         for (const std::size_t i : FindColumns(table, pattern))
         {
             Column& column = plan.columns[i];

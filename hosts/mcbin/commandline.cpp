@@ -1,6 +1,7 @@
 #include "commandline.h"
 
 #include "delimiter.h"
+#include "numbers.h"
 
 #include <mcobnqrt/binfactory.h>
 #include <mcobnqrt/binsettings.h>
@@ -10,6 +11,7 @@
 #include <limits>
 #include <map>
 #include <memory>
+#include <optional>
 #include <string>
 
 namespace
@@ -53,11 +55,32 @@ CLI::Validator MakeDelimiterCheck()
                           "", "");
 }
 
-/// A list that is given with commas, by repeating the option, or both; it doesn't swallow what follows.
+/// CLI::Range lets a NaN pass.
+CLI::Validator MakeRatioCheck()
+{
+    const auto isRatio = [](const std::string& text)
+    {
+        const std::optional<double> ratio = ParseNumber(text);
+        return ratio && *ratio >= 0.0 && *ratio <= 1.0;
+    };
+    return CLI::Validator([isRatio](const std::string& text)
+                          { return isRatio(text) ? "" : "'" + text + "' is no number from 0 to 1"; },
+                          "", "");
+}
+
+/// A list that may be given by repeating the option; it doesn't swallow what follows.
+CLI::Option* AddRepeated(CLI::App& command, const std::string& name, std::vector<std::string>& list,
+                         const std::string& description, const std::string& what)
+{
+    return command.add_option(name, list, description)->allow_extra_args(false)->option_text(what);
+}
+
+/// The same that may be given with commas, too. Names of columns may hold some: their lists are split where the columns
+/// are known.
 CLI::Option* AddList(CLI::App& command, const std::string& name, std::vector<std::string>& list,
                      const std::string& description, const std::string& what)
 {
-    return command.add_option(name, list, description)->allow_extra_args(false)->delimiter(',')->option_text(what);
+    return AddRepeated(command, name, list, description, what)->delimiter(',');
 }
 
 void AddTable(CLI::App& command, TableOptions& table)
@@ -88,10 +111,10 @@ void AddMissing(CLI::App& command, std::vector<std::string>& missingText, bool& 
 
 void AddColumns(CLI::App& command, ColumnOptions& columns)
 {
-    AddList(command, "--attributes", columns.attributes,
-            "The columns to bin; names or patterns such as 'x_*'. All columns of numbers if not given", "NAME,...")
+    AddRepeated(command, "--attributes", columns.attributes,
+                "The columns to bin; names or patterns such as 'x_*'. All columns of numbers if not given", "NAME,...")
         ->group("Columns");
-    AddList(command, "--exclude", columns.exclude, "Columns not to bin; names or patterns", "NAME,...")
+    AddRepeated(command, "--exclude", columns.exclude, "Columns not to bin; names or patterns", "NAME,...")
         ->group("Columns");
     command.add_option("--weight", columns.weight, "The column that tells how many cases a row stands for")
         ->option_text("NAME")
@@ -105,19 +128,18 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
         ->check(CLI::IsMember({"truncate", "closest"}))
         ->option_text("truncate|closest")
         ->group("Columns");
-    AddList(command, "--categorical", columns.categorical,
-            "Columns of categories, also if they are numbers; an attribute's are binned in sorted order", "NAME,...")
+    AddRepeated(command, "--categorical", columns.categorical,
+                "Columns of categories, also if they are numbers; an attribute's are binned in sorted order",
+                "NAME,...")
         ->group("Columns");
-    AddList(command, "--continuous", columns.continuous, "Columns of numbers, also if most fields are something else",
-            "NAME,...")
+    AddRepeated(command, "--continuous", columns.continuous,
+                "Columns of numbers, also if most fields are something else", "NAME,...")
         ->group("Columns");
     AddMissing(command, columns.missingText, columns.isBadMissing);
-    command
-        .add_option("--missing", columns.missing,
-                    "Values of one column that count as missing, and at most one interval of them, both ends included; "
-                    "may be repeated")
-        ->allow_extra_args(false)
-        ->option_text("COLUMN=9,90:99")
+    AddRepeated(command, "--missing", columns.missing,
+                "Values of one column that count as missing, and at most one interval of them, both ends included; may "
+                "be repeated",
+                "COLUMN=9,90:99")
         ->group("Input");
 }
 
@@ -196,7 +218,7 @@ void AddSupervised(CLI::App& app, Request& request)
     command
         .add_option("--small-bins", settings.smallBins,
                     "An inner bin of less than this share of its lighter neighbour's weight is merged, from 0 to 1")
-        ->check(CLI::Range(0.0, 1.0))
+        ->check(MakeRatioCheck())
         ->option_text("RATIO")
         ->group("Settings");
     AddSettings(command, settings);

@@ -104,6 +104,18 @@ std::string FormatInterval(const Findings& findings, const Bin& bin)
            (isLast ? "+inf)" : FormatNumber(bin.right) + (isRightClosed ? "]" : ")"));
 }
 
+std::string DescribeValues(const Findings& findings, const Result& result)
+{
+    const Variable& attribute = findings.GetAttribute(result);
+    const auto format = [&](const std::optional<double>& value)
+    {
+        const bool isCode = attribute.IsCategorical() && value;
+        return isCode ? Quote(Shorten(attribute.categories.at(static_cast<std::size_t>(*value)))) : FormatFigure(value);
+    };
+    return std::to_string(result.distinctValues) + (attribute.IsCategorical() ? " categories" : " distinct values") +
+           " from " + format(result.minimum) + " to " + format(result.maximum);
+}
+
 std::vector<std::string> GetBinCategories(const Findings& findings, const Result& result, const Bin& bin)
 {
     const std::vector<std::string>& all = findings.GetAttribute(result).categories;

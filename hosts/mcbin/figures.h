@@ -46,6 +46,9 @@ std::vector<const Result*> GetUncut(const Findings& findings);
 /// "(1.5, 4]", with the bracket at the end that is closed; "(-inf, 1.5]" and "(4, +inf)" at the outside.
 std::string FormatInterval(const Findings& findings, const Bin& bin);
 
+/// What values the attribute has, as in "22 distinct values from 0.1 to 2.5", or "3 categories from 'high' to 'low'".
+std::string DescribeValues(const Findings& findings, const Result& result);
+
 /// The categories of a categorical attribute that are in the bin, which must be one of the result's; of another attribute
 /// none.
 std::vector<std::string> GetBinCategories(const Findings& findings, const Result& result, const Bin& bin);

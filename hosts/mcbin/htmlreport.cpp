@@ -109,14 +109,13 @@ void PrintBins(std::ostream& os, const Findings& findings, const Result& result)
     os << "</table></div>\n";
 }
 
-void PrintFigures(std::ostream& os, const Result& result)
+void PrintFigures(std::ostream& os, const Findings& findings, const Result& result)
 {
     os << "<p>";
     if (result.targetEntropy && result.modelEntropy)
         os << fmt::format("Gain {:.4f} bits: entropy ", GetGain(result)) << FormatNumber(*result.targetEntropy)
            << " before, " << FormatNumber(*result.modelEntropy) << " after. ";
-    os << result.distinctValues << " distinct values from " << FormatFigure(result.minimum) << " to "
-       << FormatFigure(result.maximum) << ", missing weight " << FormatMissing(result) << '.';
+    os << EscapeHtml(DescribeValues(findings, result)) << ", missing weight " << FormatMissing(result) << '.';
     if (!result.status.IsOK())
         os << ' ' << EscapeHtml(DescribeStatus(result.status)) << '.';
     os << "</p>\n";
@@ -125,7 +124,7 @@ void PrintFigures(std::ostream& os, const Result& result)
 void PrintAttribute(std::ostream& os, const Findings& findings, const Result& result, std::size_t rank)
 {
     os << "<section id=\"a" << rank << "\">\n<h2>" << GetHeading(findings, result) << "</h2>\n";
-    PrintFigures(os, result);
+    PrintFigures(os, findings, result);
     PrintChart(os, findings, result);
     PrintBins(os, findings, result);
     os << "</section>\n";

@@ -36,8 +36,7 @@ void PrintHeading(std::ostream& os, const Findings& findings, const Result& resu
     if (result.targetEntropy && result.modelEntropy)
         os << "  entropy " << FormatNumber(*result.targetEntropy) << " before, " << FormatNumber(*result.modelEntropy)
            << " after\n";
-    os << "  " << result.distinctValues << " distinct values from " << FormatFigure(result.minimum) << " to "
-       << FormatFigure(result.maximum) << ", missing weight "
+    os << "  " << DescribeValues(findings, result) << ", missing weight "
        << FormatDifference(result.weightWithMissing - result.weight) << '\n';
 }
 

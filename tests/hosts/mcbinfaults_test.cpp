@@ -104,8 +104,8 @@ TEST_F(McbinFaults, BadArgumentsAreAUsageError)
          {"", "guess data.csv", "supervised data.csv", "supervised --target y", "equal-frequency data.csv --bins 1",
           "equal-frequency data.csv --bins many", "supervised data.csv more --target y",
           "supervised data.csv --target y --pairs x:y", "supervised data.csv --target y --closed both",
-          "supervised data.csv --target y --small-bins 2", "equal-frequency data.csv --delimiter ab",
-          "equal-frequency data.csv --report -", "apply bins.json"})
+          "supervised data.csv --target y --small-bins 2", "supervised data.csv --target y --small-bins nan",
+          "equal-frequency data.csv --delimiter ab", "equal-frequency data.csv --report -", "apply bins.json"})
     {
         const Outcome outcome = Run(arguments);
         EXPECT_EQ(2, outcome.exitCode) << arguments;

@@ -252,12 +252,14 @@ TEST_F(McbinInput, WeightsAreRoundedAndRowsWithoutOneCountNowhere)
 
 TEST_F(McbinInput, ColumnsAreChosenByNameAndPatternAndTheirKindsOverruled)
 {
-    const std::string data = "x_1,x_2,y,grade,flag\n1,5,no,b,0\n2,6,no,c,1\n3,7,yes,a,0\n4,8,yes,a,1\n";
+    const std::string data =
+        "x_1,x_2,y,grade,flag,\"x_1,y\"\n1,5,no,b,0,1\n2,6,no,c,1,1\n3,7,yes,a,0,2\n4,8,yes,a,1,2\n";
     const auto attributes = [&](const std::string& options)
     { return RunOn(data, "equal-frequency", "--bins 2 --format csv " + options + " | cut -d, -f1 | uniq").out; };
 
-    EXPECT_EQ("attribute\nx_1\nx_2\nflag\n", attributes(""));
-    EXPECT_EQ("attribute\nx_1\nx_2\n", attributes("--attributes 'x_*'"));
+    EXPECT_EQ("attribute\nx_1\nx_2\nflag\n", attributes("--exclude x_1,y"));
+    EXPECT_EQ("attribute\n\"x_1\n", attributes("--attributes x_1,y")) << "the column of this name, with its comma";
+    EXPECT_EQ("attribute\nx_1\nx_2\n", attributes("--attributes 'x_?'"));
     EXPECT_EQ("attribute\nx_2\n", attributes("--attributes 'x_?' --exclude x_1"));
     EXPECT_EQ("attribute\nx_1\ngrade\n", attributes("--attributes x_1,grade --categorical grade"));
     EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "--attributes grade").err.find("--categorical"));

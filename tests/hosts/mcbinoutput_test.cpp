@@ -54,6 +54,22 @@ Without cut points:
               outcome.out);
 }
 
+TEST_F(McbinOutput, BinsOfACategoricalAttributeAreSetsOfItsCategories)
+{
+    const Outcome outcome = RunOn("g\nlow\nlow\nmid\nmid\nhigh\n\"a, b\"\n", "equal-frequency",
+                                  "--bins 2 --attributes g --categorical g --report page.html");
+
+    EXPECT_EQ(R"(g
+  4 categories from 'a, b' to 'mid', missing weight 0
+  bin                weight  share
+  {a, b, high, low}       4  66.7%  ██████████████████████████████
+  {mid}                   2  33.3%  ███████████████
+
+)",
+              outcome.out);
+    EXPECT_NE(std::string::npos, ReadFile(fData.File("page.html")).find("4 categories from 'a, b' to 'mid'"));
+}
+
 TEST_F(McbinOutput, MoreCategoriesThanShadesShareTheLastOne)
 {
     const Outcome outcome = RunOn(MakeVisitors(), "supervised", "--target kind --attributes age");
