@@ -8,8 +8,14 @@ namespace
 
 volatile std::sig_atomic_t gInterrupted = 0;
 
-void NoteSignal(int)
+void NoteSignal(int signal)
 {
+    if (gInterrupted != 0)
+    {
+        // The second one, of whatever kind, meets what the system does by itself, as soon as this has returned.
+        std::signal(signal, SIG_DFL);
+        std::raise(signal);
+    }
     gInterrupted = 1;
 }
 
@@ -17,10 +23,8 @@ void NoteSignal(int)
 
 void CatchSignals()
 {
-    struct sigaction action = {};
+    struct sigaction action = {}; // without SA_RESTART, so that a wait for input ends
     action.sa_handler = NoteSignal;
-    // The second one meets what the system does by itself. Without SA_RESTART, so that a wait for input ends.
-    action.sa_flags = static_cast<int>(SA_RESETHAND);
     for (const int signal : {SIGINT, SIGTERM, SIGHUP})
     {
         struct sigaction former = {};

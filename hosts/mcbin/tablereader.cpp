@@ -44,9 +44,13 @@ std::size_t TableReader::FindColumn(const std::string& name) const
     const auto place = std::find(fColumnNames.begin(), fColumnNames.end(), name);
     if (place != fColumnNames.end())
         return static_cast<std::size_t>(place - fColumnNames.begin());
-    std::string columns;
-    for (const std::string& column : fColumnNames) columns += (columns.empty() ? "" : ", ") + Quote(column);
-    throw MakeFailure("no column is named " + Quote(name) + "; there are " + columns);
+    constexpr std::size_t kMostNames = 20;
+    std::vector<std::string> some;
+    for (std::size_t i = 0; i < std::min(kMostNames, fColumnNames.size()); ++i)
+        some.push_back(Quote(Shorten(fColumnNames[i])));
+    const std::size_t others = fColumnNames.size() - some.size();
+    throw MakeFailure("no column is named " + Quote(name) + "; there are " + Join(some, ", ") +
+                      (others > 0 ? " and " + std::to_string(others) + " more" : ""));
 }
 
 const CsvRow* TableReader::NextRow()

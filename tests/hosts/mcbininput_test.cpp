@@ -265,6 +265,9 @@ TEST_F(McbinInput, ColumnsAreChosenByNameAndPatternAndTheirKindsOverruled)
     EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "--attributes grade").err.find("--categorical"));
     EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "--continuous y --attributes y").err.find("line 2"));
     EXPECT_NE(std::string::npos, RunOn(data, "supervised", "--target x_1 --attributes y").err.find("holds text"));
+    EXPECT_NE(std::string::npos, RunOn(std::string(24, ';') + "last\n", "supervised", "--target y")
+                                     .err.find("no column is named 'y'; there are 'column 1', 'column 2', "));
+    EXPECT_NE(std::string::npos, Run("supervised data.csv --target y").err.find("'column 20' and 5 more\n"));
 }
 
 TEST_F(McbinInput, PairsBinForSeveralTargetsInOnePass)
