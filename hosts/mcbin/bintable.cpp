@@ -77,7 +77,7 @@ std::vector<std::string> MakeHead(const Findings& findings, const Result& result
 /// The interval, or as many of the bin's categories as have room.
 std::string MakeLabel(const Findings& findings, const Result& result, const Bin& bin, std::size_t width)
 {
-    const std::string label = Printable(FormatBin(findings, result, bin));
+    std::string label = Printable(FormatBin(findings, result, bin));
     std::vector<std::string> categories = GetBinCategories(findings, result, bin);
     if (categories.empty() || GetWidth(label) <= width)
         return label;
