@@ -9,6 +9,11 @@
 namespace
 {
 
+std::string PickGrade(int row)
+{
+    return row % 41 == 0 ? "" : row % 43 == 0 ? "it's" : row < 120 ? "a" : row < 200 ? "b" : "c";
+}
+
 /// Rows with weights, missing values of each kind, and values on cut points. The category "k1" to "k3" of the rows rises
 /// with x, and "grade" with it.
 std::string MakeCustomers()
@@ -17,9 +22,8 @@ std::string MakeCustomers()
     for (int i = 0; i < 300; ++i)
     {
         const std::string x = i % 29 == 0 ? "" : i % 31 == 0 ? "?" : i % 37 == 0 ? "-9" : std::to_string(i / 2 * 0.5);
-        const std::string grade = i % 41 == 0 ? "" : i % 43 == 0 ? "it's" : i < 120 ? "a" : i < 200 ? "b" : "c";
         const char* y = (i < 100) != (i % 17 == 0) ? "k1" : (i < 200) != (i % 13 == 0) ? "k2" : "k3";
-        data += std::to_string(i) + "," + x + "," + std::to_string(i / 7) + "," + grade + "," + y + "," +
+        data += std::to_string(i) + "," + x + "," + std::to_string(i / 7) + "," + PickGrade(i) + "," + y + "," +
                 std::to_string(i % 4) + "\n";
     }
     return data;
