@@ -92,7 +92,8 @@ void AddBin(Result& result, double weight, const std::vector<double>& weights)
     result.bins.push_back(bin);
 }
 
-/// The library takes numbers alone as missing values of a continuous variable. Texts are known beside it, for all columns.
+/// The library takes numbers alone as missing values of a continuous variable. Texts are known beside it, for all
+/// columns.
 void AddMissingTexts(Findings& findings, const Column& column)
 {
     if (column.kind != ColumnKind::kCategorical)

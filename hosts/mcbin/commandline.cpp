@@ -19,8 +19,8 @@ namespace
 
 constexpr int kMost = std::numeric_limits<int>::max();
 
-/// A supervised run refuses to work without a number of bins, but uses it for pre-binning alone, which is off as long as
-/// no distinct value threshold is set. With 1000 bins pre-binning costs hardly any precision: a border is off by a
+/// A supervised run refuses to work without a number of bins, but uses it for pre-binning alone, which is off as long
+/// as no distinct value threshold is set. With 1000 bins pre-binning costs hardly any precision: a border is off by a
 /// thousandth of the weight at most.
 constexpr int kPreBins = 1000;
 

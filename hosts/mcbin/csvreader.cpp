@@ -9,8 +9,8 @@
 #include <utility>
 
 // Almost every line of almost every file has no quote. Such a line is a row, and is cut at its delimiters where it
-// stands in the buffer: libcsv, which goes character by character and copies, needs six times as long. It gets the lines
-// from one with a quote on, until the row that began there has ended; so all that makes the format hard is its.
+// stands in the buffer: libcsv, which goes character by character and copies, needs six times as long. It gets the
+// lines from one with a quote on, until the row that began there has ended; so all that makes the format hard is its.
 
 namespace
 {
@@ -110,7 +110,8 @@ void CsvReader::ReadBeginning()
     fSpecial = fBegin;
 }
 
-/// Finds the end of the line at fBegin, or of a part of it that is one for the parser. \return false at the end of the file.
+/// Finds the end of the line at fBegin, or of a part of it that is one for the parser. \return false at the end of the
+/// file.
 bool CsvReader::FindLine()
 {
     const char* searched = fBegin;
@@ -134,8 +135,8 @@ bool CsvReader::FindLine()
     }
 }
 
-/// Moves what is left to the front of the buffer, which grows if that fills it, and reads on behind it. \return false if
-/// there is nothing more.
+/// Moves what is left to the front of the buffer, which grows if that fills it, and reads on behind it. \return false
+/// if there is nothing more.
 bool CsvReader::Refill()
 {
     if (fFileRead)

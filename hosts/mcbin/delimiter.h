@@ -9,7 +9,8 @@
 /// an end.
 char DetectDelimiter(std::string_view text);
 
-/// The delimiter that a user has named: a single character, or "comma", "tab", "\t", "semicolon", "bar", "pipe", "space".
+/// The delimiter that a user has named: a single character, or "comma", "tab", "\t", "semicolon", "bar", "pipe",
+/// "space".
 /// '\0' if it is none of these, or a character that can't be one.
 char ParseDelimiter(std::string_view name);
 

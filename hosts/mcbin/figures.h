@@ -49,15 +49,15 @@ std::string FormatInterval(const Findings& findings, const Bin& bin);
 /// What values the attribute has, as in "22 distinct values from 0.1 to 2.5", or "3 categories from 'high' to 'low'".
 std::string DescribeValues(const Findings& findings, const Result& result);
 
-/// The categories of a categorical attribute that are in the bin, which must be one of the result's; of another attribute
-/// none.
+/// The categories of a categorical attribute that are in the bin, which must be one of the result's; of another
+/// attribute none.
 std::vector<std::string> GetBinCategories(const Findings& findings, const Result& result, const Bin& bin);
 
 /// The interval, or for a categorical attribute its categories in the bin, as in "{a, b}".
 std::string FormatBin(const Findings& findings, const Result& result, const Bin& bin);
 
-/// The name of the column that holds the attribute's bins in new data: "age_bin", or, where the attribute has been binned
-/// for more than one target, "age_by_bought_bin".
+/// The name of the column that holds the attribute's bins in new data: "age_bin", or, where the attribute has been
+/// binned for more than one target, "age_by_bought_bin".
 std::string GetBinColumn(const Findings& findings, const Result& result);
 
 /// The bin of the value, from 0. What lies outside of the range seen belongs to an outer bin.

@@ -172,7 +172,8 @@ Bin GetBin(const Json& json)
     return bin;
 }
 
-/// Whether the bins lie between the cut points, which so can't be NaN, and hold a weight for each category of the target.
+/// Whether the bins lie between the cut points, which so can't be NaN, and hold a weight for each category of the
+/// target.
 bool AreBetween(const std::vector<Bin>& bins, const std::vector<double>& cuts, std::size_t nCategories)
 {
     constexpr double kInfinity = std::numeric_limits<double>::infinity();

@@ -5,9 +5,9 @@
 #include <string>
 #include <string_view>
 
-/// The number that the whole of `text` spells with a decimal point, such as "-1", "+.5" or "2.5e-3", whatever the locale.
-/// Spaces around it don't count, and what is nearer to 0 than any double is 0. Nothing for all else: other text, even
-/// behind a number; a number that is too large for a double; "inf" and "nan".
+/// The number that the whole of `text` spells with a decimal point, such as "-1", "+.5" or "2.5e-3", whatever the
+/// locale. Spaces around it don't count, and what is nearer to 0 than any double is 0. Nothing for all else: other
+/// text, even behind a number; a number that is too large for a double; "inf" and "nan".
 std::optional<double> ParseNumber(std::string_view text);
 
 /// Whether ParseNumber() gives a number; in less time where it plainly does.

@@ -10,8 +10,8 @@
 
 // What a user can ask for. main() fills these from the command line.
 
-/// Which columns take part, and how their fields are read. A name may be a pattern, with * and ? and [], and an element of
-/// a list of names may be several with commas between them.
+/// Which columns take part, and how their fields are read. A name may be a pattern, with * and ? and [], and an element
+/// of a list of names may be several with commas between them.
 struct ColumnOptions
 {
     std::string target; ///< a name, not a pattern; empty without one

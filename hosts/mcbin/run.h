@@ -8,7 +8,8 @@ class TableReader;
 
 /// Reads the table twice, for its columns and for its records, and has the library bin it.
 ///
-/// A signal that asks for the end stops it, and what has been found so far is given, with the status BINStatusCancelled.
+/// A signal that asks for the end stops it, and what has been found so far is given, with the status
+/// BINStatusCancelled.
 /// \throw Failure if the table can't be analysed, Interrupted if a signal came before there was anything to tell.
 Findings FindBins(TableReader& table, const BinOptions& options, Progress& progress);
 

@@ -5,8 +5,8 @@ class Progress;
 class TableReader;
 struct ColumnPlan;
 
-/// Reads the table to its end, and so finds out what the columns of the plan hold: their kinds, where these aren't given,
-/// their categories, and the number of rows. Memory doesn't grow with that number.
+/// Reads the table to its end, and so finds out what the columns of the plan hold: their kinds, where these aren't
+/// given, their categories, and the number of rows. Memory doesn't grow with that number.
 ///
 /// A column without a kind is continuous if every field is a number or missing, or if at least most are, where the
 /// others are missing by the plan or else a failure. A column of text is no attribute any more.

@@ -32,7 +32,8 @@ public:
     char GetDelimiter() const { return fReader.GetDelimiter(); }
     const std::string& GetName() const { return fReader.GetName(); }
 
-    /// The place of the column, from 0. \throw Failure, which tells what columns there are, if there is none of the name.
+    /// The place of the column, from 0. \throw Failure, which tells what columns there are, if there is none of the
+    /// name.
     std::size_t FindColumn(const std::string& name) const;
 
     /// The next row below the header, with as many fields as there are columns, or null at the end. It stays the

@@ -14,8 +14,8 @@ std::string PickGrade(int row)
     return row % 41 == 0 ? "" : row % 43 == 0 ? "it's" : row < 120 ? "a" : row < 200 ? "b" : "c";
 }
 
-/// Rows with weights, missing values of each kind, and values on cut points. The category "k1" to "k3" of the rows rises
-/// with x, and "grade" with it.
+/// Rows with weights, missing values of each kind, and values on cut points. The category "k1" to "k3" of the rows
+/// rises with x, and "grade" with it.
 std::string MakeCustomers()
 {
     std::string data = "id,x,\"od\"\"d\",grade,y,w\n";
