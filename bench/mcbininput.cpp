@@ -25,6 +25,7 @@ void Time(const char* file, const char* target)
 {
     TableOptions tableOptions;
     tableOptions.file = file;
+    tableOptions.isReadTwice = true;
     ColumnOptions columns;
     columns.target = target;
     Progress progress(false);
