@@ -30,8 +30,8 @@ void Run(IBINAlgorithm& algorithm, IBINRecordSource* source, int attribute)
 
 void PrintAttribute(IBINAlgorithm& algorithm, int attribute, std::size_t numRecords, int numTurns)
 {
-    std::vector<double> seconds;
-    for (int turn = 0; turn < numTurns; ++turn) seconds.push_back(Seconds([&] { Run(algorithm, nullptr, attribute); }));
+    std::vector<double> seconds(static_cast<std::size_t>(numTurns));
+    for (double& turn : seconds) turn = Seconds([&] { Run(algorithm, nullptr, attribute); });
     const double median = Median(seconds);
     const auto n = static_cast<double>(numRecords);
 

@@ -37,8 +37,7 @@ void Time(const char* file, const char* target)
     const Variables variables = MakeVariables(plan, columns.rounding);
     const double profile = GetSeconds(begin);
     TableRecordSource source(table, plan, variables, progress);
-    while (source.HasNext())
-        source.Next();
+    while (source.HasNext()) source.Next();
     std::printf("%.3f %.3f\n", profile, GetSeconds(begin) - profile);
 }
 

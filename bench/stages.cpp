@@ -106,7 +106,7 @@ void Pass(benchmark::State& state)
     const Workload workload = MakeContinuous(kMillion / 10, std::vector<double>(10, 1.0), 3);
     const TempDir directory;
     BINVarList list = ListOf(workload);
-    for (auto turn : state)
+    while (state.KeepRunning())
     {
         ColumnSource source(workload);
         BINCancelMonitor monitor(nullptr);
@@ -120,7 +120,7 @@ BENCHMARK(Pass)->Unit(benchmark::kMillisecond);
 void Load(benchmark::State& state)
 {
     BINAlgorithmPeer binned(kMillion, 3); // of its own: its tuples are not sorted any more
-    for (auto turn : state) binned.Load();
+    while (state.KeepRunning()) binned.Load();
     CountItems(state, kMillion);
 }
 BENCHMARK(Load)->Unit(benchmark::kMillisecond);
@@ -152,7 +152,7 @@ void Sort(benchmark::State& state, MakeValue makeValue, TieOrder ties)
         unsorted.push_back(
             {makeValue(workload.fColumns[0][i], i), static_cast<std::uint8_t>(workload.fTarget[i]), 1.0});
     std::vector<BINSortTuple> tuples;
-    for (auto turn : state)
+    while (state.KeepRunning())
     {
         state.PauseTiming();
         tuples = unsorted;
@@ -173,7 +173,7 @@ BENCHMARK_SORT(nearlySorted_complete, NearlySorted, TieOrder::kComplete);
 void Tally(benchmark::State& state)
 {
     BINAlgorithmPeer& binned = Binned(kMillion, 3);
-    for (auto turn : state) binned.Tally();
+    while (state.KeepRunning()) binned.Tally();
     CountItems(state, kMillion);
 }
 BENCHMARK(Tally)->Unit(benchmark::kMillisecond);
@@ -186,7 +186,7 @@ void Scan(benchmark::State& state, std::size_t numRecords, int numCategories, bo
     Numbers numbers(3);
     for (double& cell : table) cell *= isWhole ? 1.0 : 0.5 + numbers.Uniform();
     const int last = static_cast<int>(binned.NumRows()) - 1;
-    for (auto turn : state)
+    while (state.KeepRunning())
     {
         CutScan scan(table, static_cast<std::size_t>(numCategories), true);
         CountVector left(static_cast<std::size_t>(numCategories) + 1, 0.0);
@@ -204,7 +204,7 @@ BENCHMARK_CAPTURE(Scan, fractional_K20, kMillion / 5, 20, false)->Unit(benchmark
 void Split(benchmark::State& state, std::size_t numRecords, int numCategories)
 {
     const BINAlgorithmPeer& binned = Binned(numRecords, numCategories);
-    for (auto turn : state) state.counters["cutPoints"] = static_cast<double>(binned.Split());
+    while (state.KeepRunning()) state.counters["cutPoints"] = static_cast<double>(binned.Split());
     CountItems(state, binned.NumRows());
 }
 BENCHMARK_CAPTURE(Split, K3, kMillion, 3)->Unit(benchmark::kMillisecond);
@@ -216,7 +216,7 @@ void EqualFrequency(benchmark::State& state)
     std::vector<BINValueTuple> tuples;
     for (const double value : workload.fColumns[0]) tuples.push_back({value, 1.0});
     SortTuples(tuples, static_cast<unsigned int>(tuples.size()), TieOrder::kAny);
-    for (auto turn : state)
+    while (state.KeepRunning())
     {
         std::vector<double> cuts;
         std::vector<double> counts;
@@ -252,7 +252,7 @@ void Merge(benchmark::State& state)
 {
     const auto numBins = static_cast<std::size_t>(state.range(0));
     const BINAlgorithmPeer& binned = Binned(kMillion / 100, 3);
-    for (auto turn : state)
+    while (state.KeepRunning())
     {
         state.PauseTiming();
         std::vector<double> cells = CellsOf(numBins);
@@ -271,7 +271,7 @@ void Store(benchmark::State& state)
     const auto numBins = static_cast<std::size_t>(state.range(0));
     const std::vector<double> cells = CellsOf(numBins);
     const std::set<double> cutPoints = CutPointsOf(numBins);
-    for (auto turn : state)
+    while (state.KeepRunning())
     {
         BINOutput output;
         for (int attribute = kAttribute; attribute < kAttribute + kNumPairs; ++attribute)
