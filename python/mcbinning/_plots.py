@@ -41,7 +41,7 @@ def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> m
         ax.set_ylabel(f"share of {found.target.name}")
         ax.legend(title=found.target.name, fontsize="small")
     ax.set_xlim(0.0, 1.0)
-    ax.set_xticks(lefts[1:], [found.variable.format(cut) for cut in found.cut_points.tolist()], rotation=45, ha="right")
+    ax.set_xticks(lefts[1:], [found.variable.format(cut) for cut in found.borders.tolist()], rotation=45, ha="right")
     ax.set_xlabel(f"{found.attribute}: cut points, over the share of the weight")
     return ax
 
@@ -63,4 +63,5 @@ def plot_all(result: BinningResult, columns: int) -> matplotlib.figure.Figure:
 def _title(found: AttributeBins) -> str:
     if found.target is None or np.isnan(found.gain):
         return found.attribute
-    return f"{found.attribute}: gain {found.gain:.3g} bit"
+    gain = round(found.gain, 4) + 0.0  # without a minus in front of what is nothing
+    return f"{found.attribute}: gain {gain:.4f} bits"

@@ -107,11 +107,20 @@ class AttributeBins:
         """By how many bits the bins lower the target's entropy; NaN without a target."""
         return self.target_entropy - self.model_entropy
 
+    @property
+    def borders(self) -> Floats:
+        """The cut points as people read them. One between two days or two microseconds is shown as the nearest of these
+        that parts the same dates or timestamps."""
+        if self.variable.kind not in ("date", "timestamp"):
+            return self.cut_points
+        shown: Floats = np.floor(self.cut_points) if self.closed == "right" else np.ceil(self.cut_points)
+        return shown
+
     @cached_property
     def labels(self) -> list[str]:
         """The bins in words: an interval, or the categories that are in it."""
         if not self.variable.is_categorical:
-            return _values.intervals(self.cut_points, self.closed, self.variable.format)
+            return _values.intervals(self.borders, self.closed, self.variable.format)
         names = np.array(list(map(str, self.variable.category_names())), dtype=object)
         bins = _values.bin_numbers(np.arange(len(names), dtype=np.float64), self.cut_points, self.closed)
         return ["{" + ", ".join(names[bins == bin]) + "}" for bin in range(len(self.cut_points) + 1)]

@@ -11,8 +11,10 @@ from sqlglot import Dialect
 from . import _values
 from ._result import AttributeBins, BinningResult, Variable
 
-_WITH_NAN = ("duckdb", "postgres", "spark", "databricks", "snowflake", "bigquery", "trino", "presto", "clickhouse")
-"""Dialects whose numbers can be NaN, which then is greater than all others and would fall into the last bin."""
+# Dialects whose numbers can be NaN. Where that is greater than all others it would fall into the last bin.
+_WITH_NAN_TEST = ("duckdb", "spark", "databricks", "bigquery", "trino", "presto", "clickhouse")
+_WITH_EQUAL_NAN = ("postgres", "snowflake")
+"""They have no function that tells, but there NaN equals itself."""
 
 
 def write(result: BinningResult, dialect: str, table: str | None, labels: bool) -> str:
@@ -33,13 +35,15 @@ def _case(found: AttributeBins, dialect: str, labels: bool) -> exp.Case:
     names: list[exp.Expression] = [
         exp.Literal.string(label) if labels else exp.Literal.number(i) for i, label in enumerate(found.labels)
     ]
-    if variable.categories is not None:
-        codes = np.arange(len(variable.categories), dtype=np.float64)
-        for category, bin_number in zip(variable.categories, found.bin_numbers(codes).tolist()):
+    # A flag can be compared with a number only in some dialects; its numbers are the codes of its two values.
+    categories = (0.0, 1.0) if variable.kind == "boolean" else variable.categories
+    if categories is not None:
+        codes = np.arange(len(categories), dtype=np.float64)
+        for category, bin_number in zip(categories, found.bin_numbers(codes).tolist()):
             case = case.when(column.copy().eq(_literal(category, variable)), names[bin_number].copy())
         return case
     compare = exp.LTE if found.closed == "right" else exp.LT
-    for cut, name in zip(found.cut_points.tolist(), names):
+    for cut, name in zip(found.borders.tolist(), names):
         if math.isinf(cut) and cut > 0:
             return case.else_(name)
         case = case.when(compare(this=column.copy(), expression=_literal(cut, variable)), name)
@@ -48,8 +52,10 @@ def _case(found: AttributeBins, dialect: str, labels: bool) -> exp.Case:
 
 def _missing_conditions(variable: Variable, column: exp.Column, dialect: str) -> list[exp.Expression]:
     conditions: list[exp.Expression] = [column.copy().is_(exp.null())]
-    if variable.kind == "float" and dialect in _WITH_NAN:
+    if variable.kind == "float" and dialect in _WITH_NAN_TEST:
         conditions.append(exp.IsNan(this=column.copy()))
+    if variable.kind == "float" and dialect in _WITH_EQUAL_NAN:
+        conditions.append(column.copy().eq(exp.cast(exp.Literal.string("NaN"), exp.DataType.Type.DOUBLE)))
     if variable.missing_values:
         conditions.append(column.copy().isin(*[_literal(value, variable) for value in variable.missing_values]))
     if variable.missing_interval is not None:
@@ -63,7 +69,7 @@ def _literal(value: float | str, variable: Variable) -> exp.Expression:
     if isinstance(value, str):
         return exp.Literal.string(value)
     if variable.kind == "boolean":
-        return exp.Boolean(this=bool(value)) if variable.is_categorical else exp.Literal.number(repr(_values.plain(value)))
+        return exp.Boolean(this=bool(value))
     if variable.kind == "date":
         return exp.cast(exp.Literal.string(variable.format(value)), exp.DataType.Type.DATE)
     if variable.kind == "timestamp":

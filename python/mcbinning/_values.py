@@ -36,11 +36,14 @@ def decode(value: float, kind: str, time_zone: str = "") -> Any:
         return bool(value)
     if kind == "integer":
         return int(value) if value.is_integer() else value
-    if kind == "date":
-        return datetime.date(1970, 1, 1) + datetime.timedelta(days=value)
-    if kind == "timestamp":
-        stamp = pd.Timestamp(int(value), unit="us")
-        return stamp.tz_localize("UTC").tz_convert(time_zone) if time_zone else stamp
+    try:
+        if kind == "date":
+            return datetime.date(1970, 1, 1) + datetime.timedelta(days=math.floor(value))
+        if kind == "timestamp":
+            stamp = pd.Timestamp(math.floor(value), unit="us")
+            return stamp.tz_localize("UTC").tz_convert(time_zone) if time_zone else stamp
+    except (OverflowError, pd.errors.OutOfBoundsDatetime):
+        pass  # beyond all calendars, as DuckDB's "infinity" is: it stays a number
     return value
 
 

@@ -2,6 +2,8 @@
 
 from __future__ import annotations
 
+import datetime
+import decimal
 import json
 import sqlite3
 
@@ -73,14 +75,85 @@ def test_sql_puts_every_row_where_transform_does(rows, closed):
     assert [row[-1] for row in duckdb.sql(result.to_sql("duckdb", "table_of_rows")).fetchall()] == expected
 
 
-def test_sql_of_dates_texts_and_labels_gives_what_transform_gives(mixed):
-    frame = mixed.assign(kind=mixed["y"].str.upper())
-    result = mb.supervised_bins(frame, "y", ["stamp", "zoned", "day", "flag", "single", "kind"])
+def columns_of_many_types() -> pa.Table:
+    """Each type in steps, from below 1970 on, with nulls; a cut in the middle of the steps lies between two of them."""
+    steps = np.random.default_rng(5).permutation(np.arange(400) % 40 - 20).tolist()
+    day = datetime.date(1970, 1, 1)
+
+    def some(values: list[object]) -> list[object]:
+        return [value if step % 9 else None for value, step in zip(values, steps)]
+
+    return pa.table(
+        {
+            "whole": pa.array(some(steps), pa.int16()),
+            "paid": pa.array(some([decimal.Decimal(step) / 100 for step in steps]), pa.decimal128(9, 2)),
+            "tiny": pa.array(some([step * 1e-310 for step in steps]), pa.float64()),
+            "single": pa.array(some([step / 3 for step in steps]), pa.float32()),
+            "day": some([day + datetime.timedelta(days=step) for step in steps]),
+            "second": pa.array(some(steps), pa.timestamp("s")),
+            "stamp": pa.array(steps, pa.timestamp("us")),
+            "zoned": pa.array(some(steps), pa.timestamp("us", "Asia/Tokyo")),
+            "flag": some([step > 3 for step in steps]),
+            "text": some([f"t'{step % 7}" for step in steps]),
+            "kind": pa.array(some([f"k{step // 8}" for step in steps])).dictionary_encode(),
+            "y": ["a" if (step * 7) % 11 > 5 + (step < 0) * 3 else "b" for step in steps],
+        }
+    )
+
+
+@pytest.mark.parametrize("closed", ["right", "left"])
+@pytest.mark.parametrize("method", ["supervised", "equal-frequency"])
+def test_sql_of_every_type_puts_each_row_where_transform_does(closed, method):
+    data = columns_of_many_types()
+    names = data.column_names[:-1]
+    missing = {"whole": [3, (-7, -5)], "day": [datetime.date(1970, 1, 4), ("1970-01-08", "1970-01-10")], "text": "t'2"}
+    if method == "supervised":
+        result = mb.supervised_bins(data, "y", names, missing=missing, closed=closed)
+    else:
+        result = mb.equal_frequency_bins(data, names, missing=missing, closed=closed, n_bins=2)
+        assert result["stamp"].cut_points.tolist() == [-0.5]  # between two microseconds
+    duckdb.sql("SET TimeZone = 'America/New_York'")
+
     for labels in (False, True):
-        expected = result.transform(frame, labels=labels)
-        out = duckdb.sql(result.to_sql("duckdb", "frame", labels)).df()
-        for name in expected:
-            assert out[f"{name}_bin"].tolist() == expected[name].tolist(), name
+        expected = result.transform(data, labels)
+        placed = duckdb.sql(result.to_sql("duckdb", "data", labels)).to_arrow_table()
+        for name in names:
+            assert placed[f"{name}_bin"].to_pylist() == expected[name].to_pylist(), name
+    again = mb.BinningResult.from_json(result.to_json())
+    assert again.to_sql("duckdb", "data") == result.to_sql("duckdb", "data")
+
+
+def test_borders_are_shown_as_dates_that_part_the_same_days():
+    days = pa.table({"day": pa.array([i % 20 for i in range(60)], pa.int32()).cast(pa.date32())})
+
+    assert mb.equal_frequency_bins(days, n_bins=2)["day"].labels == ["(-inf, 1970-01-10]", "(1970-01-10, +inf)"]
+    left = mb.equal_frequency_bins(days, n_bins=2, closed="left")["day"]
+    assert left.labels == ["(-inf, 1970-01-11)", "[1970-01-11, +inf)"] and left.cut_points.tolist() == [9.5]
+
+
+def test_a_date_beyond_the_calendar_stays_a_number():
+    endless = duckdb.sql("SELECT if(range % 2 = 0, DATE '2020-01-01', 'infinity'::DATE) AS day FROM range(9)")
+    figures = mb.equal_frequency_bins(endless, n_bins=2).summary()
+
+    assert figures["minimum"][0] == datetime.date(2020, 1, 1) and figures["maximum"][0] == 2**31 - 1
+
+
+def test_sql_asks_each_dialect_for_nan_and_flags_in_its_own_words():
+    table = pa.table({"x": [float(i) for i in range(40)], "flag": [i > 9 for i in range(40)]})
+    result = mb.supervised_bins(table, "flag", ["x"])
+    flags = mb.equal_frequency_bins(table, ["flag"], n_bins=2)
+    conditions = {
+        "duckdb": "ISNAN(\"x\")",
+        "postgres": "\"x\" = CAST('NaN' AS DOUBLE PRECISION)",
+        "snowflake": "\"x\" = CAST('NaN' AS DOUBLE)",
+        "bigquery": "IS_NAN(`x`)",
+        "mysql": None,
+    }
+
+    for dialect, condition in conditions.items():
+        text = result.to_sql(dialect)
+        assert condition in text if condition else "NaN" not in text.upper(), dialect
+    assert '"flag" = FALSE' in flags.to_sql("postgres")
     with pytest.raises(ValueError, match="dialect"):
         result.to_sql("klingon")
 
