@@ -53,6 +53,9 @@ class BinningWarning(UserWarning):
         self.attribute = attribute
         self.status = status
 
+    def __reduce__(self) -> tuple[type[BinningWarning], tuple[str, Status]]:
+        return type(self), (self.attribute, self.status)
+
 
 class SingleValueWarning(BinningWarning):
     """All its valid values are equal."""

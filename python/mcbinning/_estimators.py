@@ -68,6 +68,8 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         if self.missing not in ("code", "keep"):
             raise ValueError(f"missing must be 'code' or 'keep', not {self.missing!r}")
         feed, variables, rows = self._open(X, reset=True)
+        if rows == 0:
+            raise DataError("the data have no rows")
         if codes is not None:
             if rows is not None:
                 check_consistent_length(np.empty(rows), codes)
@@ -109,13 +111,15 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
 
     def _check(self, X: Any, reset: bool) -> npt.NDArray[Any]:
         array: npt.NDArray[Any] = validate_data(self, X, reset=reset, dtype="numeric", ensure_all_finite=False)
-        # Numbers of 128 bits are the only ones that the feed can't read where they lie.
-        return array if array.dtype.itemsize <= 8 else array.astype(np.float64)
+        # Numbers of 128 bits or in the other byte order are the only ones that the feed can't read where they lie.
+        return array if array.dtype.itemsize <= 8 and array.dtype.isnative else array.astype(np.float64)
 
     def _open_table(self, X: Any, reset: bool) -> tuple[_core.Feed, list[Variable], int | None]:
         source = open_source(X)
         named = X if isinstance(X, pd.DataFrame) else pd.DataFrame(columns=[column.name for column in source.columns])
         validate_data(self, named, reset=reset, skip_check_array=True)
+        if not source.columns:
+            raise DataError("there are no columns")
         feed = _core.Feed(source.open(None))
         for i, column in enumerate(source.columns):
             feed.add_variable(column.name, "attribute", column=i)
@@ -296,7 +300,10 @@ class EqualFrequencyBinner(_Binner):
 
 def _code_target(y: Any) -> tuple[npt.NDArray[Any], npt.NDArray[np.uint8]]:
     """The categories in ascending order, and the code of each row."""
-    y = column_or_1d(check_array(y, ensure_2d=False, dtype=None, ensure_min_samples=0, input_name="y"), warn=True)
+    y = check_array(
+        y, ensure_2d=False, dtype=None, ensure_all_finite="allow-nan", ensure_min_samples=0, input_name="y"
+    )
+    y = column_or_1d(y, warn=True)
     codes, classes = pd.factorize(y, sort=True)
     if (codes < 0).any():
         raise DataError("the target is missing", "y", int((codes < 0).argmax()))

@@ -2,6 +2,7 @@
 
 from __future__ import annotations
 
+import numbers
 import os
 import tempfile
 import warnings
@@ -15,12 +16,14 @@ from . import _core, _values
 from ._errors import BinningError, DataError, warning_of
 from ._progress import Progress, reporting
 from ._result import AttributeBins, BinningResult, Settings, Variable
-from ._sources import Column, Source, open_source
-from ._status import Status
+from ._sources import Column, Source, check_names, open_source
+from ._status import NO_RECORDS, Status
 
 Missing = Mapping[str, Any]
 """By column: the value that stands for missing, or a list of such values. A tuple of two numbers among them is an
 interval, both ends included; there is at most one."""
+
+_LARGEST_INT = 2**31 - 1
 
 
 def supervised_bins(
@@ -52,9 +55,11 @@ def supervised_bins(
     """
     if (target is None) == (pairs is None):
         raise TypeError("either target or pairs must be given")
+    if pairs is not None and attributes is not None:
+        raise TypeError("pairs name the attributes, so attributes can't be given, too")
     source = open_source(data)
     if pairs is not None:
-        wanted = [(str(attribute), str(category)) for attribute, category in pairs]
+        wanted = list(dict.fromkeys((str(attribute), str(category)) for attribute, category in pairs))
     else:
         assert target is not None
         names = _names_to_bin(source, attributes, [target, weight])
@@ -116,12 +121,16 @@ def check_settings(
 ) -> None:
     if closed not in ("right", "left"):
         raise ValueError(f"closed must be 'right' or 'left', not {closed!r}")
-    if n_bins < 2:
-        raise ValueError(f"n_bins must be at least 2, not {n_bins}")
-    if max_distinct is not None and max_distinct < 1:
-        raise ValueError(f"max_distinct must be at least 1 or None, not {max_distinct}")
+    _check_whole("n_bins", n_bins, 2)
+    if max_distinct is not None:
+        _check_whole("max_distinct", max_distinct, 1)
     if not 0.0 <= small_bin_ratio <= 1.0:
         raise ValueError(f"small_bin_ratio must be from 0 to 1, not {small_bin_ratio}")
+
+
+def _check_whole(name: str, value: Any, least: int) -> None:
+    if not isinstance(value, numbers.Integral) or not least <= int(value) <= _LARGEST_INT:
+        raise ValueError(f"{name} must be a whole number of at least {least}, not {value!r}")
 
 
 def make_result(
@@ -136,6 +145,8 @@ def make_result(
     """The result of a run, whose warnings become Python's. \\raise BinningError if it failed as a whole."""
     fields, entries, records, version = outcome
     status = Status.from_core(fields)
+    if status.code == NO_RECORDS and records == 0:
+        raise DataError("the data have no rows")
     if status.is_error:
         raise BinningError(status)
     bins = tuple(_attribute_bins(entry, variables, settings.closed) for entry in entries)
@@ -202,8 +213,8 @@ def parse_missing(declared: Any, kind: str) -> tuple[tuple[Any, ...], tuple[floa
     items = declared if isinstance(declared, (list, set, frozenset, np.ndarray)) else [declared]
     intervals = [item for item in items if isinstance(item, tuple)]
     values = [item for item in items if not isinstance(item, tuple)]
-    if len(intervals) > 1:
-        raise ValueError("at most one interval of a column can be declared missing")
+    if len(intervals) > 1 or any(len(ends) != 2 for ends in intervals):
+        raise ValueError("at most one interval, of two ends, can be declared missing")
     if kind == "text":
         if intervals:
             raise ValueError("an interval of texts can't be declared missing")
@@ -212,6 +223,8 @@ def parse_missing(declared: Any, kind: str) -> tuple[tuple[Any, ...], tuple[floa
     if not intervals:
         return numbers, None
     left, right = (_values.encode(end, kind) for end in intervals[0])
+    if not left <= right:
+        raise ValueError(f"the interval {intervals[0]} begins above its end")
     return numbers, (left, right)
 
 
@@ -227,12 +240,9 @@ class _Plan:
     missing: Missing
 
     def __post_init__(self) -> None:
-        known = {column.name for column in self.source.columns}
-        for name in [*self.names, *self.missing]:
-            if name not in known:
-                raise DataError("there is no such column", name)
-            if [column.name for column in self.source.columns].count(name) > 1:
-                raise DataError("there are several columns of this name", name)
+        check_names(self.source, [*self.names, *self.missing])
+        if not self.pairs:
+            raise DataError("there is nothing to bin: no attribute is named")
         for attribute, target in self.pairs:
             if attribute == target:
                 raise DataError("the column can't be attribute and target at once", attribute)
@@ -284,7 +294,10 @@ class _Plan:
         return "category" if name in self.targets or self._column(name).kind == "text" else "attribute"
 
     def _missing(self, name: str) -> tuple[tuple[Any, ...], tuple[float, float] | None]:
-        return parse_missing(self.missing.get(name, []), self._column(name).kind)
+        try:
+            return parse_missing(self.missing.get(name, []), self._column(name).kind)
+        except (TypeError, ValueError, OverflowError) as error:
+            raise DataError(f"what is declared missing can't be used: {error}", name) from error
 
     def _make_feed(self, names: list[str]) -> _core.Feed:
         table = self.source.open(names)

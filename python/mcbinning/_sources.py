@@ -2,11 +2,15 @@
 
 from __future__ import annotations
 
+import errno
+import glob
 import os
 from collections.abc import Callable, Sequence
 from dataclasses import dataclass
 from functools import cached_property
 from typing import Any
+
+import numpy as np
 
 from . import _core
 from ._errors import DataError
@@ -47,6 +51,16 @@ class Source:
     @cached_property
     def columns(self) -> tuple[Column, ...]:
         return columns_of(self.peek() if self.peek else self.open(None))
+
+
+def check_names(source: Source, names: Sequence[str]) -> None:
+    """Each is that of one column."""
+    known = [column.name for column in source.columns]
+    for name in names:
+        if name not in known:
+            raise DataError("there is no such column", name)
+        if known.count(name) > 1:
+            raise DataError("there are several columns of this name", name)
 
 
 def columns_of(table: _core.Table) -> tuple[Column, ...]:
@@ -100,7 +114,7 @@ def _open_relation(relation: Any, name: str | None = None) -> Source:
 def _read(relation: Any) -> _core.Table:
     """In small batches: DuckDB holds several, and those of wide tables are large."""
     begin = getattr(relation, "to_arrow_reader", None) or relation.fetch_record_batch
-    return _iterate(begin(_ROWS_AT_ONCE))
+    return _stream(begin(_ROWS_AT_ONCE))
 
 
 def _open_path(path: str) -> Source:
@@ -112,21 +126,37 @@ def _open_path(path: str) -> Source:
     # above all one on its cache, which could grow to the size of the file.
     connection = duckdb.connect(config={"threads": 1, "memory_limit": "128MB"})
     connection.execute("SET enable_progress_bar = false")
-    return _open_relation(connection.sql(f"SELECT * FROM {function}($path)", params={"path": path}), path)
+    try:
+        relation = connection.sql(f"SELECT * FROM {function}($path)", params={"path": path})
+    except duckdb.Error as error:
+        if "://" not in path and not glob.glob(os.path.expanduser(path), recursive=True):
+            raise FileNotFoundError(errno.ENOENT, os.strerror(errno.ENOENT), path) from None
+        raise DataError(f"{path} can't be read: {error}") from error
+    return _open_relation(relation, path)
 
 
 def _open_pandas(frame: Any) -> Source:
     import pyarrow as pa
 
+    all_names = [str(name) for name in frame.columns]
+
     def open_columns(names: Sequence[str] | None) -> _core.Table:
-        chosen = frame if names is None else frame[list(names)]
-        try:
-            table = pa.Table.from_pandas(chosen, preserve_index=False)
-        except (pa.ArrowInvalid, pa.ArrowTypeError, pa.ArrowNotImplementedError) as error:
-            raise DataError(" ".join(map(str, error.args))) from error
-        return _stream(table)
+        places = range(len(all_names)) if names is None else [all_names.index(name) for name in names]
+        chosen = [all_names[place] for place in places]
+        return _stream(pa.Table.from_arrays([_convert(frame.iloc[:, i], all_names[i]) for i in places], names=chosen))
 
     return Source(open_columns, False, rows=len(frame))
+
+
+def _convert(column: Any, name: str) -> Any:
+    """As an Arrow array. None and NA become nulls; a NaN among plain floats stays one, and their memory is used as it is."""
+    import pyarrow as pa
+
+    is_plain_float = isinstance(column.dtype, np.dtype) and column.dtype.kind == "f"
+    try:
+        return pa.array(column, from_pandas=not is_plain_float)
+    except (pa.ArrowInvalid, pa.ArrowTypeError, pa.ArrowNotImplementedError) as error:
+        raise DataError(" ".join(map(str, error.args)), name) from error
 
 
 def _open_pyarrow(data: Any) -> Source:

@@ -7,6 +7,7 @@ from dataclasses import dataclass
 
 CANCELLED = 1
 BAD_BIN_TABLE = 120002
+NO_RECORDS = 120004
 SINGLE_VALUE = 120014
 NO_VALID_VALUES = 120015
 SINGLE_CATEGORY = 120016
@@ -19,7 +20,7 @@ _WORDS = {
     120001: "the directory for temporary files does not exist, or no file can be made in it",
     BAD_BIN_TABLE: "the values lie outside all bins",
     120003: "these variables cannot be analysed: there is no attribute, or one has fewer than 2 categories or no role",
-    120004: "there is no record of positive weight",
+    NO_RECORDS: "there is no record of positive weight",
     120005: "the variable is the target or the weight, or attribute and target at once",
     120006: "the target is not categorical",
     120008: "there is no pair of an attribute and a target that can be binned",

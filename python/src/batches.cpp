@@ -30,6 +30,8 @@ public:
         const int code = fStream->get_schema(fStream.operator->(), fSchema.Receive());
         if (code != 0)
             throw StreamFault(DescribeError(code), 0);
+        if (std::strcmp(fSchema->format, "+s") != 0)
+            throw DataFault("the data are single values; a table with named columns is needed");
     }
 
     const ArrowSchema& GetSchema() const override { return *fSchema; }

@@ -4,6 +4,7 @@
 #include <cmath>
 #include <map>
 #include <string_view>
+#include <utility>
 
 namespace
 {
@@ -74,6 +75,21 @@ ColumnType Decimal(std::string_view format)
     return type;
 }
 
+/// What a type that can't be binned is to a user.
+const char* NameUnusable(std::string_view format)
+{
+    static constexpr std::pair<std::string_view, const char*> kNames[] = {
+        {"+r", "run-end encoded"}, {"+", "nested"}, {"tt", "time of day"}, {"tD", "duration"}, {"ti", "interval"},
+        {"z", "binary"},           {"Z", "binary"}, {"vz", "binary"},      {"w", "binary"},
+    };
+    for (const auto& [prefix, name] : kNames)
+    {
+        if (StartsWith(format, prefix))
+            return name;
+    }
+    return "unknown";
+}
+
 ColumnType FromFormat(std::string_view format)
 {
     static const std::map<std::string_view, ColumnType> kTypes{
@@ -100,9 +116,7 @@ ColumnType FromFormat(std::string_view format)
         return Timestamp(format);
     if (StartsWith(format, "d:"))
         return Decimal(format);
-    ColumnType type;
-    type.kind = StartsWith(format, "+") ? "nested" : "Arrow format \"" + std::string(format) + "\"";
-    return type;
+    return Plain(Storage::kNone, NameUnusable(format));
 }
 
 } // namespace

@@ -31,7 +31,7 @@ struct ColumnType
     };
 
     Storage storage = Storage::kNone;
-    /// "float", "integer", "boolean", "decimal", "date", "timestamp", "text" or "null"; else the format as it came.
+    /// "float", "integer", "boolean", "decimal", "date", "timestamp", "text" or "null"; of others, words for a message.
     std::string kind;
     /// Of a timestamp: the name of its time zone, empty without one.
     std::string timeZone;

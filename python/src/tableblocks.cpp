@@ -46,7 +46,8 @@ private:
     std::unique_ptr<ColumnReader> fReader;
 };
 
-/// The library leaves out records of no or a negative weight without a word, which nobody wants to find out later.
+/// A record without a weight is left out, as it is everywhere. The library leaves out one of a negative weight or NaN as
+/// well and without a word, which nobody wants to find out later.
 class WeightField : public FieldReader
 {
 public:
@@ -60,7 +61,7 @@ public:
         fReader->Read(first, count, values);
         for (std::size_t i = 0; i < count; ++i)
         {
-            if (values[i] >= 0.0 && values[i] < HUGE_VAL)
+            if ((values[i] >= 0.0 && values[i] < HUGE_VAL) || values[i] == gMissingValue)
                 continue;
             if (!fVariable.missingNumbers.Contains(values[i]))
                 throw DataFault(Describe(values[i]), fVariable.name, row + static_cast<std::int64_t>(i));
@@ -70,8 +71,8 @@ public:
 private:
     static std::string Describe(double weight)
     {
-        if (weight == gMissingValue || std::isnan(weight))
-            return "the weight is missing";
+        if (std::isnan(weight))
+            return "the weight is NaN";
         return weight < 0.0 ? "the weight is negative" : "the weight is infinite";
     }
 

@@ -64,6 +64,7 @@ def test_all_forms_of_the_data_give_the_same_bins(mixed):
     forms = {
         "array": plain.to_numpy(),
         "array by columns": np.asfortranarray(plain.to_numpy()),
+        "other byte order": plain.to_numpy().astype(plain.to_numpy().dtype.newbyteorder()),
         "reversed twice": plain.to_numpy()[::-1, ::-1].copy()[::-1, ::-1],
         "pandas with NA": frame,
         "polars": pl.from_arrow(table),
@@ -114,8 +115,11 @@ def test_polars_output_has_the_names_of_the_columns(mixed):
         (dict(X=np.arange(300.0)[:, None], y=np.arange(300)), "column 'y': there are 300 categories, more than 256"),
         (dict(X=WITH_GAP, y=TWO_CLASSES[:-1]), "inconsistent numbers of samples"),
         (dict(X=WITH_GAP, y=[*TWO_CLASSES[:-1], None]), "column 'y', row 23: the target is missing"),
+        (dict(X=WITH_GAP, y=[*[1.0, 2.0] * 11, 1.0, np.nan]), "column 'y', row 23: the target is missing"),
+        (dict(X=pd.DataFrame(index=range(24)), y=TWO_CLASSES), "there are no columns"),
+        (dict(X=pd.DataFrame({"x": []}), y=[]), "the data have no rows"),
         (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [-1.0]), "'sample_weight', row 23: the weight is neg"),
-        (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [np.nan]), "'sample_weight', row 23: the weight is mis"),
+        (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [np.nan]), "'sample_weight', row 23: the weight is NaN"),
         (dict(X=pa.table({"x": WITH_GAP[:, 0]}).to_reader(), y=TWO_CLASSES[:-1]), "has at least 24 rows, but there are 23"),
         (dict(X=pd.DataFrame({"t": ["a", "b"] * 12}), y=TWO_CLASSES), "column 't': the column holds texts"),
     ],
@@ -126,7 +130,7 @@ def test_bad_data_are_refused_with_column_and_row(arguments, message):
 
 
 @pytest.mark.parametrize(
-    "parameters", [{"closed": "both"}, {"encode": "x"}, {"missing": "x"}, {"n_bins": 1}, {"max_distinct": 0}, {"small_bin_ratio": 2}]
+    "parameters", [{"closed": "both"}, {"encode": "x"}, {"missing": "x"}, {"n_bins": 1}, {"n_bins": 2.5}, {"max_distinct": 0}, {"small_bin_ratio": 2}]
 )
 def test_bad_parameters_are_refused_by_name(parameters):
     with pytest.raises(ValueError, match=next(iter(parameters))):

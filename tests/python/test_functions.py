@@ -5,6 +5,7 @@ from __future__ import annotations
 import datetime
 import decimal
 import json
+import pickle
 import re
 import subprocess
 import warnings
@@ -150,6 +151,15 @@ def test_pairs_bin_against_many_targets_in_one_pass(mixed):
         result.transform(mixed)
 
 
+def test_columns_of_a_pandas_frame_need_no_texts_as_names():
+    frame = pd.DataFrame(np.arange(40.0).reshape(20, 2), columns=pd.Index([2020, ("a", "b")], dtype=object))
+
+    assert list(mb.equal_frequency_bins(frame, n_bins=2)) == ["2020", "('a', 'b')"]
+    assert mb.equal_frequency_bins(frame, ["2020"], n_bins=2).transform(frame)["2020"].tolist() == [0] * 10 + [1] * 10
+    with pytest.raises(mb.DataError, match="column 'a': there are several columns of this name"):
+        mb.equal_frequency_bins(frame.set_axis(["a", "a"], axis=1))
+
+
 def test_text_is_left_out_unless_it_is_named(mixed):
     frame = mixed[["x", "y"]].assign(kind=mixed["y"].str.upper())
 
@@ -173,14 +183,19 @@ def failing_reader(table: pa.Table) -> pa.RecordBatchReader:
     ("data", "options", "error", "message"),
     [
         ({"x": [], "y": []}, {"target": "y"}, mb.DataError, "column 'y': no row has a category"),
-        ({"x": []}, {}, mb.BinningError, "no record of positive weight"),
+        ({"x": []}, {}, mb.DataError, "the data have no rows"),
+        ({"x": [1.0], "w": [0.0]}, {"weight": "w"}, mb.BinningError, "no record of positive weight"),
         ({"x": [1.0, 2.0], "y": ["a", "a"]}, {"target": "y"}, mb.DataError, "'y': there is a single category, 'a'"),
         ({"x": [1.0, 2.0], "y": ["a", "b"]}, {"target": "z"}, mb.DataError, "column 'z': there is no such column"),
         ({"x": [1.0], "w": [-0.5]}, {"weight": "w"}, mb.DataError, "column 'w', row 0: the weight is negative"),
-        ({"x": [1.0] * 2, "w": [1.0, None]}, {"weight": "w"}, mb.DataError, "column 'w', row 1: the weight is missing"),
+        ({"x": [1.0] * 2, "w": [1.0, np.nan]}, {"weight": "w"}, mb.DataError, "column 'w', row 1: the weight is NaN"),
         ({"x": [1.0], "w": [np.inf]}, {"weight": "w"}, mb.DataError, "column 'w', row 0: the weight is infinite"),
         ({"x": range(300), "y": range(300)}, {"target": "y"}, mb.DataError, "'y', row 256: there are more than 256"),
         ({"x": [[1.0], [2.0]]}, {}, mb.DataError, "column 'x': .*nested"),
+        ({"x": [datetime.time(1, 30)]}, {}, mb.DataError, "column 'x': .*time of day"),
+        ({"x": [1.0]}, {"attributes": []}, mb.DataError, "no attribute is named"),
+        ({"x": [1.0]}, {"missing": {"x": "none"}}, mb.DataError, "column 'x': what is declared missing.*'none'"),
+        ({"x": [1.0]}, {"missing": {"x": (9, 1)}}, mb.DataError, r"column 'x': .*\(9, 1\) begins above its end"),
         ({"x": [1.0, 2.0]}, {"temp_dir": "/nowhere/at/all"}, mb.BinningError, "directory for temporary files"),
         ({"x": ["a", "b"]}, {}, mb.DataError, "nothing to bin"),
     ],
@@ -190,6 +205,40 @@ def test_bad_data_are_refused_with_column_and_row(data, options, error, message)
     for source in (pa.table(data), pa.table(data).to_reader()):
         with pytest.raises(error, match=message):
             run(source, **options)
+
+
+def test_a_path_or_a_frame_that_cannot_be_read_says_why(tmp_path):
+    (tmp_path / "broken.parquet").write_text("no such thing")
+    (tmp_path / "late.csv").write_text("x\n" + "1\n" * 30_000 + "oops\n")
+
+    for name in ("none.csv", "none*.parquet"):
+        with pytest.raises(FileNotFoundError, match=re.escape(name)) as caught:
+            mb.equal_frequency_bins(tmp_path / name)
+        assert caught.value.filename == str(tmp_path / name)
+    with pytest.raises(mb.DataError, match="broken.parquet can't be read"):
+        mb.equal_frequency_bins(tmp_path / "broken.parquet")
+    with pytest.raises(mb.StreamError, match="Line: 30002"):
+        mb.equal_frequency_bins(tmp_path / "late.csv")
+    with pytest.raises(mb.DataError, match="column 'mixed'") as refused:
+        mb.equal_frequency_bins(pd.DataFrame({"x": [1, 2], "mixed": [1, "a"]}))
+    assert refused.value.column == "mixed"
+    with pytest.raises(mb.DataError, match="a table with named columns is needed"):
+        mb.equal_frequency_bins(pl.Series("x", [1.0, 2.0]))
+
+
+def test_a_record_without_a_weight_is_left_out_as_by_the_command_line_tool(mcbin, tmp_path):
+    path = tmp_path / "weighted.csv"
+    rows = [f"{i % 20},{'ab'[i % 20 > 12]},{i % 3 or ''}" for i in range(60)]
+    path.write_text("x,y,w\n" + "\n".join(rows) + "\n")
+    call = [mcbin, "supervised", path, "--target", "y", "--weight", "w", "--format", "json"]
+    expected = json.loads(subprocess.run(call, capture_output=True, text=True, check=True).stdout)["results"]
+    nullable = pd.read_csv(path, dtype={"w": "Int64"})
+
+    assert expected[0]["weight_with_missing"] == sum(i % 3 for i in range(60))
+    for data in (path, nullable, pl.read_csv(path), duckdb.sql(f"FROM '{path}'")):
+        assert json.loads(mb.supervised_bins(data, "y", weight="w").to_json())["results"] == expected
+    with pytest.raises(mb.DataError, match="column 'w', row 0: the weight is NaN"):
+        mb.supervised_bins(pd.read_csv(path), "y", weight="w")  # where pandas has no other word for missing
 
 
 def test_a_stream_that_fails_midway_says_so_and_leaves_no_file(mixed, tmp_path):
@@ -235,3 +284,18 @@ def test_what_is_odd_about_an_attribute_is_a_warning_of_its_own_class(x, weights
     assert [type(entry.message) for entry in caught] == [warning]
     assert caught[0].message.attribute == "odd" and caught[0].message.status == result["odd"].status
     assert caught[0].filename == __file__
+
+
+@pytest.mark.parametrize(
+    "error",
+    [
+        mb.DataError("odd", "x", 3),
+        mb.StreamError("line dropped", 7),
+        mb.BinningError(mb.Status(120001, "error")),
+        mb.SingleValueWarning("x", mb.Status(120014, "warning")),
+    ],
+)
+def test_errors_and_warnings_come_back_whole_from_another_process(error):
+    again = pickle.loads(pickle.dumps(error))
+
+    assert type(again) is type(error) and str(again) == str(error) and vars(again) == vars(error)
