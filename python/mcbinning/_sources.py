@@ -67,10 +67,11 @@ def columns_of(table: _core.Table) -> tuple[Column, ...]:
     return tuple(Column(*fields) for fields in table.columns)
 
 
-def open_source(data: Any) -> Source:
-    """Any object with the Arrow stream protocol, or a path that DuckDB reads."""
+def open_source(data: Any, missing_text: Sequence[str] = ()) -> Source:
+    """Any object with the Arrow stream protocol, or a path that DuckDB reads. In a text file each of `missing_text` stands
+    for a missing value, as an empty field does."""
     if isinstance(data, (str, os.PathLike)):
-        return _open_path(os.fspath(data))
+        return _open_path(os.fspath(data), missing_text)
     kind = type(data)
     module = kind.__module__.partition(".")[0]
     if module in ("duckdb", "_duckdb") and hasattr(data, "project"):
@@ -117,7 +118,7 @@ def _read(relation: Any) -> _core.Table:
     return _stream(begin(_ROWS_AT_ONCE))
 
 
-def _open_path(path: str) -> Source:
+def _open_path(path: str, missing_text: Sequence[str]) -> Source:
     import duckdb
 
     stem = path.removesuffix(".gz").removesuffix(".zst").lower()
@@ -126,8 +127,13 @@ def _open_path(path: str) -> Source:
     # above all one on its cache, which could grow to the size of the file.
     connection = duckdb.connect(config={"threads": 1, "memory_limit": "128MB"})
     connection.execute("SET enable_progress_bar = false")
+    arguments = "$path"
+    values: dict[str, Any] = {"path": path}
+    if missing_text and function == "read_csv":
+        arguments += ", nullstr = $missing"
+        values["missing"] = ["", *missing_text]
     try:
-        relation = connection.sql(f"SELECT * FROM {function}($path)", params={"path": path})
+        relation = connection.sql(f"SELECT * FROM {function}({arguments})", params=values)
     except duckdb.Error as error:
         if "://" not in path and not glob.glob(os.path.expanduser(path), recursive=True):
             raise FileNotFoundError(errno.ENOENT, os.strerror(errno.ENOENT), path) from None

@@ -11,15 +11,15 @@ import pyarrow as pa
 from . import _core
 from ._errors import DataError
 from ._result import AttributeBins, BinningResult, Variable
-from ._sources import Source, columns_of, open_source
+from ._sources import Source, check_names, columns_of, open_source
 
 _ROWS_AT_ONCE = 1 << 17
 
 
 def transform(result: BinningResult, data: Any, labels: bool) -> Any:
     chosen = _one_for_each_attribute(result.bins)
-    source = open_source(data)
-    feed = open_values(source, [found.variable for found in chosen])
+    source = open_source(data, result.missing_text)
+    feed = open_values(source, [found.variable for found in chosen], result.missing_text)
     schema = pa.schema([(found.attribute, pa.utf8() if labels else pa.int32()) for found in chosen])
     batches = _batches(feed, chosen, schema, labels)
     if source.rows is None:
@@ -27,25 +27,36 @@ def transform(result: BinningResult, data: Any, labels: bool) -> Any:
     return _like(data, pa.Table.from_batches(batches, schema))
 
 
-def open_values(source: Source, variables: Sequence[Variable]) -> _core.Feed:
+def open_values(source: Source, variables: Sequence[Variable], missing_text: Sequence[str]) -> _core.Feed:
     """A feed of the variables' values as numbers and codes; what is declared missing is NaN in what it reads."""
     names = [variable.name for variable in variables]
-    known = {column.name for column in source.columns}
-    for name in names:
-        if name not in known:
-            raise DataError("there is no such column", name)
+    check_names(source, names)
     table = source.open(names)
-    places = [column.name for column in columns_of(table)]
+    columns = columns_of(table)
+    places = [column.name for column in columns]
     feed = _core.Feed(table)
     for index, variable in enumerate(variables):
-        use = "category" if variable.is_categorical else "attribute"
-        feed.add_variable(variable.name, use, column=places.index(variable.name))
-        is_text = variable.kind == "text"
+        place = places.index(variable.name)
+        feed.add_variable(variable.name, "category" if variable.is_categorical else "attribute", column=place)
         values = list(variable.missing_values)
-        feed.declare_missing(index, [] if is_text else values, variable.missing_interval, values if is_text else [])
+        if columns[place].kind == "text":
+            feed.declare_missing(index, [], None, [*map(str, values), *missing_text])
+        else:
+            feed.declare_missing(index, _as_numbers(values, variable), variable.missing_interval, [])
         if variable.categories is not None:
-            feed.set_categories(index, list(variable.categories))
+            categories = list(variable.categories)
+            feed.set_categories(
+                index, categories if columns[place].kind == "text" else _as_numbers(categories, variable)
+            )
     return feed
+
+
+def _as_numbers(values: list[Any], variable: Variable) -> list[float]:
+    """Of a column of numbers whose categories come from a text file, which has texts alone."""
+    try:
+        return [float(value) for value in values]
+    except ValueError as error:
+        raise DataError(f"the column holds no texts, but its categories are texts: {error}", variable.name) from error
 
 
 def _one_for_each_attribute(bins: Sequence[AttributeBins]) -> list[AttributeBins]:
