@@ -174,7 +174,7 @@ ColumnType CheckType(const ArrowSchema& schema, const Variable& variable)
 {
     if (variable.column >= schema.n_children)
         throw DataFault("there is no such column", variable.name);
-    const ColumnType type = ReadColumnType(*schema.children[variable.column]);
+    ColumnType type = ReadColumnType(*schema.children[variable.column]);
     if (type.storage == ColumnType::Storage::kNone)
         throw DataFault("a column of this type can't be used: " + type.kind, variable.name);
     if (type.IsText() && variable.use != Variable::Use::kCategory)
@@ -191,6 +191,8 @@ TableBlocks::TableBlocks(Batches* batches, std::vector<Variable>& variables)
     {
         if (variables[i].column >= 0)
         {
+            if (batches == nullptr)
+                throw DataFault("there is no table with the column", variables[i].name);
             fTypes[i] = CheckType(batches->GetSchema(), variables[i]);
             continue;
         }
@@ -256,7 +258,7 @@ std::unique_ptr<FieldReader> TableBlocks::MakeFieldReader(std::size_t index, con
     Variable& variable = fVariables[index];
     const ColumnType& type = fTypes[index];
     std::unique_ptr<ColumnReader> reader;
-    if (variable.column < 0)
+    if (batch == nullptr || variable.column < 0) // without batches all variables have arrays
     {
         StridedArray rest = variable.array;
         rest.data = static_cast<const char*>(rest.data) + static_cast<std::ptrdiff_t>(fFirstRow) * rest.stride;
