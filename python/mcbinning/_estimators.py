@@ -143,7 +143,7 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
     def _as_indicators(self, bins: Sequence[Codes]) -> Floats:
         blocks = []
         for i, column in enumerate(bins):
-            block = np.zeros((len(column), self._n_bins(i) + 1))
+            block: Floats = np.zeros((len(column), self._n_bins(i) + 1))
             block[np.arange(len(column)), column] = 1.0
             if self.missing == "keep":
                 block[column == self._n_bins(i)] = np.nan

@@ -127,13 +127,10 @@ def _open_path(path: str, missing_text: Sequence[str]) -> Source:
     # above all one on its cache, which could grow to the size of the file.
     connection = duckdb.connect(config={"threads": 1, "memory_limit": "128MB"})
     connection.execute("SET enable_progress_bar = false")
-    arguments = "$path"
-    values: dict[str, Any] = {"path": path}
-    if missing_text and function == "read_csv":
-        arguments += ", nullstr = $missing"
-        values["missing"] = ["", *missing_text]
+    options = {"na_values": ["", *missing_text]} if missing_text and function == "read_csv" else {}
     try:
-        relation = connection.sql(f"SELECT * FROM {function}({arguments})", params=values)
+        # A method, as a query with parameters is run at once and kept whole by older versions.
+        relation = getattr(connection, function)(path, **options)
     except duckdb.Error as error:
         if "://" not in path and not glob.glob(os.path.expanduser(path), recursive=True):
             raise FileNotFoundError(errno.ENOENT, os.strerror(errno.ENOENT), path) from None
