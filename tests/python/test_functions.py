@@ -15,6 +15,7 @@ import numpy as np
 import pandas as pd
 import polars as pl
 import pyarrow as pa
+import pyarrow.compute as pc
 import pyarrow.dataset as ds
 import pyarrow.parquet as pq
 import pytest
@@ -130,6 +131,61 @@ def test_dates_decimals_and_flags_are_what_the_user_knows():
     assert result["at"].labels[0] == "(-inf, 1970-01-01 00:00:09+00:00]"
     assert result["day"].target.category_names() == [False, True]
     assert result.transform(table)["day"].to_pylist() == [int(i % 20 >= 10) for i in range(rows)]
+
+
+TENS = [i % 20 for i in range(60)]
+
+
+@pytest.mark.parametrize(
+    ("values", "expected"),
+    [
+        (pa.array(TENS, pa.uint64()), ["(-inf, 9]", "(9, +inf)"]),
+        (pa.array(np.array(TENS, np.float16) / 4), ["(-inf, 2.25]", "(2.25, +inf)"]),
+        (pa.array(TENS, pa.date32()), ["(-inf, 1970-01-10]", "(1970-01-10, +inf)"]),
+        (pa.array(TENS, pa.timestamp("s", "Asia/Tokyo")), ["(-inf, 1970-01-01 09:00:09+09:00]", "(1970-01-01 09:00:09+09:00, +inf)"]),
+        (pa.array([i * 10**9 for i in TENS], pa.timestamp("ns")), ["(-inf, 1970-01-01 00:00:09]", "(1970-01-01 00:00:09, +inf)"]),
+        (pa.array([i * 10**3 for i in TENS], pa.timestamp("ms")), ["(-inf, 1970-01-01 00:00:09]", "(1970-01-01 00:00:09, +inf)"]),
+        (pa.array([i * 86_400_000 for i in TENS], pa.date64()), ["(-inf, 1970-01-10]", "(1970-01-10, +inf)"]),
+        (pa.array(TENS, pa.int32()).dictionary_encode(), ["(-inf, 9]", "(9, +inf)"]),
+        (pa.array(TENS, pa.date32()).dictionary_encode(), ["(-inf, 1970-01-10]", "(1970-01-10, +inf)"]),
+        (pa.array([i > 9 for i in TENS]).dictionary_encode(), ["(-inf, 0]", "(0, +inf)"]),
+        (pa.array(["ab"[i // 10] for i in TENS], pa.large_string()), ["{a}", "{b}"]),
+        (pa.array(["ab"[i // 10] for i in TENS]).dictionary_encode(), ["{a}", "{b}"]),
+    ],
+    ids=lambda value: str(value.type) if isinstance(value, pa.Array) else "",
+)
+def test_every_type_is_read_with_its_nulls_wherever_its_batch_begins(values, expected):
+    valid = pa.array([i % 7 != 0 for i in range(60)])
+    column = pc.if_else(valid, values, None)
+    table = pa.table({"x": column, "y": ["ab"[i // 10] for i in TENS]})
+    pieces = pa.concat_tables([table.slice(0, 13), table.slice(13, 1), table.slice(14)])
+    result = mb.supervised_bins(pieces, "y", ["x"])
+
+    assert result["x"].labels == expected
+    assert result["x"].missing_weight == 9.0
+    assert result.transform(pieces)["x"].to_pylist() == [i // 10 if ok else None for i, ok in zip(TENS, valid.to_pylist())]
+
+
+@pytest.mark.parametrize(
+    "column",
+    [
+        pd.array([*TENS, None], dtype="Int8"),
+        pd.array([*TENS, None], dtype="Float32"),
+        pd.array([*TENS, None], dtype="int64[pyarrow]"),
+        pd.Series([*TENS, np.nan]),
+        pd.Series([*map(decimal.Decimal, TENS), None], dtype=object),
+        pd.Series(pd.Categorical([*TENS, None])),
+        pl.Series([*TENS, None]),
+        pl.Series([*map(float, TENS), float("nan")]),
+    ],
+    ids=lambda column: str(column.dtype),
+)
+def test_what_stands_for_missing_in_a_frame_is_missing(column):
+    frame = (pl.DataFrame if isinstance(column, pl.Series) else pd.DataFrame)({"x": column})
+    result = mb.equal_frequency_bins(frame, n_bins=2)
+
+    assert result["x"].cut_points.tolist() == [9.5] and result["x"].missing_weight == 1.0
+    assert pl.DataFrame(result.transform(frame))["x"].to_list() == [i // 10 for i in TENS] + [None]
 
 
 def test_declared_values_and_intervals_are_missing():

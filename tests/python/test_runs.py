@@ -49,10 +49,13 @@ INTERRUPTED = """
     import sys, numpy as np, pyarrow as pa, mcbinning as mb
     phase, directory = sys.argv[1:]
     table = pa.table({f"x{i}": np.random.default_rng(i).normal(size=300_000) for i in range(30)})
+    table = table.append_column("kind", pa.array(["a", "b"] * 150_000))
 
     def endless():
         while True:
             yield from table.to_batches()
+            if phase == "categories":  # the reading ahead for them, which reports nothing
+                print("now", flush=True)
 
     def tell(now, index):
         if now == phase:
@@ -60,6 +63,8 @@ INTERRUPTED = """
 
     data = table if phase == "attributes" else pa.RecordBatchReader.from_batches(table.schema, endless())
     try:
+        if phase == "categories":
+            mb.supervised_bins(data, "kind", temp_dir=directory)
         mb.equal_frequency_bins(data, n_bins=5000, temp_dir=directory, progress=tell)
     except KeyboardInterrupt:
         print("stopped", flush=True)
@@ -68,7 +73,7 @@ INTERRUPTED = """
 """
 
 
-@pytest.mark.parametrize("phase", ["records", "attributes"])
+@pytest.mark.parametrize("phase", ["categories", "records", "attributes"])
 def test_ctrl_c_raises_keyboard_interrupt_and_leaves_no_file(tmp_path, phase):
     process = subprocess.Popen(
         [sys.executable, "-c", textwrap.dedent(INTERRUPTED), phase, str(tmp_path)], stdout=subprocess.PIPE, text=True
