@@ -158,7 +158,7 @@ def test_every_type_is_read_with_its_nulls_wherever_its_batch_begins(values, exp
     valid = pa.array([i % 7 != 0 for i in range(60)])
     column = pc.if_else(valid, values, None)
     table = pa.table({"x": column, "y": ["ab"[i // 10] for i in TENS]})
-    pieces = pa.concat_tables([table.slice(0, 13), table.slice(13, 1), table.slice(14)])
+    pieces = pa.concat_tables([table.slice(0, 13), table.slice(13, 3), table.slice(16)])
     result = mb.supervised_bins(pieces, "y", ["x"])
 
     assert result["x"].labels == expected
