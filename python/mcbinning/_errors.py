@@ -18,7 +18,7 @@ class BinningError(RuntimeError):
 
 
 class DataError(ValueError):
-    """The data can't be binned. `column` names the column and `row` counts from 0; None where there is no such thing."""
+    """The data can't be binned. `column` names the column, `row` counts from 0; None where there is no such thing."""
 
     def __init__(self, message: str, column: str | None = None, row: int | None = None) -> None:
         self.message = message

@@ -172,8 +172,8 @@ class SupervisedBinner(_Binner):
     Parameters
     ----------
     max_distinct : int or None, default=None
-        A feature with more distinct values than this is pre-binned into `n_bins` bins of equal frequency, from which the
-        search for cut points starts. None: never.
+        A feature with more distinct values than this is pre-binned into `n_bins` bins of equal frequency, from which
+        the search for cut points starts. None: never.
     n_bins : int, default=1000
         The number of those pre-bins.
     closed : {"right", "left"}, default="right"
@@ -183,8 +183,8 @@ class SupervisedBinner(_Binner):
     encode : {"ordinal", "onehot", "interval"}, default="ordinal"
         What `transform` gives: the number of the bin, a column of 0 and 1 for each bin, or the bin in words.
     missing : {"code", "keep"}, default="code"
-        Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or stays
-        missing.
+        Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
+        stays missing.
     temp_dir : path or None, default=None
         Where the temporary files go; None for the system's directory.
     progress : bool or callable, default=False
@@ -225,7 +225,7 @@ class SupervisedBinner(_Binner):
         self.progress = progress
 
     def fit(self, X: Any, y: Any, sample_weight: Any = None) -> SupervisedBinner:
-        """Finds the cut points. `X` is an array, a frame, or anything with an Arrow stream; weights may be fractional."""
+        """Finds the cut points. `X` is an array, a frame, or any Arrow stream; weights may be fractional."""
         check_settings(self.closed, self.n_bins, self.max_distinct, self.small_bin_ratio)
         if y is None:
             raise ValueError(f"{type(self).__name__} requires y to be passed, but the target y is None")
@@ -280,7 +280,7 @@ class EqualFrequencyBinner(_Binner):
         self.progress = progress
 
     def fit(self, X: Any, y: Any = None, sample_weight: Any = None) -> EqualFrequencyBinner:
-        """Finds the cut points. `X` is an array, a frame, or anything with an Arrow stream; weights may be fractional."""
+        """Finds the cut points. `X` is an array, a frame, or any Arrow stream; weights may be fractional."""
         check_settings(self.closed, self.n_bins)
         self._fit(X, None, (), sample_weight)
         return self

@@ -47,11 +47,12 @@ def supervised_bins(
     numbers, dates and timestamps are binned; a column of text is when it is named, and its bins are sets of categories.
     `pairs` of attribute and target take the place of both, to bin against many targets in one pass.
 
-    An attribute with more than `max_distinct` distinct values is pre-binned into `n_bins` bins of equal frequency first.
-    A bin lighter than `small_bin_ratio` times its lighter neighbour is merged away. Weights may be fractional.
+    An attribute with more than `max_distinct` distinct values is first pre-binned into `n_bins` bins of equal
+    frequency. A bin lighter than `small_bin_ratio` times its lighter neighbour is merged away. Weights may be
+    fractional, and a record without a weight is left out.
 
-    Categories get their codes in ascending order, so the order of the rows makes no difference. A stream that can be read
-    only once goes through a temporary file for that.
+    Categories get their codes in ascending order, so the order of the rows makes no difference. A stream that can be
+    read only once goes through a temporary file for that.
     """
     if (target is None) == (pairs is None):
         raise TypeError("either target or pairs must be given")

@@ -234,7 +234,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return pyarrow.Table.from_pandas(self.to_pandas(), preserve_index=False)
 
     def to_json(self, path: str | os.PathLike[str] | None = None) -> str:
-        """Everything, as `mcbin --format json` writes it and `mcbin apply` reads it. Writes a file, too, if told where."""
+        """Everything, as `mcbin --format json` writes it and `mcbin apply` reads it; also into a file, if told where."""
         from ._json import dump
 
         text = dump(self)
@@ -255,8 +255,8 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return load(text)
 
     def to_sql(self, dialect: str = "", table: str | None = None, labels: bool = False) -> str:
-        """SQL that gives each row the bins of its values: one CASE expression for each attribute, in a SELECT if `table`
-        names one. The dialect is one of sqlglot's; without one it is standard SQL."""
+        """SQL that gives each row the bins of its values: one CASE expression for each attribute, in a SELECT if
+        `table` names one. The dialect is one of sqlglot's; without one it is standard SQL."""
         from ._sql import write
 
         return write(self, dialect, table, labels)

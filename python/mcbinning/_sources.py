@@ -68,8 +68,8 @@ def columns_of(table: _core.Table) -> tuple[Column, ...]:
 
 
 def open_source(data: Any, missing_text: Sequence[str] = ()) -> Source:
-    """Any object with the Arrow stream protocol, or a path that DuckDB reads. In a text file each of `missing_text` stands
-    for a missing value, as an empty field does."""
+    """Any object with the Arrow stream protocol, or a path that DuckDB reads. In a text file each of `missing_text`
+    stands for a missing value, as an empty field does."""
     if isinstance(data, (str, os.PathLike)):
         return _open_path(os.fspath(data), missing_text)
     kind = type(data)
@@ -123,8 +123,8 @@ def _open_path(path: str, missing_text: Sequence[str]) -> Source:
 
     stem = path.removesuffix(".gz").removesuffix(".zst").lower()
     function = _FILE_FUNCTIONS.get(os.path.splitext(stem)[1], "read_csv")
-    # The library works on one thread, and each further one of DuckDB's would hold batches in memory for it. The limit is
-    # above all one on its cache, which could grow to the size of the file.
+    # The library works on one thread, and each further one of DuckDB's would hold batches in memory for it. The limit
+    # is above all one on its cache, which could grow to the size of the file.
     connection = duckdb.connect(config={"threads": 1, "memory_limit": "128MB"})
     connection.execute("SET enable_progress_bar = false")
     options = {"na_values": ["", *missing_text]} if missing_text and function == "read_csv" else {}
@@ -152,7 +152,7 @@ def _open_pandas(frame: Any) -> Source:
 
 
 def _convert(column: Any, name: str) -> Any:
-    """As an Arrow array. None and NA become nulls; a NaN among plain floats stays one, and their memory is used as it is."""
+    """As an Arrow array. None and NA become nulls; a NaN among plain floats stays one, and these aren't copied."""
     import pyarrow as pa
 
     is_plain_float = isinstance(column.dtype, np.dtype) and column.dtype.kind == "f"

@@ -78,6 +78,6 @@ def _literal(value: float | str, variable: Variable) -> exp.Expression:
     if math.isinf(value):
         value = math.copysign(_values.LARGEST, value)
     digits = repr(_values.plain(abs(value)))
-    # A number with an exponent is a double in every dialect; one without may be read as an exact decimal, which is as good.
+    # A number with an exponent is a double in every dialect; one without may be an exact decimal, which is as good.
     number = exp.Literal.number(digits)
     return exp.Neg(this=number) if math.copysign(1.0, value) < 0 else number

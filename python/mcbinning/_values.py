@@ -97,8 +97,8 @@ def bin_numbers(values: Floats, cut_points: Floats, closed: str) -> Codes:
 
 
 def _count_cuts(values: Floats, cut_points: Floats, closed: str) -> Codes:
-    """How many cut points each value is beyond. Without a branch for each value this is several times as fast as a search,
-    as long as there are few of them and the rows at hand stay in the cache."""
+    """How many cut points each value is beyond. Without a branch for each value this is several times as fast as a
+    search, as long as there are few of them and the rows at hand stay in the cache."""
     is_beyond = np.greater if closed == "right" else np.greater_equal
     bins: Codes = np.empty(len(values), dtype=np.intp)
     for first in range(0, len(values), _ROWS_IN_CACHE):
