@@ -13,7 +13,7 @@ from typing import Any
 import numpy as np
 
 from . import _core
-from ._errors import DataError
+from ._errors import DataError, StreamError
 
 _FILE_FUNCTIONS = {
     ".parquet": "read_parquet",
@@ -114,8 +114,14 @@ def _open_relation(relation: Any, name: str | None = None) -> Source:
 
 def _read(relation: Any) -> _core.Table:
     """In small batches: DuckDB holds several, and those of wide tables are large."""
+    import duckdb
+
     begin = getattr(relation, "to_arrow_reader", None) or relation.fetch_record_batch
-    return _stream(begin(_ROWS_AT_ONCE))
+    try:
+        reader = begin(_ROWS_AT_ONCE)
+    except duckdb.Error as error:
+        raise StreamError(str(error), 0) from error  # some versions look far ahead for the first batch
+    return _stream(reader)
 
 
 def _open_path(path: str, missing_text: Sequence[str]) -> Source:
