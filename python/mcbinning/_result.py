@@ -234,7 +234,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return pyarrow.Table.from_pandas(self.to_pandas(), preserve_index=False)
 
     def to_json(self, path: str | os.PathLike[str] | None = None) -> str:
-        """Everything, as `mcbin --format json` writes and `mcbin apply` reads it. Writes a file, too, if one is named."""
+        """Everything, as `mcbin --format json` writes and `mcbin apply` reads it; into a file, too, if one is named."""
         from ._json import dump
 
         text = dump(self)
