@@ -1,4 +1,5 @@
 #include "support/runs.h"
+#include "support/tempdir.h"
 
 #include <gtest/gtest.h>
 
@@ -85,7 +86,9 @@ TEST(EqualFrequencyRun, CancelAndReportsGoAttributeByAttribute)
 {
     CancelAfter query(7); // creation, run, two records, behind the pass, then twice an attribute: the end of the first
     ReportLog log;
+    const TempDir directory; // a name that another program has taken would be one question more
     EFBINSettings settings = EqualFrequencySettings(2);
+    settings.SetTempDirName(directory.Path());
     settings.SetCancelPointer(&query);
     settings.SetProgressListener(&log);
     EqualFrequency run(AVarList().WithAttribute("x").WithAttribute("y"), settings);

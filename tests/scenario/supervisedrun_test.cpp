@@ -1,4 +1,5 @@
 #include "support/runs.h"
+#include "support/tempdir.h"
 
 #include <gtest/gtest.h>
 
@@ -201,7 +202,9 @@ TEST(SupervisedRun, TargetsThatDontFitTheirCodes)
 TEST(SupervisedRun, CancelKeepsTheResultsFoundBefore)
 {
     const MCStatus cancelled = ErrorOf(MCBinning::BINStatusCancelled);
+    const TempDir directory; // a name that another program has taken would be one question more
     BINSettings settings = SupervisedSettings();
+    settings.SetTempDirName(directory.Path());
     // Asked at creation, at the run, once a record, behind the pass, then twice a pair: the 10th is the end of the
     // first.
     CancelAfter query(10);
