@@ -186,9 +186,15 @@ bool CsvReader::SplitLine(std::string_view line)
     fields.clear();
     const char* const end = line.data() + line.size();
     const char* begin = line.data();
+    const auto addField = [&fields, this](const char* from, const char* to)
+    {
+        // In parts: whole, it would have to wait for both to arrive in memory.
+        const std::string_view field = Trim(from, to, fDelimiter);
+        fields.emplace_back(field.data(), field.size());
+    };
     for (const char* fieldEnd; (fieldEnd = Find(begin, end, fDelimiter)) != end; begin = fieldEnd + 1)
-        fields.push_back(Trim(begin, fieldEnd, fDelimiter));
-    fields.push_back(Trim(begin, end, fDelimiter));
+        addField(begin, fieldEnd);
+    addField(begin, end);
     fLastTerminator = 0;
     return fPlainRow.Size() > 1 || !fPlainRow[0].empty();
 }

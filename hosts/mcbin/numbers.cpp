@@ -8,6 +8,7 @@
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
+#include <limits>
 
 namespace
 {
@@ -28,9 +29,8 @@ const char* SkipDigits(const char* at, const char* end)
     return at;
 }
 
-} // namespace
-
-std::optional<double> ParseNumber(std::string_view text)
+/// The number, or a NaN, of what from_chars doesn't take as it is.
+double ParseUnusualNumber(std::string_view text)
 {
     // Within quotes the reader leaves them.
     while (!text.empty() && text.front() == ' ') text.remove_prefix(1);
@@ -45,7 +45,24 @@ std::optional<double> ParseNumber(std::string_view text)
     if (result.ec == std::errc::result_out_of_range)
         value = std::strtod(std::string(text).c_str(), nullptr);
     const bool isNumber = result.ec != std::errc::invalid_argument && result.ptr == end && std::isfinite(value);
-    return isNumber ? std::optional(value) : std::nullopt;
+    return isNumber ? value : std::numeric_limits<double>::quiet_NaN();
+}
+
+} // namespace
+
+std::optional<double> ParseNumber(std::string_view text)
+{
+    const double value = ParseNumberOrNaN(text);
+    return std::isnan(value) ? std::nullopt : std::optional(value);
+}
+
+double ParseNumberOrNaN(std::string_view text)
+{
+    double value = 0.0;
+    const char* const end = text.data() + text.size();
+    const std::from_chars_result result = std::from_chars(text.data(), end, value);
+    const bool isNumber = result.ec == std::errc() && result.ptr == end && std::isfinite(value);
+    return isNumber ? value : ParseUnusualNumber(text);
 }
 
 bool IsNumber(std::string_view text)
@@ -58,7 +75,7 @@ bool IsNumber(std::string_view text)
     if (at != end && *at == '.')
         at = SkipDigits(at + 1, end);
     const bool hasDigit = end - begin > 1 || (end - begin == 1 && *begin != '.');
-    return (at == end && hasDigit && text.size() < kSmallSize) || ParseNumber(text).has_value();
+    return (at == end && hasDigit && text.size() < kSmallSize) || !std::isnan(ParseNumberOrNaN(text));
 }
 
 std::string FormatNumber(double value)

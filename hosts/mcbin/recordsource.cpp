@@ -8,7 +8,7 @@
 
 #include <mcobnqrt/binstringencoder.h>
 
-#include <optional>
+#include <cmath>
 
 namespace
 {
@@ -63,8 +63,9 @@ double TableRecordSource::Convert(const Field& field, std::string_view text)
         return MCMV::gMissingValue;
     if (field.encoder)
         return ConvertCategory(field, text);
-    if (const std::optional<double> number = ParseNumber(text))
-        return *number;
+    const double number = ParseNumberOrNaN(text);
+    if (!std::isnan(number))
+        return number;
     if (!fPlan.isBadMissing)
         throw fTable.MakeFailure(fRow->GetLine(), kChanged);
     return MCMV::gMissingValue;
