@@ -1,4 +1,5 @@
-// One whole run over a file of doubles, column by column: what the library takes for data that another program has, too.
+// One whole run over a file of doubles, column by column: what the library takes for data that another program has,
+// too.
 
 #include "measure.h"
 #include "workloads.h"
@@ -25,8 +26,8 @@ std::vector<double> ReadColumn(std::ifstream& file, std::size_t numRecords)
 
 /// rawrun FILE RECORDS ATTRIBUTES CATEGORIES BINS DIRECTORY
 ///
-/// The target's codes come behind the attributes. Without categories it is an equal-frequency run. Prints the seconds of
-/// processor time and the peak of memory, in MiB above the data.
+/// The target's codes come behind the attributes. Without categories it is an equal-frequency run. Prints the seconds
+/// of processor time and the peak of memory, in MiB above the data.
 int main(int argc, char** argv)
 try
 {

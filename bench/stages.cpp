@@ -1,5 +1,5 @@
-// What the stages of a run cost on their own. One "item" is a value in the pass, a tuple from loading to the equal-frequency
-// walk, a row of the value table in scan and split, a bin in merge and store.
+// What the stages of a run cost on their own. One "item" is a value in the pass, a tuple from loading to the
+// equal-frequency walk, a row of the value table in scan and split, a bin in merge and store.
 
 #include "workloads.h"
 
@@ -33,7 +33,8 @@ public:
     static void Load(BINAttributeReader& reader) { reader.LoadVariable(kAttribute); }
 };
 
-/// A supervised algorithm that has binned one informative attribute, and the single steps of that work, to be done again.
+/// A supervised algorithm that has binned one informative attribute, and the single steps of that work, to be done
+/// again.
 class BINAlgorithmPeer
 {
 public:

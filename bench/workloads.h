@@ -8,8 +8,8 @@
 #include <string>
 #include <vector>
 
-/// Random numbers that are the same bits on every machine: the generator splitmix64, and nothing but additions and exact
-/// arithmetic on what it gives.
+/// Random numbers that are the same bits on every machine: the generator splitmix64, and nothing but additions and
+/// exact arithmetic on what it gives.
 class Numbers
 {
 public:
@@ -55,8 +55,8 @@ struct Workload
 /// One of the workloads W1 to W5, which README.md tells of; `scale` divides the number of records.
 Workload MakeWorkload(const std::string& name, std::size_t scale = 1);
 
-/// A random target, and for each of the `shifts` an attribute: normal values whose mean moves by so much from one category to
-/// the next.
+/// A random target, and for each of the `shifts` an attribute: normal values whose mean moves by so much from one
+/// category to the next.
 Workload MakeContinuous(std::size_t numRecords, const std::vector<double>& shifts, int numCategories);
 
 /// Streams a workload as a host would: target, weight, attributes. The workload outlives it.

@@ -24,8 +24,8 @@ public:
 /// The batches of the stream in a capsule named "arrow_array_stream", which is empty from now on.
 std::unique_ptr<Batches> OpenStream(nanobind::capsule stream);
 
-/// The batches of a Python iterator, each with the method __arrow_c_array__; `schema` is a capsule named "arrow_schema".
-/// What the iterator raises passes through unchanged, which it doesn't through a stream.
+/// The batches of a Python iterator, each with the method __arrow_c_array__; `schema` is a capsule named
+/// "arrow_schema". What the iterator raises passes through unchanged, which it doesn't through a stream.
 std::unique_ptr<Batches> OpenIterator(nanobind::capsule schema, nanobind::object iterator);
 
 #endif

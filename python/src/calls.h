@@ -74,8 +74,8 @@ private:
     Interrupts& fInterrupts;
 };
 
-/// Calls a Python function with the name of the phase, "records" or "attributes", and the report's index. What it raises
-/// ends the run.
+/// Calls a Python function with the name of the phase, "records" or "attributes", and the report's index. What it
+/// raises ends the run.
 class ProgressToPython : public ProgressListener
 {
 public:

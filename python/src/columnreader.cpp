@@ -233,8 +233,8 @@ std::string_view TextReader::ViewAt(std::size_t index) const
 {
     if (fStorage == Storage::kTextView)
     {
-        // 16 bytes: the length, and then the text itself if it has at most 12 bytes, else its first four, the number of its
-        // buffer and its place there.
+        // 16 bytes: the length, and then the text itself if it has at most 12 bytes, else its first four, the number of
+        // its buffer and its place there.
         const char* const view = static_cast<const char*>(fArray.buffers[1]) + 16 * index;
         std::int32_t parts[4];
         std::memcpy(parts, view, sizeof(parts));

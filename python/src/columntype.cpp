@@ -24,8 +24,8 @@ ColumnType Plain(Storage storage, const char* kind)
     return type;
 }
 
-/// "tsu:Europe/Berlin": seconds, milli-, micro- or nanoseconds since the epoch, as microseconds. Those are exact in a double
-/// until the year 2255, while nanoseconds would lose their last digits today.
+/// "tsu:Europe/Berlin": seconds, milli-, micro- or nanoseconds since the epoch, as microseconds. Those are exact in a
+/// double until the year 2255, while nanoseconds would lose their last digits today.
 ColumnType Timestamp(std::string_view format)
 {
     ColumnType type = Plain(Storage::kInt64, "timestamp");

@@ -187,8 +187,8 @@ nb::tuple ToTuple(const Outcome<Result>& outcome)
     return nb::make_tuple(ToTuple(outcome.status), results, outcome.numRecords, outcome.version);
 }
 
-/// The records of one analysis: a table, arrays, or both side by side. A table can be read once, by one of the operations
-/// that read records.
+/// The records of one analysis: a table, arrays, or both side by side. A table can be read once, by one of the
+/// operations that read records.
 class Feed
 {
 public:

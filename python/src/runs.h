@@ -33,9 +33,9 @@ struct Outcome
     std::string version;         ///< of the component, as the library tells it
 };
 
-/// Bins the pairs (attributes[i], targets[i]), which are indices of `variables`, as they are in `blocks`. No variable is
-/// declared as the target of the others. Takes no GIL
-/// but for `progress` and `interrupts`. \param progress may be None.
+/// Bins the pairs (attributes[i], targets[i]), which are indices of `variables`, as they are in `blocks`. No variable
+/// is declared as the target of the others. Takes no GIL but for `progress` and `interrupts`. \param progress may be
+/// None.
 Outcome<BINAttributeTargetResults> RunSupervised(BlockSource& blocks, const std::vector<Variable>& variables,
                                                  const std::vector<int>& attributes, const std::vector<int>& targets,
                                                  const RunOptions& options, const nanobind::object& progress,

@@ -46,8 +46,8 @@ private:
     std::unique_ptr<ColumnReader> fReader;
 };
 
-/// A record without a weight is left out, as it is everywhere. The library leaves out one of a negative weight or NaN as
-/// well and without a word, which nobody wants to find out later.
+/// A record without a weight is left out, as it is everywhere. The library leaves out one of a negative weight or NaN
+/// as well and without a word, which nobody wants to find out later.
 class WeightField : public FieldReader
 {
 public:

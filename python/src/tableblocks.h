@@ -21,8 +21,8 @@ public:
     virtual void Read(std::size_t first, std::size_t count, std::int64_t row, double* values) = 0;
 };
 
-/// Reads batches and arrays side by side, where they lie. Codes of categories come in the order of arrival, behind those
-/// that the variables know.
+/// Reads batches and arrays side by side, where they lie. Codes of categories come in the order of arrival, behind
+/// those that the variables know.
 class TableBlocks : public BlockSource
 {
 public:
