@@ -33,7 +33,7 @@ void Time(const char* file, const char* target)
     const auto begin = std::chrono::steady_clock::now();
     TableReader table(tableOptions);
     ColumnPlan plan = PlanColumns(table, columns);
-    ProfileTable(table, plan, progress);
+    ProfileTable(table, plan, progress, Care::kHasty);
     const Variables variables = MakeVariables(plan, columns.rounding);
     const double profile = GetSeconds(begin);
     TableRecordSource source(table, plan, variables, progress);

@@ -33,7 +33,8 @@ struct Column
     std::vector<double> missingNumbers;    ///< those of them that are numbers
     std::optional<std::pair<double, double>> missingInterval;
 
-    long nNumbers = 0;                             ///< fields that are numbers
+    bool isBelieved = false;                       ///< to hold numbers alone, by its first rows
+    long nNumbers = 0;                             ///< fields that are numbers, of those looked at
     long nTexts = 0;                               ///< fields that are something else
     std::string firstText;                         ///< the first of the latter
     long firstTextLine = 0;                        ///< and its line

@@ -93,6 +93,11 @@ void CsvReader::Rewind()
 {
     fFile.Rewind();
     ReadBeginning();
+    fParser.reset(MakeParser(fDelimiter));
+    fRows.assign(1, CsvRow());
+    fNumRows = fNextRow = 0;
+    fInRow = false;
+    fFailure = nullptr;
 }
 
 void CsvReader::ReadBeginning()

@@ -49,7 +49,7 @@ public:
     /// \throw Failure for a bad row, once all rows before it have been handed out, or if the file can't be read.
     const CsvRow* NextRow();
 
-    /// Goes back to the first row of a file that can be rewound. Only to be called when NextRow() has given null.
+    /// Goes back to the first row of a file that can be rewound.
     void Rewind();
 
     const std::string& GetName() const { return fFile.GetName(); }

@@ -3,6 +3,7 @@
 #include "columnplan.h"
 #include "numbers.h"
 #include "progress.h"
+#include "tableprofile.h"
 #include "tablereader.h"
 #include "variables.h"
 
@@ -66,6 +67,8 @@ double TableRecordSource::Convert(const Field& field, std::string_view text)
     const double number = ParseNumberOrNaN(text);
     if (!std::isnan(number))
         return number;
+    if (field.column->isBelieved)
+        throw NotOnlyNumbers();
     if (!fPlan.isBadMissing)
         throw fTable.MakeFailure(fRow->GetLine(), kChanged);
     return MCMV::gMissingValue;

@@ -100,12 +100,10 @@ void Announce(Progress& progress, const Variables& variables)
     progress.BeginRows("reading the records");
 }
 
-} // namespace
-
-Findings FindBins(TableReader& table, const BinOptions& options, Progress& progress)
+Findings FindBins(TableReader& table, const BinOptions& options, Progress& progress, Care care)
 {
     ColumnPlan plan = PlanColumns(table, options.columns);
-    ProfileTable(table, plan, progress);
+    ProfileTable(table, plan, progress, care);
     Variables variables = MakeVariables(plan, options.columns.rounding);
     Findings findings;
     findings.settings = options.settings;
@@ -121,4 +119,20 @@ Findings FindBins(TableReader& table, const BinOptions& options, Progress& progr
         RunEqualFrequency(findings, variables, source, options.settings, progress);
     progress.Erase();
     return findings;
+}
+
+} // namespace
+
+Findings FindBins(TableReader& table, const BinOptions& options, Progress& progress)
+{
+    try
+    {
+        // Nearly always it is as it seems, and then every number is read once only.
+        return FindBins(table, options, progress, Care::kHasty);
+    }
+    catch (const NotOnlyNumbers&)
+    {
+        table.Rewind();
+        return FindBins(table, options, progress, Care::kThorough);
+    }
 }

@@ -15,11 +15,13 @@ namespace
 /// A run takes the codes from 0 to 255.
 constexpr std::size_t kMostCategories = 256;
 
-void ProfileNumber(Column& column, std::string_view field, long line)
+void ProfileNumber(Column& column, std::string_view field, long line, Care care)
 {
+    constexpr long kManyNumbers = 1000;
     if (IsNumber(field))
     {
         ++column.nNumbers;
+        column.isBelieved = care == Care::kHasty && column.nTexts == 0 && column.nNumbers >= kManyNumbers;
         return;
     }
     if (column.nTexts++ == 0)
@@ -44,15 +46,16 @@ void ProfileCategory(const TableReader& table, Column& column, std::size_t place
                                     (column.isTarget ? "target" : "categorical attribute"));
 }
 
-void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t place, std::string_view field, long line)
+void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t place, std::string_view field, long line,
+                  Care care)
 {
     Column& column = plan.columns[place];
-    if (!column.IsUsed() || plan.IsMissing(column, field))
+    if (column.isBelieved || !column.IsUsed() || plan.IsMissing(column, field))
         return;
     if (column.kind == ColumnKind::kCategorical)
         ProfileCategory(table, column, place, field, line);
     else
-        ProfileNumber(column, field, line);
+        ProfileNumber(column, field, line, care);
 }
 
 void SettleKind(const TableReader& table, const ColumnPlan& plan, std::size_t place, Column& column)
@@ -74,14 +77,14 @@ void SettleKind(const TableReader& table, const ColumnPlan& plan, std::size_t pl
 
 } // namespace
 
-void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress)
+void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care care)
 {
     progress.BeginRows("learning the columns");
     while (const CsvRow* const row = table.NextRow())
     {
         progress.CountRow();
         ++plan.nRows;
-        for (std::size_t i = 0; i < row->Size(); ++i) ProfileField(table, plan, i, (*row)[i], row->GetLine());
+        for (std::size_t i = 0; i < row->Size(); ++i) ProfileField(table, plan, i, (*row)[i], row->GetLine(), care);
     }
     if (plan.nRows == 0)
         throw table.MakeFailure("there is no row below the header");

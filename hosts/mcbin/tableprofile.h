@@ -1,9 +1,22 @@
 #ifndef MCBIN_TABLEPROFILE_H
 #define MCBIN_TABLEPROFILE_H
 
+#include <exception>
+
 class Progress;
 class TableReader;
 struct ColumnPlan;
+
+/// Thrown by the record source if a column that was believed to hold numbers alone has a text.
+struct NotOnlyNumbers : std::exception
+{
+};
+
+enum class Care
+{
+    kHasty,   ///< a column whose first thousand fields are numbers is believed to hold nothing else
+    kThorough ///< every field is looked at
+};
 
 /// Reads the table to its end, and so finds out what the columns of the plan hold: their kinds, where these aren't
 /// given, their categories, and the number of rows. Memory doesn't grow with that number.
@@ -13,6 +26,6 @@ struct ColumnPlan;
 ///
 /// \throw Failure if a row is bad, if there is no row, if a column has more categories than the library takes, if a
 ///        field should be a number and isn't, or if an attribute was asked for by name and is text.
-void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress);
+void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care care);
 
 #endif

@@ -14,7 +14,7 @@ struct TableOptions
 {
     std::string file;           ///< "-" for standard input
     char delimiter = '\0';      ///< '\0' for finding it
-    bool isReadTwice = false;   ///< Rewind() will be called
+    bool isReadTwice = false;   ///< or more often: Rewind() will be called
     std::string spoolDirectory; ///< for a copy of what can't be read twice by itself; empty for the system's
 };
 
@@ -40,8 +40,7 @@ public:
     /// reader's and is good until the next call. \throw Failure if the row is bad or can't be read.
     const CsvRow* NextRow();
 
-    /// Goes back to the first row below the header of a table that is read twice. Only to be called when NextRow() has
-    /// given null.
+    /// Goes back to the first row below the header of a table that is read more than once.
     void Rewind();
 
     /// What is wrong with the file, with the row, or with a field in it, with the place put in front.

@@ -112,6 +112,32 @@ TEST_F(McbinInput, AFileOfManyBlocksLosesNoRowAndNoLine)
               broken.err);
 }
 
+TEST_F(McbinInput, TextFarBehindNumbersCountsAsItDoesInFront)
+{
+    // Behind so many numbers no field is looked at until the run comes to it, in the midst of quoted rows.
+    const std::string header = "x,z,note,y\n";
+    std::string numbers;
+    for (int i = 0; i < 3000; ++i)
+        numbers += std::to_string(i % 50) + "," + std::to_string(i) + ",\"a\nb\"," + (i % 50 < 20 ? "low\n" : "up\n");
+    const std::string text = "none,1,n,low\n";
+    std::string texts;
+    for (int i = 0; i < 4000; ++i) texts += text;
+
+    const Outcome failed = RunOn(header + numbers + text + numbers, "supervised", "--target y");
+    EXPECT_EQ(1, failed.exitCode);
+    EXPECT_EQ(0U, failed.err.find("mcbin: data.csv, line 6002: column 'x': 'none' is not a number")) << failed.err;
+
+    const std::string options = "--target y --bad missing --attributes x";
+    const Outcome inFront = RunOn(header + text + numbers, "supervised", options);
+    const Outcome behind = RunOn(header + numbers + text, "supervised", options);
+    EXPECT_NE(std::string::npos, behind.out.find("50 distinct values from 0 to 49, missing weight 1")) << behind.out;
+    EXPECT_EQ(inFront.out, behind.out);
+
+    const Outcome mostlyText = RunOn(header + numbers + texts, "supervised", "--target y");
+    EXPECT_EQ(0, mostlyText.exitCode);
+    EXPECT_NE(std::string::npos, mostlyText.out.find("x ('none' in line 6002)")) << mostlyText.out;
+}
+
 TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
 {
     struct Case
