@@ -32,7 +32,7 @@ BinaryRecordIterator::~BinaryRecordIterator()
         fPlatform->CloseFile(fFile); // nothing was written, so nothing can be lost
 }
 
-bool BinaryRecordIterator::IsOK()
+bool BinaryRecordIterator::IsOK() const
 {
     return fRecordStatus == kMoreToCome;
 }
@@ -53,7 +53,7 @@ void BinaryRecordIterator::Skip(std::size_t count)
         fRecordStatus = ReadBlock();
 }
 
-int BinaryRecordIterator::GetStatus()
+int BinaryRecordIterator::GetStatus() const
 {
     return fRecordStatus;
 }

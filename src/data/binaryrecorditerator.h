@@ -34,12 +34,12 @@ public:
     ~BinaryRecordIterator();
 
     /// Whether Next() still has a value to give.
-    bool IsOK();
+    bool IsOK() const;
 
     /// The next value; 0.0 once IsOK() is false.
     double Next();
 
-    int GetStatus();
+    int GetStatus() const;
 
     /// The values that are read ahead and how many they are, at least one while IsOK().
     const double* GetBlock() const { return fBlock.data() + fNextValue; }

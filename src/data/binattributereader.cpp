@@ -230,7 +230,7 @@ MCStatus BINAttributeReader::LoadAttribute(int position)
     return MCStatus();
 }
 
-bool BINAttributeReader::HasNextInAll(Iterator& attribute) const
+bool BINAttributeReader::HasNextInAll(const Iterator& attribute) const
 {
     return attribute.IsOK() && (!fHasTarget || fTargetIterator->IsOK()) && (!fHasWeight || fWeightIterator->IsOK());
 }

@@ -84,7 +84,7 @@ private:
     bool PutOn(int position, std::unique_ptr<Iterator>& iterator, int& iteratorPosition) const;
     MCBinning::MCStatus LoadVariable(int attribute);
     MCBinning::MCStatus LoadAttribute(int position);
-    bool HasNextInAll(Iterator& attribute) const;
+    bool HasNextInAll(const Iterator& attribute) const;
     std::size_t CommonBlockSize(const Iterator& attribute) const;
     template<class Tuple>
     bool AddTuples(std::vector<Tuple>& tuples, const double* values, std::size_t count);
