@@ -193,7 +193,7 @@ bool CsvReader::SplitLine(std::string_view line)
     const char* begin = line.data();
     const auto addField = [&fields, this](const char* from, const char* to)
     {
-        // In parts: whole, it would have to wait for both to arrive in memory.
+        // Built in place from its two parts: to copy the whole view the processor would wait for both to be stored.
         const std::string_view field = Trim(from, to, fDelimiter);
         fields.emplace_back(field.data(), field.size());
     };

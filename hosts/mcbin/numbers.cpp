@@ -5,29 +5,11 @@
 #include <array>
 #include <charconv>
 #include <cmath>
-#include <cstdint>
 #include <cstdlib>
-#include <cstring>
 #include <limits>
 
 namespace
 {
-
-/// Eight at a time: a digit has the high half 3, and none with 6 added to its low half.
-const char* SkipDigits(const char* at, const char* end)
-{
-    constexpr std::uint64_t kHighHalves = 0xF0F0F0F0F0F0F0F0;
-    constexpr std::uint64_t kThrees = 0x3030303030303030;
-    constexpr std::uint64_t kSixes = 0x0606060606060606;
-    for (std::uint64_t eight; end - at >= 8; at += 8)
-    {
-        std::memcpy(&eight, at, sizeof eight);
-        if ((eight & kHighHalves) != kThrees || ((eight + kSixes) & kHighHalves) != kThrees)
-            break;
-    }
-    while (at != end && *at >= '0' && *at <= '9') ++at;
-    return at;
-}
 
 /// The number, or a NaN, of what from_chars doesn't take as it is.
 double ParseUnusualNumber(std::string_view text)
@@ -63,19 +45,6 @@ double ParseNumberOrNaN(std::string_view text)
     const std::from_chars_result result = std::from_chars(text.data(), end, value);
     const bool isNumber = result.ec == std::errc() && result.ptr == end && std::isfinite(value);
     return isNumber ? value : ParseUnusualNumber(text);
-}
-
-bool IsNumber(std::string_view text)
-{
-    // Digits and at most one point, which can be no other number than a small one; the rest is from_chars's.
-    constexpr std::size_t kSmallSize = 40;
-    const char* const end = text.data() + text.size();
-    const char* const begin = text.data() + (!text.empty() && text.front() == '-' ? 1 : 0);
-    const char* at = SkipDigits(begin, end);
-    if (at != end && *at == '.')
-        at = SkipDigits(at + 1, end);
-    const bool hasDigit = end - begin > 1 || (end - begin == 1 && *begin != '.');
-    return (at == end && hasDigit && text.size() < kSmallSize) || !std::isnan(ParseNumberOrNaN(text));
 }
 
 std::string FormatNumber(double value)

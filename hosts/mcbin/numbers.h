@@ -14,9 +14,6 @@ std::optional<double> ParseNumber(std::string_view text);
 /// whole, for which the processor waits half as long as it takes to read the number.
 double ParseNumberOrNaN(std::string_view text);
 
-/// Whether ParseNumber() gives a number; in less time where it plainly does.
-bool IsNumber(std::string_view text);
-
 /// The number in as few digits as read back to the same double. Infinities are "inf" and "-inf".
 std::string FormatNumber(double value);
 

@@ -18,7 +18,7 @@ constexpr std::size_t kMostCategories = 256;
 void ProfileNumber(Column& column, std::string_view field, long line, Care care)
 {
     constexpr long kManyNumbers = 1000;
-    if (IsNumber(field))
+    if (ParseNumber(field))
     {
         ++column.nNumbers;
         column.isBelieved = care == Care::kHasty && column.nTexts == 0 && column.nNumbers >= kManyNumbers;

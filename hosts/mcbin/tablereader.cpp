@@ -87,7 +87,7 @@ Failure TableReader::MakeNotANumber(long line, std::size_t column, std::string_v
 {
     std::string withoutCommas(field);
     withoutCommas.erase(std::remove(withoutCommas.begin(), withoutCommas.end(), ','), withoutCommas.end());
-    const bool hasCommas = withoutCommas.size() < field.size() && IsNumber(withoutCommas);
+    const bool hasCommas = withoutCommas.size() < field.size() && ParseNumber(withoutCommas);
     return MakeFailure(line, column,
                        Quote(Shorten(field)) +
                            (hasCommas ? " is not a number: it has a comma, and numbers are written as in 1234.5"

@@ -15,9 +15,9 @@ public:
     ///
     /// It is asked from inside Run, on the thread of that call: before the records are read, ahead of each record and
     /// after the last, when the name of a temporary file is taken, around each attribute or pair, and at the end. So it
-    /// has to be cheap. GetStatus of the algorithm, and so its
-    /// creation too, asks it as well. One attribute is not interrupted: a cancel takes effect when it is done, and its
-    /// result is kept. What the query throws passes to the caller.
+    /// has to be cheap. GetStatus of the algorithm, and so its creation too, asks it as well. One attribute is not
+    /// interrupted: a cancel takes effect when it is done, and its result is kept. What the query throws passes to the
+    /// caller.
     virtual bool QueryCancel() = 0;
 };
 
