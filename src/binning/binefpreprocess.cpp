@@ -1,9 +1,10 @@
 // Weighted percentiles in one walk over the sorted tuples.
 //
 // The walk takes whole groups of equal values. The target of a bin is either passed inside a group, and then the
-// group's value is the cut, or met exactly between two groups, and then the midpoint of their values is. The total
-// weight comes from a sum in another order than the walk's and may differ from it in the last bit, so "all of it" is
-// asked of the tuples, by the cursor, and never of the weights.
+// group's value is the cut, or met exactly between two groups, and then the midpoint of their values is, or where that
+// doesn't part the two, the one of them that does. The total weight comes from a sum in another order than the walk's
+// and may differ from it in the last bit, so "all of it" is asked of the tuples, by the cursor, and never of the
+// weights.
 
 #include "binning/binefpreprocess.h"
 
@@ -19,14 +20,27 @@ namespace
 
 constexpr double kEpsilon = std::numeric_limits<double>::epsilon();
 
+/// A cut between two values, `lower` < `upper`, that leaves the one on its left and the other on its right: the
+/// midpoint if possible. That of two neighbouring doubles is one of the two, and beside infinities it can be infinite or
+/// a NaN.
+double CutBetween(double lower, double upper, bool rightBorderClosed)
+{
+    const double sum = lower + upper;
+    const double middle = std::isfinite(sum) ? sum * 0.5 : lower * 0.5 + upper * 0.5; // the sum of large ones overflows
+    if (rightBorderClosed)
+        return lower <= middle && middle < upper ? middle : lower;
+    return lower < middle && middle <= upper ? middle : upper;
+}
+
 /// One walk over the tuples of an attribute, from its first bin to its last.
 template<class Tuple>
 class EFWalk
 {
 public:
-    EFWalk(const std::vector<Tuple>& tuples, unsigned int numTuples, double totalWeight, int numberOfBins)
+    EFWalk(const std::vector<Tuple>& tuples, unsigned int numTuples, double totalWeight, int numberOfBins,
+           bool rightBorderClosed)
         : fTuples(tuples), fNumTuples(numTuples), fTotalWeight(totalWeight), fStep(100.0 / numberOfBins),
-          fLastBin(numberOfBins - 1)
+          fLastBin(numberOfBins - 1), fRightBorderClosed(rightBorderClosed)
     {
     }
 
@@ -50,9 +64,9 @@ public:
     /// Appends the weight of the bin. With the right border closed the group at the cut belongs to it, else to the next
     /// bin; where that group is the last of all, the next bin is complete too, and no call will come that could count
     /// it.
-    void CountBin(bool rightBorderClosed, std::vector<double>& counts) const
+    void CountBin(std::vector<double>& counts) const
     {
-        if (rightBorderClosed)
+        if (fRightBorderClosed)
             counts.push_back(fCum - fCumAtStart);
         else if (IsLastBin())
             counts.push_back(fCum - fPrevCumAtStart);
@@ -98,7 +112,7 @@ private:
             fCumBeforeGroup = fCum;
             if (IsMet(need))
             {
-                fCutPoint = (fTuples[fCursor - 1].fValue + groupValue) * 0.5;
+                fCutPoint = CutBetween(fTuples[fCursor - 1].fValue, groupValue, fRightBorderClosed);
                 return;
             }
             fCutPoint = groupValue;
@@ -120,6 +134,7 @@ private:
     double fTotalWeight;
     double fStep; ///< share of one bin, in percent
     int fLastBin;
+    bool fRightBorderClosed;
     int fBin = -1;            ///< the bin that was closed last
     unsigned int fCursor = 0; ///< index of the next tuple not yet consumed
     double fCum = 0.0;        ///< weight of all tuples consumed
@@ -130,62 +145,25 @@ private:
     double fCutPoint = 0.0;
 };
 
-/// A bin whose cut equals the one before it: the midpoint of two neighbouring doubles is one of them, and a target
-/// inside its group gives it once more. The bin's weight then belongs to the bin before.
-void JoinToPreviousBin(std::vector<double>& counts, std::size_t bin)
-{
-    counts[bin - 1] += counts[bin];
-    counts.erase(counts.begin() + static_cast<std::ptrdiff_t>(bin));
-}
-
-/// Walks through all bins. With `counts` null the weights of the bins are not wanted.
+/// Walks through all bins. With `counts` null the weights of the bins are not wanted. A cut that equals the one before it
+/// bounds a bin without a value, and so does one at the end of the data, where a single value holds the last share or,
+/// with the left border closed, the first.
 template<class Tuple>
-void FindBins(EFWalk<Tuple> walk, bool rightBorderClosed, std::vector<double>& cuts, std::vector<double>* counts)
+void FindBins(EFWalk<Tuple> walk, std::vector<double>& cuts, std::vector<double>* counts)
 {
     while (walk.NextEFCutPoint())
     {
-        const std::size_t numCounts = counts != nullptr ? counts->size() : 0;
         if (counts != nullptr)
-            walk.CountBin(rightBorderClosed, *counts);
+            walk.CountBin(*counts);
         if (walk.IsLastBin())
             return;
-        if (cuts.empty() || walk.GetCutPoint() != cuts.back())
-            cuts.push_back(walk.GetCutPoint());
-        else if (counts != nullptr)
-            JoinToPreviousBin(*counts, numCounts);
-    }
-}
-
-/// Takes out a cut at an end of the data, where a single value holds the last share or, with the left border closed,
-/// the first. The bin that it cuts off has no weight, unless the cut is the midpoint of two neighbouring doubles, which
-/// is one of them: then its weight goes to the bin beside it.
-void RemoveCutAtEnd(double smallest, double largest, bool rightBorderClosed, std::vector<double>& cuts,
-                    std::vector<double>& counts)
-{
-    if (cuts.empty())
-        return;
-    if (rightBorderClosed && cuts.back() == largest)
-    {
-        cuts.pop_back();
-        if (counts.size() > cuts.size() + 1)
-            JoinToPreviousBin(counts, counts.size() - 1);
-    }
-    else if (!rightBorderClosed && cuts.front() == smallest)
-    {
-        cuts.erase(cuts.begin());
-        if (counts.size() > 1)
-            JoinToPreviousBin(counts, 1);
-        else
-            counts.clear();
+        cuts.push_back(walk.GetCutPoint());
     }
 }
 
 /// Takes out the bins without weight, each with its right cut: no value lies between that and the cut before it.
 void RemoveEmptyBins(double totalWeight, std::vector<double>& cuts, std::vector<double>& counts)
 {
-    if (cuts.empty() && counts.empty())
-        counts.push_back(totalWeight);
-
     std::vector<double> keptCuts;
     std::vector<double> keptCounts;
     for (std::size_t bin = 0; bin < counts.size(); ++bin)
@@ -197,7 +175,9 @@ void RemoveEmptyBins(double totalWeight, std::vector<double>& cuts, std::vector<
             keptCuts.push_back(cuts[bin]);
     }
     if (keptCuts.size() == keptCounts.size() && !keptCuts.empty())
-        keptCuts.pop_back(); // the last bin was empty: the one before it has no right cut now
+        keptCuts.pop_back(); // no value lies behind the last cut
+    if (keptCounts.empty())
+        keptCounts.push_back(totalWeight); // a single value, with the left border closed: all lies behind the last cut
     cuts.swap(keptCuts);
     counts.swap(keptCounts);
 }
@@ -214,7 +194,8 @@ bool BINEFPreProcess::PreBinEqualFrequency(const std::vector<BINSortTuple>* tupl
 {
     if (tuples == nullptr || !CanBin(numTuples, totalWeight))
         return false;
-    FindBins(EFWalk<BINSortTuple>(*tuples, numTuples, totalWeight, fNumberOfBins), fRightBorderClosed, cuts, nullptr);
+    FindBins(EFWalk<BINSortTuple>(*tuples, numTuples, totalWeight, fNumberOfBins, fRightBorderClosed), cuts, nullptr);
+    cuts.erase(std::unique(cuts.begin(), cuts.end()), cuts.end());
     return true;
 }
 
@@ -224,8 +205,7 @@ bool BINEFPreProcess::BinEqualFrequency(const std::vector<BINValueTuple>* tuples
 {
     if (tuples == nullptr || !CanBin(numTuples, totalWeight))
         return false;
-    FindBins(EFWalk<BINValueTuple>(*tuples, numTuples, totalWeight, fNumberOfBins), fRightBorderClosed, cuts, &counts);
-    RemoveCutAtEnd(tuples->front().fValue, (*tuples)[numTuples - 1].fValue, fRightBorderClosed, cuts, counts);
+    FindBins(EFWalk<BINValueTuple>(*tuples, numTuples, totalWeight, fNumberOfBins, fRightBorderClosed), cuts, &counts);
     RemoveEmptyBins(totalWeight, cuts, counts);
     return true;
 }

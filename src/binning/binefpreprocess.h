@@ -17,15 +17,16 @@ class BINEFPreProcess
 public:
     BINEFPreProcess(int numberOfBins, bool rightBorderClosed);
 
-    /// The cut list for pre-binning: at most numberOfBins - 1 values in rising order, the value at an end of the data
-    /// among them where that value alone holds a share. `cuts` arrives empty.
+    /// The cut list for pre-binning: at most numberOfBins - 1 values in strictly rising order, the value at an end of
+    /// the data among them where that value alone holds a share. `cuts` arrives empty.
     ///
     /// \return false, with nothing changed, without tuples, bins or a total weight above 0.
     bool PreBinEqualFrequency(const std::vector<BINSortTuple>* tuples, unsigned int numTuples,
                               std::vector<double>& cuts, double totalWeight) const;
 
-    /// The bins themselves: cut points in rising order, and the weight of each bin, none of them 0, one more than there
-    /// are cuts. Both lists arrive empty. \return as above.
+    /// The bins themselves: cut points in strictly rising order, and the weight of each bin, none of them 0, one more
+    /// than there are cuts. The weights are those of the values between the cuts, whatever the values are. Both lists
+    /// arrive empty. \return as above.
     bool BinEqualFrequency(const std::vector<BINValueTuple>* tuples, unsigned int numTuples, std::vector<double>& cuts,
                            std::vector<double>& counts, double totalWeight) const;
 

@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <limits>
 #include <numeric>
 
@@ -31,14 +32,16 @@ Bins Cut(const std::vector<double>& values, std::vector<double> weights, int num
     return bins;
 }
 
-std::vector<double> PreBinCuts(const std::vector<double>& values, int numberOfBins, bool rightBorderClosed)
+std::vector<double> PreBinCuts(const std::vector<double>& values, std::vector<double> weights, int numberOfBins,
+                               bool rightBorderClosed)
 {
+    weights.resize(values.size(), 1.0);
     std::vector<BINSortTuple> tuples;
-    for (const double value : values) tuples.push_back({value, 0, 1.0});
+    for (std::size_t i = 0; i < values.size(); ++i) tuples.push_back({values[i], 0, weights[i]});
     std::vector<double> cuts;
     BINEFPreProcess(numberOfBins, rightBorderClosed)
         .PreBinEqualFrequency(&tuples, static_cast<unsigned int>(tuples.size()), cuts,
-                              static_cast<double>(values.size()));
+                              std::accumulate(weights.begin(), weights.end(), 0.0));
     return cuts;
 }
 
@@ -83,8 +86,8 @@ TEST(EqualFrequency, PreBinningKeepsTheCutAtTheEnd)
 {
     for (const bool closed : {true, false})
     {
-        EXPECT_EQ(std::vector<double>{1}, PreBinCuts({1, 1, 1, 2}, 2, closed));
-        EXPECT_EQ((std::vector<double>{1.5, 2}), PreBinCuts({1, 2, 2, 2, 3}, 5, closed));
+        EXPECT_EQ(std::vector<double>{1}, PreBinCuts({1, 1, 1, 2}, {}, 2, closed));
+        EXPECT_EQ((std::vector<double>{1.5, 2}), PreBinCuts({1, 2, 2, 2, 3}, {}, 5, closed));
     }
 }
 
@@ -110,8 +113,6 @@ TEST(EqualFrequency, WeightsLostInRoundingLeaveTheListsInStep)
     const double huge = 1e300;
     const double tiny = std::numeric_limits<double>::denorm_min();
     const double infinite = std::numeric_limits<double>::infinity();
-    const double oneAndABit = 1.0 + std::numeric_limits<double>::epsilon();
-    const double nextValue = oneAndABit + std::numeric_limits<double>::epsilon();
     struct Case
     {
         const char* fWhat;
@@ -123,7 +124,6 @@ TEST(EqualFrequency, WeightsLostInRoundingLeaveTheListsInStep)
         {"all but the last absorbed", {1, 2, 3}, {1, 1, huge}},
         {"targets below the smallest number", {1, 2, 3, 4}, {tiny, tiny, tiny, tiny}},
         {"infinite", {1, 2, 3}, {1, infinite, 1}},
-        {"midpoint falls on the right neighbour", {1, oneAndABit, nextValue, 3}, {1, 1, 1, 1}},
     };
     for (const Case& c : cases)
     {
@@ -141,47 +141,146 @@ TEST(EqualFrequency, WeightsLostInRoundingLeaveTheListsInStep)
     }
 }
 
-TEST(EqualFrequency, NoWeightIsLostBetweenNeighbouringDoubles)
+namespace
 {
-    const double step = std::numeric_limits<double>::epsilon();
-    // The midpoint of the two is the even one of them: the largest value, and the smallest.
-    const Bins right = Cut({1 + step, 1 + 2 * step}, {}, 2, true);
-    const Bins left = Cut({1, 1 + step}, {}, 2, false);
 
-    EXPECT_TRUE(right.fCuts.empty());
-    EXPECT_EQ(std::vector<double>{2}, right.fCounts);
-    EXPECT_TRUE(left.fCuts.empty());
-    EXPECT_EQ(std::vector<double>{2}, left.fCounts);
+constexpr double kInfinity = std::numeric_limits<double>::infinity();
+constexpr double kLargest = std::numeric_limits<double>::max();
+constexpr double kSmallest = std::numeric_limits<double>::denorm_min();
+
+double Next(double value)
+{
+    return std::nextafter(value, kInfinity);
 }
 
-TEST(EqualFrequency, BinsOfRandomDataHoldTheirWeight)
+/// Doubles in rising order from `first` on, each the neighbour of the one before or some of its neighbours away, and
+/// now and then equal to it. Zeros come with both signs.
+std::vector<double> Chain(Dice& dice, double first, int length)
 {
-    for (unsigned int seed = 1; seed <= 2000; ++seed)
+    std::vector<double> values{first};
+    while (static_cast<int>(values.size()) < length)
+    {
+        double value = values.back();
+        for (int steps = dice.Below(3); steps > 0; --steps) value = Next(value);
+        values.push_back(value == 0.0 && dice.Below(2) == 0 ? -0.0 : value);
+    }
+    std::sort(values.begin(), values.end(),
+              [](double left, double right)
+              { return left != right ? left < right : std::signbit(left) && !std::signbit(right); });
+    return values;
+}
+
+/// The weights of the bins as a user counts them, by the cuts.
+std::vector<double> Recount(const std::vector<double>& values, const std::vector<double>& weights,
+                            const std::vector<double>& cuts, bool rightBorderClosed)
+{
+    std::vector<double> counts(cuts.size() + 1, 0.0);
+    for (std::size_t i = 0; i < values.size(); ++i)
+    {
+        const auto bin = rightBorderClosed ? std::lower_bound(cuts.begin(), cuts.end(), values[i])
+                                           : std::upper_bound(cuts.begin(), cuts.end(), values[i]);
+        counts[static_cast<std::size_t>(bin - cuts.begin())] += weights[i];
+    }
+    return counts;
+}
+
+bool Rises(const std::vector<double>& cuts)
+{
+    return std::is_sorted(cuts.begin(), cuts.end(), std::less_equal<>());
+}
+
+void ExpectNear(const std::vector<double>& expected, const std::vector<double>& actual, double margin)
+{
+    ASSERT_EQ(expected.size(), actual.size());
+    for (std::size_t bin = 0; bin < expected.size(); ++bin) EXPECT_NEAR(expected[bin], actual[bin], margin) << bin;
+}
+
+/// Cuts must rise and part the values into just the bins that the counts tell of, none of them empty; the pre-binning
+/// has to find the same bins, and may have empty ones beside them.
+void ExpectCountsAreWhatTheCutsGive(const std::vector<double>& values, const std::vector<double>& weights,
+                                    int numberOfBins, bool rightBorderClosed, double margin)
+{
+    const Bins bins = Cut(values, weights, numberOfBins, rightBorderClosed);
+    EXPECT_TRUE(Rises(bins.fCuts));
+    EXPECT_EQ(0, std::count(bins.fCounts.begin(), bins.fCounts.end(), 0.0));
+    ExpectNear(Recount(values, weights, bins.fCuts, rightBorderClosed), bins.fCounts, margin);
+
+    const std::vector<double> rowCuts = PreBinCuts(values, weights, numberOfBins, rightBorderClosed);
+    EXPECT_TRUE(Rises(rowCuts));
+    std::vector<double> rows = Recount(values, weights, rowCuts, rightBorderClosed);
+    rows.erase(std::remove(rows.begin(), rows.end(), 0.0), rows.end());
+    ExpectNear(rows, bins.fCounts, margin);
+}
+
+} // namespace
+
+TEST(EqualFrequency, CutMetBetweenTwoValuesPartsThem)
+{
+    struct Case
+    {
+        double fLower, fUpper, fRightClosed, fLeftClosed;
+    };
+    const double one = Next(1.0);
+    const std::vector<Case> cases{
+        {1, one, 1, one},                 // the midpoint is the even one of the two: 1
+        {one, Next(one), one, Next(one)}, // and here the upper one
+        {-kSmallest, 0, -kSmallest, 0},
+        {0, kSmallest, 0, kSmallest},
+        {-kSmallest, kSmallest, 0, 0},
+        {1e308, 1.5e308, 1.25e308, 1.25e308}, // the sum overflows
+        {-kLargest, kLargest, 0, 0},
+        {-kInfinity, 5, -kInfinity, 5},
+        {5, kInfinity, 5, kInfinity},
+        {kLargest, kInfinity, kLargest, kInfinity},
+        {-kInfinity, kInfinity, -kInfinity, kInfinity},
+    };
+    for (const Case& c : cases)
+    {
+        SCOPED_TRACE(testing::PrintToString(std::pair(c.fLower, c.fUpper)));
+        EXPECT_EQ(std::vector<double>{c.fRightClosed}, Cut({c.fLower, c.fUpper}, {}, 2, true).fCuts);
+        EXPECT_EQ(std::vector<double>{c.fLeftClosed}, Cut({c.fLower, c.fUpper}, {}, 2, false).fCuts);
+    }
+}
+
+TEST(EqualFrequency, CountsAreWhatTheCutsGive)
+{
+    const std::vector<double> starts{-kInfinity,
+                                     -kLargest,
+                                     -1e308,
+                                     -1.0,
+                                     -10 * kSmallest,
+                                     0.0,
+                                     1.0 - 1e-15,
+                                     1e300,
+                                     9e307,
+                                     1e308,
+                                     std::nextafter(kLargest, 0.0)};
+    for (unsigned int seed = 1; seed <= 4000; ++seed)
     {
         Dice dice(seed);
         const int numTuples = 1 + dice.Below(60);
-        std::vector<double> values;
-        std::vector<double> weights;
-        for (int i = 0; i < numTuples; ++i)
-        {
-            values.push_back(dice.Below(seed % 3 == 0 ? 5 : 1000));
-            weights.push_back(seed % 2 == 0 ? 1.0 + dice.Below(3) : 0.01 + dice.Fraction());
-        }
+        std::vector<double> values = Chain(dice, starts[seed % starts.size()], numTuples);
+        if (seed % 4 == 0) // far apart
+            std::generate(values.begin(), values.end(), [&] { return dice.Below(seed % 3 == 0 ? 5 : 1000); });
+        if (seed % 5 == 0)
+            values.insert(values.end(), {-kInfinity, -1e308, -0.0, 0.0, 1e308, 1.7e308, kInfinity});
         std::sort(values.begin(), values.end());
-        const bool closed = dice.Below(2) == 0;
-
-        const Bins bins = Cut(values, weights, 2 + dice.Below(12), closed);
-
-        // Counted again by the borders that a user sees.
-        std::vector<double> recount(bins.fCuts.size() + 1, 0.0);
+        const bool isExact = seed % 2 == 0;
+        std::vector<double> weights;
         for (std::size_t i = 0; i < values.size(); ++i)
+            weights.push_back(isExact ? 0.25 * (1 + dice.Below(3)) : 0.01 + dice.Fraction());
+
+        for (const int numberOfBins : {2, 3, 2 + dice.Below(12), numTuples, 1000})
         {
-            const auto bin = closed ? std::lower_bound(bins.fCuts.begin(), bins.fCuts.end(), values[i])
-                                    : std::upper_bound(bins.fCuts.begin(), bins.fCuts.end(), values[i]);
-            recount[static_cast<std::size_t>(bin - bins.fCuts.begin())] += weights[i];
+            for (const bool closed : {true, false})
+            {
+                SCOPED_TRACE("seed " + std::to_string(seed) + ", bins " + std::to_string(numberOfBins) + ", closed " +
+                             std::to_string(closed));
+                ExpectCountsAreWhatTheCutsGive(values, weights, numberOfBins, closed,
+                                               isExact ? 0.0 : 1e-12 * numTuples);
+                if (testing::Test::HasFailure())
+                    return;
+            }
         }
-        ASSERT_EQ(recount.size(), bins.fCounts.size()) << "seed " << seed;
-        for (std::size_t bin = 0; bin < recount.size(); ++bin)
-            ASSERT_NEAR(recount[bin], bins.fCounts[bin], 1e-12 * numTuples) << "seed " << seed << " bin " << bin;
     }
 }
