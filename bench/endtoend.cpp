@@ -19,7 +19,7 @@ struct Goal
     double fLargestRatio;
 };
 
-constexpr Goal kGoals[] = {{"W1", 1.2}, {"W2", 1.5}, {"W3", 1.5}, {"W4", 1.5}, {"W5", 1.0}};
+constexpr Goal kGoals[] = {{"W1", 1.2}, {"W2", 1.5}, {"W3", 1.5}, {"W4", 1.5}, {"W5", 1.0}, {"W6", 1.2}};
 
 /// In thousand millions.
 std::string TextOf(const std::optional<double>& instructions)

@@ -37,11 +37,16 @@ void MakeWhole(Workload& workload)
     }
 }
 
-void ReplaceTargetByWeight(Workload& workload)
+void AddWeight(Workload& workload)
 {
-    workload.fTarget.clear();
     Numbers numbers(kWeightSeed);
     for (std::size_t i = 0; i < workload.NumRecords(); ++i) workload.fWeight.push_back(0.5 + numbers.Uniform());
+}
+
+/// Makes the weights multiples of 2^-31: sums of a million of them are exact.
+void PutWeightsOnGrid(Workload& workload)
+{
+    for (double& weight : workload.fWeight) weight = std::floor(weight * 0x1p31) * 0x1p-31;
 }
 
 template<class Settings>
@@ -92,7 +97,7 @@ Workload MakeWorkload(const std::string& name, std::size_t scale)
         return MakeContinuous(10000 / scale, informativeAndNoise, 3);
     if (name == "W5")
         return MakeContinuous(200000 / scale, informative, 20);
-    if (name != "W1" && name != "W2" && name != "W4")
+    if (name != "W1" && name != "W2" && name != "W4" && name != "W6")
         throw std::runtime_error("no workload of that name: " + name);
 
     Workload workload = MakeContinuous(1000000 / scale, informativeAndNoise, 3);
@@ -100,8 +105,14 @@ Workload MakeWorkload(const std::string& name, std::size_t scale)
         MakeWhole(workload);
     if (name == "W4")
     {
-        ReplaceTargetByWeight(workload);
+        workload.fTarget.clear();
+        AddWeight(workload);
         workload.fNumbersOfBins = {10, 100};
+    }
+    if (name == "W6")
+    {
+        AddWeight(workload);
+        PutWeightsOnGrid(workload);
     }
     return workload;
 }

@@ -52,7 +52,7 @@ struct Workload
     std::size_t NumRecords() const { return fColumns.front().size(); }
 };
 
-/// One of the workloads W1 to W5, which README.md tells of; `scale` divides the number of records.
+/// One of the workloads W1 to W6, which README.md tells of; `scale` divides the number of records.
 Workload MakeWorkload(const std::string& name, std::size_t scale = 1);
 
 /// A random target, and for each of the `shifts` an attribute: normal values whose mean moves by so much from one

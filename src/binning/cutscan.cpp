@@ -16,25 +16,28 @@
 // mostly 4 of them, and only rows for which it is not above the best one are worked out.
 //
 // The margin. What is compared with bound and estimate is the partition entropy as it is worked out, times the weight
-// N. With u = 2^-53, an entropy is off by at most (40 + 8 K) u. The terms of bound and estimate are at most N log2 N <=
-// 53 N each; the bound has 4 (K + 1) of them, and the estimate is updated up to 64 K times in a segment, each time off
-// by 4 x 53 u N: 2^15 (K + 4) u N is enough for all of it. That is all where the cells are whole numbers with exact
-// sums. Otherwise the sides are running sums of n rows, each off by up to e = 2 n K u N, a residual of a category that
-// is used up among them. No partial sum is finer than the last bit of the smallest cell, so no logarithm is above g =
-// log2(N / smallest cell) + 54 in size, and an error of e in each count of both sides moves their H by at most 2 K (3 g
-// + 16) e.
+// N. With u = 2^-53, an entropy is off by at most (40 + 8 K) u. Each term v log2 v of bound and estimate is at most
+// N (|log2 N| + 1) in size. Bounds are only used where N lies between 2^-60 and 2^60, so that is at most 61 N; the bound
+// has 4 (K + 1) terms, and the estimate is updated up to 64 K times in a segment, each time off by at most 6 x 61 u N:
+// 2^15 (K + 4) u N is enough for all of it. Beyond those weights the terms grow with |log2 N| and no such margin holds;
+// from a total of about 2^1014 they are infinite, and at the small end they lose their last bits.
 //
-// For a million rows of three categories this takes a scan from 60 ms to less than one with whole numbers, and to 5
-// with fractions, which have to be summed row by row.
+// That is all where sums are exact. Otherwise the sides are running sums of n rows, each off by up to e = 2 n K u N, a
+// residual of a category that is used up among them. No partial sum is finer than the last bit of the smallest cell, so
+// no count is below 2^-g N with g = log2(N / smallest cell) + 54, and no logarithm is above g + 60 in size. An error of
+// e in each count of both sides then moves their H, which has 2 (K + 1) terms v log2 v, by at most 2 (K + 1) (g + 62) e,
+// and that is at most 2 K (3 g + 16) e, as g is above 54 and K above 1: with one category H is 0.
+//
+// For a million rows of three categories this takes a scan from 60 ms to less than one where sums are exact, and to 5
+// where they are not and rows have to be summed one by one.
 
 #include "binning/cutscan.h"
 
+#include "base/exactsums.h"
 #include "platform/arithmetic.h"
 
 #include <algorithm>
 #include <cmath>
-#include <cstdint>
-#include <cstring>
 #include <functional>
 #include <limits>
 #include <numeric>
@@ -51,20 +54,9 @@ constexpr int kFewestRowsForLongBlocks = 40000; ///< of the table
 /// Ranges with fewer blocks are walked over: the bounds cost as much as they save.
 constexpr int kFewestBoundedBlocks = 4;
 
-constexpr double kLargestWhole = 9007199254740992.0; ///< 2^53: a double holds all whole numbers up to it
-constexpr double kLargestSpread = 4294967296.0;      ///< of weights with fractions; beyond it the margin says nothing
-
-/// The bits that a number of 0 or more loses where there is no room behind the point: none if it is whole.
-std::uint64_t FractionBits(double number)
-{
-    constexpr double kNoRoom = 4503599627370496.0; // 2^52
-    const double whole = number + kNoRoom - kNoRoom;
-    std::uint64_t bits = 0;
-    std::uint64_t wholeBits = 0;
-    std::memcpy(&bits, &number, sizeof(bits));
-    std::memcpy(&wholeBits, &whole, sizeof(wholeBits));
-    return bits ^ wholeBits;
-}
+constexpr double kLargestSpread = 4294967296.0; ///< of sums that are not exact; beyond it the margin is useless
+constexpr double kHeaviestRange = 1152921504606846976.0; ///< 2^60
+constexpr double kLightestRange = 1.0 / kHeaviestRange;
 
 /// 0 log2 0 is 0 here, as in an entropy.
 double Times(double count, double log2)
@@ -96,24 +88,21 @@ CutScan::CutScan(const std::vector<double>& table, std::size_t numCategories, bo
         CountBlocks();
 }
 
-/// Adds up the table block by block, and finds out what its sums are like on the way.
+/// Adds up the table block by block, and finds out what its sums are like.
 void CutScan::CountBlocks()
 {
     const int numRows = static_cast<int>(fTable.size() / fNumCategories);
     std::vector<double> counts(fNumCategories, 0.0);
-    std::uint64_t fractionBits = 0;
     for (int row = 0; row < numRows; ++row)
     {
         if (row % fBlockSize == 0)
             fRowsBefore.insert(fRowsBefore.end(), counts.begin(), counts.end());
         const double* const cells = Row(row);
-        for (std::size_t c = 0; c < fNumCategories; ++c)
-        {
-            counts[c] += cells[c];
-            fractionBits |= FractionBits(cells[c]);
-        }
+        for (std::size_t c = 0; c < fNumCategories; ++c) counts[c] += cells[c];
     }
-    fIsExact = fractionBits == 0 && std::accumulate(counts.begin(), counts.end(), 0.0) <= kLargestWhole;
+    ExactSums sums(std::accumulate(counts.begin(), counts.end(), 0.0));
+    for (const double cell : fTable) sums.Add(cell);
+    fIsExact = sums.AreExact();
     if (fIsExact)
         return;
     fSmallestCell = std::numeric_limits<double>::infinity();
@@ -266,7 +255,8 @@ void CutScan::TryRow(int row, const CountVector& left, const CountVector& right,
 bool CutScan::CanBeBounded(Range range, double weight) const
 {
     const bool isLongEnough = range.fLast - range.fFirst + 1 >= kFewestBoundedBlocks * fBlockSize;
-    return isLongEnough && (fIsExact || weight < kLargestSpread * fSmallestCell);
+    const bool hasFiniteTerms = kLightestRange < weight && weight < kHeaviestRange;
+    return isLongEnough && hasFiniteTerms && (fIsExact || weight < kLargestSpread * fSmallestCell);
 }
 
 double CutScan::Margin(Range range, double weight) const

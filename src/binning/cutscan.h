@@ -10,9 +10,7 @@
 /// code.
 ///
 /// What it finds is what a walk over all rows would find that works out the partition entropy of every candidate. It
-/// only leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp. Only among weights so
-/// near the smallest double that products lose their last bits it may find another one: such a range is too light to be
-/// cut.
+/// only leaves out candidates that can't be the best; how it knows them stands in cutscan.cpp.
 class CutScan
 {
 public:
@@ -106,7 +104,7 @@ private:
     std::size_t fNumCategories;
     bool fRightBorderClosed;
     int fBlockSize;             ///< rows of a segment
-    bool fIsExact = false;      ///< the cells are whole numbers with exact sums: any order of additions gives the same
+    bool fIsExact = false;      ///< all sums of cells are exact: any order of additions gives the same
     double fSmallestCell = 0.0; ///< of those above 0
     std::vector<double>
         fRowsBefore; ///< of an exact table, for each block: the counts of all rows before it, by category

@@ -1,5 +1,6 @@
 #include "data/binattributereader.h"
 
+#include "base/exactsums.h"
 #include "base/makestatus.h"
 #include "data/bindatapreparator.h"
 #include "data/tuplesort.h"
@@ -7,7 +8,6 @@
 #include <mcobnqrt/binvarlist.h>
 
 #include <algorithm>
-#include <cmath>
 #include <exception>
 
 using MCBinning::BinaryRecordIterator;
@@ -202,7 +202,6 @@ MCStatus BINAttributeReader::LoadAttribute(int position)
     fNumDistinct = 0;
     fTotalWeight = 0.0;
     fTotalWeightWithMissing = 0.0;
-    fHasFractions = false;
     if (fHasWeight && !PutOn(fWeightPosition, fWeightIterator, fWeightPosition))
         return MakeError(MCBinning::BINStatusCannotOpenTempFile);
     if (fHasWeight)
@@ -269,8 +268,6 @@ bool BINAttributeReader::AddTuples(std::vector<Tuple>& tuples, const double* val
         if (targets != nullptr && !(code > -1.0 && code < fNumTargetCats))
             return false;
         total += weight;
-        if (weight != 1.0 && weight != std::floor(weight))
-            fHasFractions = true;
         tuples[numTuples++] = MakeTuple<Tuple>(values[i], code, weight);
     }
     fNumTuples = numTuples;
@@ -279,18 +276,20 @@ bool BINAttributeReader::AddTuples(std::vector<Tuple>& tuples, const double* val
     return true;
 }
 
-/// Whether every sum of weights is exact, whatever its order: whole numbers that a double holds all of.
-bool BINAttributeReader::AreSumsExact() const
+/// Whether every sum of weights of the current tuples is exact, whatever its order.
+template<class Tuple>
+bool BINAttributeReader::AreSumsExact(const std::vector<Tuple>& tuples) const
 {
-    constexpr double kLargestWhole = 9007199254740992.0; // 2 to the power of 53
-    return !fHasFractions && fTotalWeight <= kLargestWhole;
+    ExactSums sums(fTotalWeight);
+    for (unsigned int i = 0; i < fNumTuples; ++i) sums.Add(tuples[i].fWeight);
+    return sums.AreExact();
 }
 
 /// Sorts the current tuples and works out the figures that hang on their order.
 template<class Tuple>
 void BINAttributeReader::SortAndMeasure(std::vector<Tuple>& tuples)
 {
-    SortTuples(tuples, fNumTuples, AreSumsExact() ? TieOrder::kAny : TieOrder::kComplete);
+    SortTuples(tuples, fNumTuples, !fHasWeight || AreSumsExact(tuples) ? TieOrder::kAny : TieOrder::kComplete);
     fMinValue = fMaxValue = gMissingValue;
     fNumDistinct = 0;
     if (fNumTuples == 0)

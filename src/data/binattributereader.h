@@ -88,7 +88,8 @@ private:
     std::size_t CommonBlockSize(const Iterator& attribute) const;
     template<class Tuple>
     bool AddTuples(std::vector<Tuple>& tuples, const double* values, std::size_t count);
-    bool AreSumsExact() const;
+    template<class Tuple>
+    bool AreSumsExact(const std::vector<Tuple>& tuples) const;
     template<class Tuple>
     void SortAndMeasure(std::vector<Tuple>& tuples);
 
@@ -108,7 +109,6 @@ private:
     unsigned int fNumRecords = 0; ///< accepted by the pass, and the size of the tuple vector
     double fTotalWeight = 0.0;
     double fTotalWeightWithMissing = 0.0;
-    bool fHasFractions = false; ///< some weight of the current tuples is no whole number
     unsigned int fNumDistinctValueThreshold = 0;
     bool fUseEFAsPreprocess = false; ///< this attribute is to be pre-binned
     int fTargetPosition = 0;

@@ -38,7 +38,10 @@ enum class Cells
     kWhole,
     kFractional,
     kTinyTotal, ///< the ranges weigh about 1 to 2
-    kFarApart   ///< of very different magnitude
+    kFarApart,  ///< of very different magnitude
+    kSixteenths,
+    kFineGrid, ///< multiples of 2^-40, of about 1
+    kMixedGrid ///< multiples of 2^-10, of very different magnitude
 };
 
 double RandomWeight(Dice& dice, Cells kind)
@@ -51,6 +54,12 @@ double RandomWeight(Dice& dice, Cells kind)
         return 0.01 + dice.Fraction() * 3;
     case Cells::kTinyTotal:
         return 0.25 * (1 + dice.Below(3));
+    case Cells::kSixteenths:
+        return 0.0625 * (1 + dice.Below(60));
+    case Cells::kFineGrid:
+        return std::ldexp(std::floor((0.5 + dice.Fraction()) * 0x1p40), -40);
+    case Cells::kMixedGrid:
+        return std::ldexp(1 + dice.Below(1000), dice.Below(20) - 10);
     case Cells::kFarApart:
         break;
     }
@@ -225,7 +234,8 @@ TEST(EntropySplit, EqualsThePlainFormOnSmallTables)
 
 TEST(EntropySplit, EqualsThePlainFormOnTablesLongEnoughForBounds)
 {
-    for (const Cells kind : {Cells::kWhole, Cells::kFractional, Cells::kTinyTotal, Cells::kFarApart})
+    for (const Cells kind : {Cells::kWhole, Cells::kFractional, Cells::kTinyTotal, Cells::kFarApart, Cells::kSixteenths,
+                             Cells::kFineGrid, Cells::kMixedGrid})
     {
         for (unsigned int seed = 1; seed <= 80; ++seed)
         {
@@ -255,4 +265,51 @@ TEST(EntropySplit, EqualsThePlainFormOnTablesOfLongSegments)
             EXPECT_TRUE(EqualsThePlainForm(rows, CaseName(kind, static_cast<unsigned int>(numRows))));
         }
     }
+}
+
+TEST(EntropySplit, EqualsThePlainFormWhereSumsCeaseToBeExact)
+{
+    // 148 cells of one unit and a heavy one, which brings the total to below, to exactly, or to above 2^53 units. Where
+    // the heavy cell alone is 2^53, a sum loses the units behind it one by one, and comes out as 2^53 if no category but
+    // the heavy one has more than a unit.
+    for (const int exponent : {0, -4, -40})
+    {
+        for (const int heavy : {-400, -149, -148, -147, 0})
+        {
+            for (const int numCategories : {2, 49})
+            {
+                Rows rows(148, std::vector<double>(static_cast<std::size_t>(numCategories), 0.0));
+                for (std::size_t row = 0; row < rows.size(); ++row)
+                    rows[row][numCategories == 2 ? row / 37 % 2 : row < 100 ? 0 : row - 99] = 1.0;
+                rows.insert(rows.begin(), std::vector<double>(static_cast<std::size_t>(numCategories), 0.0));
+                rows[0][0] = 0x1p53 + heavy;
+                for (std::vector<double>& row : rows)
+                    for (double& cell : row) cell = std::ldexp(cell, exponent);
+                EqualsThePlainForm(rows, "exponent " + std::to_string(exponent) + " heavy " + std::to_string(heavy) +
+                                             " categories " + std::to_string(numCategories));
+            }
+        }
+    }
+}
+
+TEST(EntropySplit, EqualsThePlainFormAtTheEndsOfTheRange)
+{
+    int numWithCuts = 0;
+    for (const Cells kind : {Cells::kWhole, Cells::kFractional})
+    {
+        for (const int exponent : {-1070, -1000, -60, -12, 48, 60, 500, 1000, 1003, 1006, 1009})
+        {
+            for (unsigned int seed = 1; seed <= 6; ++seed)
+            {
+                Dice dice(seed);
+                Rows rows = RandomRows(dice, 200 + dice.Below(300), 2 + dice.Below(3), kind, 40);
+                UseUp(rows);
+                for (std::vector<double>& row : rows)
+                    for (double& cell : row) cell = std::ldexp(cell, exponent);
+                const std::string what = CaseName(kind, seed) + " exponent " + std::to_string(exponent);
+                numWithCuts += EqualsThePlainForm(rows, what) ? 1 : 0;
+            }
+        }
+    }
+    EXPECT_GT(numWithCuts, 80) << "the tables are too dull to tell anything";
 }

@@ -59,6 +59,35 @@ TEST(AttributeReader, JoinsSortsAndLeavesOutWhatIsMissing)
     EXPECT_EQ(3.0, reader->GetMaxValue());
 }
 
+TEST(AttributeReader, OrderOfRecordsMakesNoDifferenceToASumThatRounds)
+{
+    // Each small weight is lost if it comes after the large one, and counts if it comes before.
+    const std::vector<std::vector<double>> cases{
+        {0x1p53, 1, 1, 1}, {1, 0x1p-53, 0x1p-53, 0x1p-53}, {0x1p13, 0x1p-40, 0x1p-40, 0x1p-40}, {1e300, 1e284, 1e284}};
+    for (const std::vector<double>& weights : cases)
+    {
+        SCOPED_TRACE(testing::PrintToString(weights));
+        RecordTable records;
+        for (const double weight : weights) records.Add({7, 0, weight, 1});
+        RecordTable reversed = records;
+        std::reverse(reversed.fRows.begin(), reversed.fRows.end());
+        const BINVarList list =
+            AVarList().WithAttribute("x").WithTarget("t", 6).WithWeight(kUnrounded).WithAttribute("y");
+
+        const std::vector<double> borders{-100, 100};
+        std::vector<double> table;
+        std::vector<double> reversedTable;
+        LoadedReader reader(list, records);
+        reader.Pair(0, 1);
+        EXPECT_TRUE(reader->TallyBins(&borders, true, table).IsOK());
+        LoadedReader reversedReader(list, reversed);
+        reversedReader.Pair(0, 1);
+        EXPECT_TRUE(reversedReader->TallyBins(&borders, true, reversedTable).IsOK());
+
+        EXPECT_EQ(table, reversedTable);
+    }
+}
+
 TEST(AttributeReader, AttributeWithoutAValueHasNoFigures)
 {
     LoadedReader reader(FullList(), {{gMissingValue, 0, 2, 1}, {gMissingValue, 1, 1, 2}});
