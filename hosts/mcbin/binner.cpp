@@ -12,6 +12,10 @@ Binner::Binner(const Findings& findings, const Result& result, const std::vector
 {
     fMissingTexts.insert(fMissingTexts.end(), missingText.begin(), missingText.end());
     fMissingTexts.insert(fMissingTexts.end(), fVariable->missingTexts.begin(), fVariable->missingTexts.end());
+    fMissingNumbers = fVariable->missingNumbers;
+    for (const std::string& text : fMissingTexts)
+        if (const std::optional<double> number = ParseNumber(text))
+            fMissingNumbers.push_back(*number);
     for (std::size_t code = 0; code < fVariable->categories.size(); ++code)
         fBins.emplace(fVariable->categories[code],
                       FindBin(result.cutPoints, fIsRightClosed, static_cast<double>(code)));
@@ -40,9 +44,8 @@ bool Binner::IsCategorical() const
 
 bool Binner::IsMissing(double value) const
 {
-    const std::vector<double>& numbers = fVariable->missingNumbers;
     const auto& interval = fVariable->missingInterval;
-    return std::find(numbers.begin(), numbers.end(), value) != numbers.end() ||
+    return std::find(fMissingNumbers.begin(), fMissingNumbers.end(), value) != fMissingNumbers.end() ||
            (interval && value >= interval->first && value <= interval->second);
 }
 

@@ -22,7 +22,8 @@ public:
         bool isBad = false;             ///< no number where one should be, or a category never seen
     };
 
-    /// `missingText` counts as missing beside what the findings declare. The findings must outlive the object.
+    /// `missingText` counts as missing beside what the findings declare; a number in it stands for all ways to write the
+    /// number, where the attribute has numbers. The findings must outlive the object.
     Binner(const Findings& findings, const Result& result, const std::vector<std::string>& missingText);
 
     Place Find(std::string_view field);
@@ -37,6 +38,7 @@ private:
     const Result* fResult;
     bool fIsRightClosed;
     std::vector<std::string> fMissingTexts;
+    std::vector<double> fMissingNumbers;                ///< the variable's, and those among the texts
     std::unordered_map<std::string, std::size_t> fBins; ///< by category
     std::string fKey;                                   ///< kept for its memory
 };

@@ -4,11 +4,13 @@
 #include "figures.h"
 #include "findings.h"
 #include "numbers.h"
+#include "variables.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 
 #include <cmath>
 #include <limits>
+#include <utility>
 
 namespace
 {
@@ -81,25 +83,34 @@ Result MakeResult(const LibraryResult& result)
     return made;
 }
 
-void AddBin(Result& result, double weight, const std::vector<double>& weights)
+void AddBin(Result& result, double weight, std::vector<double> weights)
 {
     const std::size_t place = result.bins.size();
     Bin bin;
     bin.left = place == 0 ? -kInfinity : result.cutPoints[place - 1];
     bin.right = place == result.cutPoints.size() ? kInfinity : result.cutPoints[place];
     bin.weight = weight;
-    bin.weights = weights;
+    bin.weights = std::move(weights);
     result.bins.push_back(bin);
 }
 
-/// The library takes numbers alone as missing values of a continuous variable. Texts are known beside it, for all
-/// columns.
-void AddMissingTexts(Findings& findings, const Column& column)
+/// The library takes numbers alone as missing values of a variable that has no categories; the texts stand beside them.
+void AddMissingTexts(Variable& variable, const Column& column)
 {
-    if (column.kind != ColumnKind::kCategorical)
-        for (const std::string& text : column.missingTexts)
-            if (!ParseNumber(text))
-                findings.missingText.push_back(text);
+    if (variable.IsCategorical())
+        return;
+    for (const std::string& text : column.missingTexts)
+        if (!ParseNumber(text))
+            variable.missingTexts.push_back(text);
+}
+
+/// The weights of a row of the table by category. The table has no columns for the last categories if no record that
+/// counts is of them.
+std::vector<double> GetCategoryWeights(const std::vector<double>& row, const Variable& target)
+{
+    std::vector<double> weights(row.begin() + 1, row.end());
+    weights.resize(target.categories.size());
+    return weights;
 }
 
 bool IsIn(const Findings& findings, int index)
@@ -114,11 +125,12 @@ void AddPlan(Findings& findings, const ColumnPlan& plan)
     findings.records = plan.nRows;
     findings.missingText = plan.missingTexts;
     findings.leftOut = plan.DescribeLeftOut();
-    for (const Column& column : plan.columns) AddMissingTexts(findings, column);
 }
 
-void AddVariables(Findings& findings, const BINVarList& list, IBINVariable::BINWRoundingOption rounding)
+void AddVariables(Findings& findings, const ColumnPlan& plan, const Variables& variables,
+                  IBINVariable::BINWRoundingOption rounding)
 {
+    const BINVarList& list = variables.list;
     for (int i = 0; i < static_cast<int>(list.Size()); ++i)
     {
         const IBINVariable& source = *list.GetVarAt(i);
@@ -133,6 +145,7 @@ void AddVariables(Findings& findings, const BINVarList& list, IBINVariable::BINW
             variable.rounding = rounding == IBINVariable::RoundTruncate ? "truncate" : "closest";
         }
         AddMissing(variable, source.GetUserMissingInfo());
+        AddMissingTexts(variable, plan.columns[variables.columns[static_cast<std::size_t>(i)]]);
         findings.variables.push_back(variable);
     }
 }
@@ -146,7 +159,7 @@ void AddResult(Findings& findings, const BINAttributeTargetResults& result)
     // A row of a table that wasn't filled is empty.
     for (const std::vector<double>& row : result.GetCellCounts())
         if (!row.empty())
-            AddBin(made, row.front(), {row.begin() + 1, row.end()});
+            AddBin(made, row.front(), GetCategoryWeights(row, *findings.FindTarget(made)));
     if (!made.bins.empty())
     {
         made.targetEntropy = GetEntropy(GetCategoryWeights(made));

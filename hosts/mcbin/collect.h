@@ -5,16 +5,17 @@
 
 class BINAttributeResults;
 class BINAttributeTargetResults;
-class BINVarList;
 struct ColumnPlan;
 struct Findings;
+struct Variables;
 
 // These fill the findings with what the table and the library say.
 
 void AddPlan(Findings& findings, const ColumnPlan& plan);
 
-/// `rounding` is that of the weight, which the list doesn't tell.
-void AddVariables(Findings& findings, const BINVarList& list, IBINVariable::BINWRoundingOption rounding);
+/// `variables` have been made from `plan`. `rounding` is that of the weight, which their list doesn't tell.
+void AddVariables(Findings& findings, const ColumnPlan& plan, const Variables& variables,
+                  IBINVariable::BINWRoundingOption rounding);
 
 /// Adds a result. The variables must be there, as it is about them. One that names no variable is passed over.
 void AddResult(Findings& findings, const BINAttributeTargetResults& result);

@@ -163,6 +163,15 @@ bool IsInterval(std::string_view value)
            (colon + 1 == value.size() || ParseNumber(value.substr(colon + 1)));
 }
 
+/// The number joins those that are missing in the column, if it isn't there yet.
+void AddMissingNumber(Column& column, const std::string& text)
+{
+    const std::optional<double> number = ParseNumber(text);
+    std::vector<double>& numbers = column.missingNumbers;
+    if (number && std::find(numbers.begin(), numbers.end(), *number) == numbers.end())
+        numbers.push_back(*number);
+}
+
 void DeclareMissing(Column& column, const std::string& value, const std::string& declaration)
 {
     if (IsInterval(value))
@@ -179,8 +188,7 @@ void DeclareMissing(Column& column, const std::string& value, const std::string&
     else
     {
         column.missingTexts.push_back(value);
-        if (const std::optional<double> number = ParseNumber(value))
-            column.missingNumbers.push_back(*number);
+        AddMissingNumber(column, value);
     }
 }
 
@@ -247,6 +255,9 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     else
         SetPairs(plan, table, options);
     for (const std::string& declaration : options.missing) DeclareMissing(plan, table, declaration);
+    // A database, or any other reader of typed columns, sees the number and not the text that stands for it here.
+    for (Column& column : plan.columns)
+        for (const std::string& text : plan.missingTexts) AddMissingNumber(column, text);
     ThrowUnlessText(plan);
     return plan;
 }

@@ -30,7 +30,7 @@ struct Column
     bool isNamed = false; ///< asked for by its own name, so it can't be left out silently
 
     std::vector<std::string> missingTexts; ///< declared for this column, as they are written
-    std::vector<double> missingNumbers;    ///< those of them that are numbers
+    std::vector<double> missingNumbers;    ///< those of them, and of the texts of all columns, that are numbers
     std::optional<std::pair<double, double>> missingInterval;
 
     bool isBelieved = false;                       ///< to hold numbers alone, by its first rows

@@ -137,8 +137,8 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
         ->group("Columns");
     AddMissing(command, columns.missingText, columns.isBadMissing);
     AddRepeated(command, "--missing", columns.missing,
-                "Values of one column that count as missing, and at most one interval of them, both ends included; may "
-                "be repeated",
+                "Texts and numbers of one column that count as missing, and at most one interval of them, both ends "
+                "included; may be repeated",
                 "COLUMN=9,90:99")
         ->group("Input");
 }

@@ -34,9 +34,9 @@ struct Variable
     std::string label;
     VariableKind kind = VariableKind::kContinuous;
     VariableRole role = VariableRole::kAttribute;
-    std::vector<std::string> categories; ///< by code; numbers as they are written
-    std::string rounding;                ///< of a weight: "truncate", "closest" or "none"
-    std::vector<std::string> missingTexts;
+    std::vector<std::string> categories;   ///< by code; numbers as they are written
+    std::string rounding;                  ///< of a weight: "truncate", "closest" or "none"
+    std::vector<std::string> missingTexts; ///< of a categorical one, among them numbers; of others, only what is none
     std::vector<double> missingNumbers;
     std::optional<std::pair<double, double>> missingInterval; ///< infinite ends are IEEE infinities
 
@@ -76,7 +76,7 @@ struct Findings
     SettingOptions settings; ///< without the temporary directory
     std::string dataName;
     std::optional<long> records;
-    std::vector<std::string> missingText;
+    std::vector<std::string> missingText; ///< of all columns
     std::vector<Variable> variables;
     MCBinning::MCStatus status;
     std::vector<Result> results;

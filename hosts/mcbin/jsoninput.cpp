@@ -11,6 +11,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <map>
 
 namespace
 {
@@ -128,6 +129,7 @@ void SetMissing(Variable& variable, const Json& missing)
         else
             variable.missingNumbers.push_back(GetNumber(value));
     }
+    for (const Json& text : GetArray(missing.at("texts"))) variable.missingTexts.push_back(text.get<std::string>());
     const Json& interval = missing.at("interval");
     if (!interval.is_null())
         variable.missingInterval = {GetNumber(interval.at(0)), GetNumber(interval.at(1))};
@@ -221,7 +223,32 @@ Result GetResult(const Findings& findings, const Json& json)
     return result;
 }
 
-Findings GetFindings(const Json& json)
+void PadWeights(Json& bins, std::size_t nCategories)
+{
+    for (Json& bin : bins)
+    {
+        Json& weights = bin.at("weights");
+        while (weights.is_array() && weights.size() < nCategories) weights.push_back(0);
+    }
+}
+
+/// Makes a document of version 1 one of version 2. In the former the missing texts of each column are among those of
+/// all columns, and the bins lack the weights of the target's last categories if no record that counts is of them.
+void Upgrade(Json& document)
+{
+    std::map<std::string, std::size_t> nCategories; // by the name of the variable
+    for (Json& variable : document.at("variables"))
+    {
+        variable.at("missing")["texts"] = Json::array();
+        if (variable.at("categories").is_array())
+            nCategories[variable.at("name").get<std::string>()] = variable.at("categories").size();
+    }
+    for (Json& result : document.at("results"))
+        if (result.at("target").is_string())
+            PadWeights(result.at("bins"), nCategories[result.at("target").get<std::string>()]);
+}
+
+Findings GetFindings(Json json)
 {
     if (!json.is_object() || json.value("schema", "") != kSchema)
         throw Failure("it is no file of bins, as --format json writes it");
@@ -229,6 +256,8 @@ Findings GetFindings(const Json& json)
     if (version < 1 || version > kSchemaVersion)
         throw Failure(
             fmt::format("it has schema version {}, and this tool knows versions up to {}", version, kSchemaVersion));
+    if (version == 1)
+        Upgrade(json);
     Findings findings;
     findings.componentVersion = json.at("component_version").get<std::string>();
     findings.settings = GetSettings(json);

@@ -101,8 +101,10 @@ Json MakeCategories(const Variable& variable)
 
 Json MakeMissing(const Variable& variable)
 {
+    const bool areTexts = variable.kind == VariableKind::kStringCategorical;
     Json json;
-    json["values"] = variable.missingTexts.empty() ? MakeNumbers(variable.missingNumbers) : Json(variable.missingTexts);
+    json["values"] = areTexts ? Json(variable.missingTexts) : MakeNumbers(variable.missingNumbers);
+    json["texts"] = areTexts ? Json::array() : Json(variable.missingTexts);
     json["interval"] = nullptr;
     if (variable.missingInterval)
         json["interval"] = MakeNumbers({variable.missingInterval->first, variable.missingInterval->second});

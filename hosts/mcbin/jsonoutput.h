@@ -7,7 +7,7 @@ struct Findings;
 
 /// The name and version of the form, which docs/json.md describes.
 inline constexpr const char* kSchema = "mcobnqrt-bins";
-inline constexpr int kSchemaVersion = 1;
+inline constexpr int kSchemaVersion = 2;
 
 void PrintJson(std::ostream& os, const Findings& findings);
 

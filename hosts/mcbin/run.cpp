@@ -109,7 +109,7 @@ Findings FindBins(TableReader& table, const BinOptions& options, Progress& progr
     findings.settings = options.settings;
     findings.dataName = table.GetName();
     AddPlan(findings, plan);
-    AddVariables(findings, variables.list, options.columns.rounding);
+    AddVariables(findings, plan, variables, options.columns.rounding);
 
     Announce(progress, variables);
     TableRecordSource source(table, plan, variables, progress);

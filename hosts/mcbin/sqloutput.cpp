@@ -36,7 +36,9 @@ std::string MakeMissingCondition(const std::string& name, const Variable& variab
 {
     std::vector<std::string> values;
     for (const double number : variable.missingNumbers) values.push_back(FormatNumber(number));
-    for (const std::string& text : variable.missingTexts) values.push_back(Enclose(text, '\''));
+    // A column of numbers can't hold the texts that stand for a missing value in a file.
+    if (variable.kind == VariableKind::kStringCategorical)
+        for (const std::string& text : variable.missingTexts) values.push_back(Enclose(text, '\''));
     std::string condition = values.empty() ? "" : " OR " + name + " IN " + MakeList(values);
     if (!variable.missingInterval)
         return condition;

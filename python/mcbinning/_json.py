@@ -13,7 +13,7 @@ from ._result import AttributeBins, BinningResult, Settings, Variable
 from ._status import Status
 
 _SCHEMA = "mcobnqrt-bins"
-_SCHEMA_VERSION = 1
+_SCHEMA_VERSION = 2
 
 
 def dump(result: BinningResult) -> str:
@@ -24,8 +24,8 @@ def dump(result: BinningResult) -> str:
         "method": result.method,
         "settings": {
             "closed": result.settings.closed,
-            "bins": result.settings.n_bins,
-            "distinct_threshold": result.settings.max_distinct,
+            "bins": int(result.settings.n_bins),
+            "distinct_threshold": _int_or_none(result.settings.max_distinct),
             "small_bins": _number_or_none(result.settings.small_bin_ratio),
         },
         "data": {"name": result.data_name, "records": result.records, "missing_text": list(result.missing_text)},
@@ -36,12 +36,33 @@ def dump(result: BinningResult) -> str:
     return json.dumps(document, ensure_ascii=False, allow_nan=False, indent=2) + "\n"
 
 
+def _upgrade(document: dict[str, Any]) -> None:
+    """Makes a document of version 1 one of version 2. In the former the missing texts of each column are among those of
+    all columns, which are not declared as numbers, too; and the bins lack the weights of the target's last categories if
+    no record that counts is of them."""
+    numbers = [number for number in map(_values.parse, document["data"]["missing_text"]) if number is not None]
+    for variable in document["variables"]:
+        missing = variable["missing"]
+        missing["texts"] = []
+        if variable["kind"] != "string-categorical":
+            missing["values"] += [number for number in numbers if number not in map(float, missing["values"])]
+    n_categories = {
+        variable["name"]: len(variable["categories"]) for variable in document["variables"] if variable["categories"]
+    }
+    for result in document["results"]:
+        if result["target"] is not None:
+            for row in result["bins"]:
+                row["weights"] += [0] * (n_categories[result["target"]] - len(row["weights"]))
+
+
 def load(text: str) -> BinningResult:
     document = json.loads(text)
     if not isinstance(document, dict) or document.get("schema") != _SCHEMA:
         raise ValueError(f"the text is no JSON of bins: its schema is not {_SCHEMA!r}")
     if document["schema_version"] > _SCHEMA_VERSION:
         raise ValueError(f"the bins have schema version {document['schema_version']}, which is newer than this package")
+    if document["schema_version"] == 1:
+        _upgrade(document)
     settings = document["settings"]
     variables = tuple(_load_variable(member) for member in document["variables"])
     by_name = {variable.name: variable for variable in variables if variable.role != "weight"}
@@ -73,7 +94,11 @@ def _number(value: float) -> float | int | str:
 
 def _number_or_none(value: float | None) -> float | int | str | None:
     """None for a figure that was not found."""
-    return None if value is None or math.isnan(value) else _number(value)
+    return None if value is None or math.isnan(value) else _number(float(value))
+
+
+def _int_or_none(value: int | None) -> int | None:
+    return None if value is None else int(value)
 
 
 def _end(value: float) -> float | int | str:
@@ -120,6 +145,7 @@ def _dump_variable(variable: Variable) -> dict[str, Any]:
         "rounding": variable.rounding,
         "missing": {
             "values": _dump_list(variable.missing_values),
+            "texts": list(variable.missing_texts),
             "interval": None if interval is None else [_end(end) for end in interval],
         },
         # Beyond what mcbin knows: what the numbers stand for.
@@ -146,6 +172,7 @@ def _load_variable(member: dict[str, Any]) -> Variable:
         missing_interval=None if interval is None else (float(interval[0]), float(interval[1])),
         label=member["label"],
         rounding=member["rounding"],
+        missing_texts=tuple(member["missing"]["texts"]),
     )
 
 

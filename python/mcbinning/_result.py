@@ -37,6 +37,8 @@ class Variable:
     missing_interval: tuple[float, float] | None = None
     label: str = ""
     rounding: str | None = None
+    missing_texts: tuple[str, ...] = ()
+    """What stands for a missing value in a text file, where `missing_values` are numbers."""
 
     @property
     def is_categorical(self) -> bool:

@@ -5,7 +5,7 @@ from __future__ import annotations
 import errno
 import glob
 import os
-from collections.abc import Callable, Sequence
+from collections.abc import Callable, Mapping, Sequence
 from dataclasses import dataclass
 from functools import cached_property
 from typing import Any
@@ -67,11 +67,14 @@ def columns_of(table: _core.Table) -> tuple[Column, ...]:
     return tuple(Column(*fields) for fields in table.columns)
 
 
-def open_source(data: Any, missing_text: Sequence[str] = ()) -> Source:
+def open_source(
+    data: Any, missing_text: Sequence[str] = (), missing_texts: Mapping[str, Sequence[str]] | None = None
+) -> Source:
     """Any object with the Arrow stream protocol, or a path that DuckDB reads. In a text file each of `missing_text`
-    stands for a missing value, as an empty field does."""
+    stands for a missing value, as an empty field does; and so does each of `missing_texts`, by the name of the column,
+    in a column of numbers."""
     if isinstance(data, (str, os.PathLike)):
-        return _open_path(os.fspath(data), missing_text)
+        return _open_path(os.fspath(data), missing_text, missing_texts or {})
     kind = type(data)
     module = kind.__module__.partition(".")[0]
     if module in ("duckdb", "_duckdb") and hasattr(data, "project"):
@@ -124,7 +127,7 @@ def _read(relation: Any) -> _core.Table:
     return _stream(reader)
 
 
-def _open_path(path: str, missing_text: Sequence[str]) -> Source:
+def _open_path(path: str, missing_text: Sequence[str], missing_texts: Mapping[str, Sequence[str]]) -> Source:
     import duckdb
 
     stem = path.removesuffix(".gz").removesuffix(".zst").lower()
@@ -136,12 +139,29 @@ def _open_path(path: str, missing_text: Sequence[str]) -> Source:
     options = {"na_values": ["", *missing_text]} if missing_text and function == "read_csv" else {}
     try:
         # A method, as a query with parameters is run at once and kept whole by older versions.
-        relation = getattr(connection, function)(path, **options)
+        read = getattr(connection, function)
+        relation = read(path, **options)
+        typed = {name: "VARCHAR" for name in relation.columns if name in missing_texts}
+        if typed and function == "read_csv":
+            relation = _blank_texts(read(path, dtype=typed, **options), missing_texts)
     except duckdb.Error as error:
         if "://" not in path and not glob.glob(os.path.expanduser(path), recursive=True):
             raise FileNotFoundError(errno.ENOENT, os.strerror(errno.ENOENT), path) from None
         raise DataError(f"{path} can't be read: {error}") from error
     return _open_relation(relation, path)
+
+
+def _blank_texts(relation: Any, missing_texts: Mapping[str, Sequence[str]]) -> Any:
+    """Makes numbers of the columns with missing texts, which have been read as texts: DuckDB itself knows such texts only
+    for all columns."""
+
+    def select(name: str) -> str:
+        column = _quote(name)
+        texts = ", ".join("'" + text.replace("'", "''") + "'" for text in missing_texts.get(name, ()))
+        number = f"CAST(CASE WHEN trim({column}) IN ({texts}) THEN NULL ELSE {column} END AS DOUBLE) AS {column}"
+        return number if texts else column
+
+    return relation.project(", ".join(map(select, relation.columns)))
 
 
 def _open_pandas(frame: Any) -> Source:

@@ -18,7 +18,8 @@ _ROWS_AT_ONCE = 1 << 17
 
 def transform(result: BinningResult, data: Any, labels: bool) -> Any:
     chosen = _one_for_each_attribute(result.bins)
-    source = open_source(data, result.missing_text)
+    texts = {found.attribute: found.variable.missing_texts for found in chosen if found.variable.missing_texts}
+    source = open_source(data, result.missing_text, texts)
     feed = open_values(source, [found.variable for found in chosen], result.missing_text)
     schema = pa.schema([(found.attribute, pa.utf8() if labels else pa.int32()) for found in chosen])
     batches = _batches(feed, chosen, schema, labels)

@@ -58,6 +58,15 @@ def encode(value: Any, kind: str) -> float:
     return float(value)
 
 
+def parse(text: str) -> float | None:
+    """The number that a field of a text file stands for; None if it is no finite number."""
+    try:
+        value = float(text)
+    except ValueError:
+        return None
+    return value if math.isfinite(value) and "_" not in text else None
+
+
 def plain(value: float) -> float | int:
     """A whole number as an int, so that it is written without a point."""
     is_whole = math.isfinite(value) and value.is_integer() and abs(value) < 1e15

@@ -11,26 +11,36 @@ namespace
 
 std::string PickGrade(int row)
 {
-    return row % 41 == 0 ? "" : row % 43 == 0 ? "it's" : row < 120 ? "a" : row < 200 ? "b" : "c";
+    return row % 41 == 0 ? "" : row % 43 == 0 ? "it's" : row < 120 ? "a" : row < 200 ? "b" : "unknown";
+}
+
+std::string PickX(int row)
+{
+    return row % 29 == 0   ? ""
+           : row % 31 == 0 ? "?"
+           : row % 37 == 0 ? "-9"
+           : row % 41 == 0 ? "-9.0"
+           : row % 43 == 0 ? "unknown"
+                           : std::to_string(row / 2 * 0.5);
 }
 
 /// Rows with weights, missing values of each kind, and values on cut points. The category "k1" to "k3" of the rows
-/// rises with x, and "grade" with it.
+/// rises with x, and "grade" with it. What is missing in x is a category of grade.
 std::string MakeCustomers()
 {
     std::string data = "id,x,\"od\"\"d\",grade,y,w\n";
     for (int i = 0; i < 300; ++i)
     {
-        const std::string x = i % 29 == 0 ? "" : i % 31 == 0 ? "?" : i % 37 == 0 ? "-9" : std::to_string(i / 2 * 0.5);
         const char* y = (i < 100) != (i % 17 == 0) ? "k1" : (i < 200) != (i % 13 == 0) ? "k2" : "k3";
-        data += std::to_string(i) + "," + x + "," + std::to_string(i / 7) + "," + PickGrade(i) + "," + y + "," +
+        data += std::to_string(i) + "," + PickX(i) + "," + std::to_string(i / 7) + "," + PickGrade(i) + "," + y + "," +
                 std::to_string(i % 4) + "\n";
     }
     return data;
 }
 
-constexpr const char* kOptions = "--target y --exclude id --categorical grade --missing-text '?' --missing x=-99:-1 "
-                                 "--missing '*d=7,9' --missing grade=\"it's\" --weight w ";
+constexpr const char* kOptions =
+    "--target y --exclude id --categorical grade --missing-text '?,-9' --missing x=unknown "
+    "--missing '*d=7,9,30:32' --missing grade=\"it's\" --weight w ";
 
 class McbinApply : public Mcbin, public testing::WithParamInterface<const char*>
 {
@@ -61,7 +71,7 @@ TEST_P(McbinApply, GivesTheWeightsOfTheTablesAndWhatTheSqlGives)
     Write("bins.json", json.out);
     Write("bins.sql",
           "CREATE TABLE t (id, x REAL, \"od\"\"d\" REAL, grade, y, w INTEGER);\n.mode csv\n.import data.csv t\n"
-          "UPDATE t SET x = NULL WHERE x IN ('', '?');\nUPDATE t SET grade = NULL WHERE grade = '';\n"
+          "UPDATE t SET x = NULL WHERE x IN ('', '?', 'unknown');\nUPDATE t SET grade = NULL WHERE grade = '';\n"
           "DELETE FROM t WHERE id = 'id';\nSELECT *, " +
               Run("supervised data.csv " + (kOptions + closed) + " --format sql").out +
               "FROM t ORDER BY CAST(id AS INTEGER);\n");
@@ -122,6 +132,29 @@ TEST_F(Mcbin, AppliesWhatThePythonPackageHasWritten)
         "mcbin: data.csv, line 2: column 'grade': '3' is a category that the bins don't know; with --bad missing it "
         "counts as missing\n",
         RunOn("grade\n3\n", "apply bins.json", "").err);
+}
+
+TEST_F(Mcbin, ReadsTheVersionOfItsFilesWhereMissingTextsOfAColumnStandAmongThoseOfAll)
+{
+    // What that version wrote of a column x with --missing x=unknown and --missing-text=-9, and of a target whose last
+    // category is in a row without weight.
+    Write("bins.json", R"({"schema": "mcobnqrt-bins", "schema_version": 1, "component_version": "",
+      "method": "supervised",
+      "settings": {"closed": "right", "bins": 1000, "distinct_threshold": null, "small_bins": 0},
+      "data": {"name": null, "records": null, "missing_text": ["-9", "unknown"]},
+      "variables": [{"name": "x", "label": "", "kind": "continuous", "role": "attribute",
+                     "categories": null, "rounding": null, "missing": {"values": [], "interval": null}},
+                    {"name": "y", "label": "", "kind": "string-categorical", "role": "target",
+                     "categories": ["a", "b", "z"], "rounding": null, "missing": {"values": [], "interval": null}}],
+      "status": {"code": 0, "severity": "ok", "words": "OK", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
+      "results": [{"attribute": "x", "target": "y",
+                   "status": {"code": 0, "severity": "ok", "words": "OK", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
+                   "distinct_values": 20, "weight": 20, "weight_with_missing": 20, "minimum": 1, "maximum": 20,
+                   "target_entropy": 1, "model_entropy": 0, "cut_points": [10],
+                   "bins": [{"left": "-inf", "right": 10, "weight": 10, "weights": [10, 0]},
+                            {"left": 10, "right": "inf", "weight": 10, "weights": [0, 10]}]}]})");
+
+    EXPECT_EQ("x,x_bin\n10,0\n11,1\n-9.0,\nunknown,\n", RunOn("x\n10\n11\n-9.0\nunknown\n", "apply bins.json", "").out);
 }
 
 TEST_F(Mcbin, AppliesToOtherColumnsInAnotherOrderAndSaysWhatDoesNotFit)

@@ -83,7 +83,7 @@ TEST_F(McbinOutput, MoreCategoriesThanShadesShareTheLastOne)
 TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
 {
     const Outcome outcome = RunOn("x,y,w\n0.1,a,1\n0.30000000000000004,a,1\n1e300,b,1\n,b,2\n", "supervised",
-                                  "--target y --weight w --missing x=7,90: --missing-text NA --format json");
+                                  "--target y --weight w --missing x=7,90:,unknown --missing-text NA,-9 --format json");
 
     std::string json = outcome.out;
     const std::size_t version = json.find("(MCOBNQRT ");
@@ -91,11 +91,11 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
     json.replace(version, json.find(')', version) - version, "(V");
     EXPECT_EQ(R"json({
   "schema": "mcobnqrt-bins",
-  "schema_version": 1,
+  "schema_version": 2,
   "component_version": "Supervised Binning Component Ver. 1.0 (V)",
   "method": "supervised",
   "settings": {"closed": "right", "bins": 1000, "distinct_threshold": null, "small_bins": 0},
-  "data": {"name": "data.csv", "records": 4, "missing_text": ["NA"]},
+  "data": {"name": "data.csv", "records": 4, "missing_text": ["NA", "-9"]},
   "variables": [
     {
       "name": "x",
@@ -104,7 +104,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "role": "attribute",
       "categories": null,
       "rounding": null,
-      "missing": {"values": [7], "interval": [90, "inf"]}
+      "missing": {"values": [7, -9], "texts": ["unknown"], "interval": [90, "inf"]}
     },
     {
       "name": "y",
@@ -113,7 +113,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "role": "target",
       "categories": ["a", "b"],
       "rounding": null,
-      "missing": {"values": [], "interval": null}
+      "missing": {"values": [], "texts": [], "interval": null}
     },
     {
       "name": "w",
@@ -122,7 +122,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "role": "weight",
       "categories": null,
       "rounding": "closest",
-      "missing": {"values": [], "interval": null}
+      "missing": {"values": [-9], "texts": [], "interval": null}
     }
   ],
   "status": {"code": 120018, "severity": "warning", "words": "some results carry a warning or an error", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
