@@ -15,29 +15,47 @@ namespace
 
 using Indices = std::vector<std::size_t>;
 
-/// The columns that a name or pattern stands for. A column's own name counts before the pattern in it.
-Indices FindColumns(const TableReader& table, const std::string& pattern)
+bool HasColumn(const TableReader& table, const std::string& name)
+{
+    const std::vector<std::string>& names = table.GetColumnNames();
+    return std::find(names.begin(), names.end(), name) != names.end();
+}
+
+Indices FindMatches(const TableReader& table, const std::string& pattern)
 {
     const std::vector<std::string>& names = table.GetColumnNames();
     Indices found;
-    if (IsPattern(pattern) && std::find(names.begin(), names.end(), pattern) == names.end())
+    if (IsPattern(pattern))
         for (std::size_t i = 0; i < names.size(); ++i)
             if (Matches(pattern, names[i]))
                 found.push_back(i);
-    if (found.empty())
-        found.push_back(table.FindColumn(pattern));
     return found;
+}
+
+/// The columns that a name or pattern stands for. The name of a column such as "a[1]" stands for that column; where it
+/// matches others as a pattern, there is no telling which is meant.
+Indices FindColumns(const TableReader& table, const std::string& pattern)
+{
+    const Indices matches = FindMatches(table, pattern);
+    if (!matches.empty() && !HasColumn(table, pattern))
+        return matches;
+    const std::size_t own = table.FindColumn(pattern);
+    for (const std::size_t other : matches)
+        if (other != own)
+            throw Failure(Quote(pattern) + " is the name of a column, and a pattern that " +
+                          Quote(table.GetColumnNames()[other]) + " matches, too; " + Quote(EscapePattern(pattern)) +
+                          " stands for the column alone");
+    return {own};
 }
 
 /// The names and patterns of a list, split at its commas where it isn't the name of a column as it stands.
 std::vector<std::string> SplitNames(const TableReader& table, const std::vector<std::string>& lists)
 {
-    const std::vector<std::string>& columns = table.GetColumnNames();
     std::vector<std::string> names;
     for (const std::string& list : lists)
     {
-        const bool isName = std::find(columns.begin(), columns.end(), list) != columns.end();
-        const std::vector<std::string> parts = isName ? std::vector<std::string>{list} : Split(list, ',');
+        const std::vector<std::string> parts =
+            HasColumn(table, list) ? std::vector<std::string>{list} : Split(list, ',');
         names.insert(names.end(), parts.begin(), parts.end());
     }
     return names;
@@ -91,9 +109,8 @@ void SetTargetAndWeight(ColumnPlan& plan, const TableReader& table, const Column
 /// Where ATTRIBUTE:TARGET is split: names may hold colons, so it is where a column's name follows.
 std::pair<std::string, std::string> SplitPair(const TableReader& table, const std::string& pair)
 {
-    const std::vector<std::string>& names = table.GetColumnNames();
     for (std::size_t at = pair.find(':'); at != std::string::npos; at = pair.find(':', at + 1))
-        if (std::find(names.begin(), names.end(), pair.substr(at + 1)) != names.end())
+        if (HasColumn(table, pair.substr(at + 1)))
             return {pair.substr(0, at), pair.substr(at + 1)};
     const std::size_t colon = pair.find(':');
     if (colon == std::string::npos)
@@ -131,8 +148,9 @@ void SetPairs(ColumnPlan& plan, const TableReader& table, const ColumnOptions& o
 
 void SetAttributes(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
 {
-    const std::vector<std::string> all{"*"};
-    for (const std::string& pattern : SplitNames(table, options.attributes.empty() ? all : options.attributes))
+    if (options.attributes.empty())
+        for (Column& column : plan.columns) column.isAttribute = !column.isTarget && !column.isWeight;
+    for (const std::string& pattern : SplitNames(table, options.attributes))
         for (const std::size_t i : FindColumns(table, pattern))
         {
             Column& column = plan.columns[i];

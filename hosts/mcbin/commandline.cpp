@@ -55,6 +55,13 @@ CLI::Validator MakeDelimiterCheck()
                           "", "");
 }
 
+/// For names that have no meaning if they are empty, as from a variable of a shell that isn't set: they would seem not
+/// to be given.
+CLI::Validator MakeNameCheck()
+{
+    return CLI::Validator([](const std::string& name) { return name.empty() ? "the name is empty" : ""; }, "", "");
+}
+
 /// CLI::Range lets a NaN pass.
 CLI::Validator MakeRatioCheck()
 {
@@ -112,11 +119,14 @@ void AddMissing(CLI::App& command, std::vector<std::string>& missingText, bool& 
 void AddColumns(CLI::App& command, ColumnOptions& columns)
 {
     AddRepeated(command, "--attributes", columns.attributes,
-                "The columns to bin; names or patterns such as 'x_*'. All columns of numbers if not given", "NAME,...")
+                "The columns to bin; names or patterns such as 'x_*', where 'x_[*]' is the name x_*. All columns of "
+                "numbers if not given",
+                "NAME,...")
         ->group("Columns");
     AddRepeated(command, "--exclude", columns.exclude, "Columns not to bin; names or patterns", "NAME,...")
         ->group("Columns");
     command.add_option("--weight", columns.weight, "The column that tells how many cases a row stands for")
+        ->check(MakeNameCheck())
         ->option_text("NAME")
         ->group("Columns");
     command
@@ -156,6 +166,7 @@ void AddSettings(CLI::App& command, SettingOptions& settings)
         .add_option_function<std::string>(
             "--temp-dir", [&settings](const std::string& directory) { settings.tempDirectory = directory; },
             "Where the temporary files go, which hold all records; the system's directory if not given")
+        ->check(MakeNameCheck())
         ->option_text("DIR")
         ->group("Settings");
 }
@@ -177,6 +188,7 @@ void AddOutput(CLI::App& command, OutputOptions& output)
         ->option_text("FORMAT")
         ->group("Output");
     command.add_option("--report", output.report, "Write a page with tables and charts, too")
+        ->check(MakeNameCheck())
         ->check(CLI::Validator(
             [](const std::string& file) { return file == "-" ? "standard output is for the bins" : ""; }, "", ""))
         ->option_text("FILE.html")
@@ -193,6 +205,7 @@ void AddSupervised(CLI::App& app, Request& request)
     AddTable(command, request.bin.table);
     CLI::Option* const target =
         command.add_option("--target", request.bin.columns.target, "The column whose categories are to be separated")
+            ->check(MakeNameCheck())
             ->option_text("NAME")
             ->group("Columns");
     CLI::Option* const pairs =
@@ -271,6 +284,7 @@ void AddApply(CLI::App& app, Request& request)
     AddMissing(command, options.missingText, options.isBadMissing);
     options.output = "-";
     command.add_option("-o,--output", options.output, "The file to write; standard output if not given")
+        ->check(MakeNameCheck())
         ->option_text("FILE")
         ->group("Output");
     command.add_flag("--labels", options.areLabels, "Write intervals, not the numbers of the bins from 0")

@@ -118,3 +118,14 @@ bool IsPattern(std::string_view text)
 {
     return text.find_first_of("*?[") != std::string_view::npos;
 }
+
+std::string EscapePattern(std::string_view name)
+{
+    std::string pattern;
+    for (const char c : name)
+        if (c == '\\')
+            pattern += "\\\\";
+        else
+            pattern += IsPattern(std::string_view(&c, 1)) ? std::string{'[', c, ']'} : std::string(1, c);
+    return pattern;
+}

@@ -33,4 +33,7 @@ bool Matches(const std::string& pattern, const std::string& name);
 /// Whether the text has characters that make it a pattern.
 bool IsPattern(std::string_view text);
 
+/// The pattern that only `name` matches, which has such characters.
+std::string EscapePattern(std::string_view name);
+
 #endif

@@ -296,6 +296,42 @@ TEST_F(McbinInput, ColumnsAreChosenByNameAndPatternAndTheirKindsOverruled)
     EXPECT_NE(std::string::npos, Run("supervised data.csv --target y").err.find("'column 20' and 5 more\n"));
 }
 
+TEST_F(McbinInput, NamesThatLookLikePatternsOrOptionsStandForTheirColumns)
+{
+    struct Case
+    {
+        const char* header;
+        const char* options;
+        const char* words;
+    };
+    const Case cases[] = {
+        {"*,a,b", "", "attributes: * a b "},
+        {"*,a,b", "--attributes '*'",
+         "'*' is the name of a column, and a pattern that 'a' matches, too; '[*]' stands for "
+         "the column alone"},
+        {"*,a,b", "--exclude '[*]'", "attributes: a b "},
+        {"*,a,b", "--missing '*=0'", "'[*]' stands for the column alone"},
+        {"a[1],a?,b", "--attributes 'a[1],b'", "attributes: a[1] b "},
+        {"a[1],a1,b", "--attributes 'a[1]'", "'a[[]1]' stands for the column alone"},
+        {"a[1],a1,b", "--attributes 'a[[]1]'", "attributes: a[1] "},
+        {"--weight,-x,--", "", "attributes: --weight -x -- "},
+        {"--weight,-x,--", "--attributes=-x --weight=--weight", "attributes: -x "},
+        {",a,b", "", "attributes: column 1 a b "},
+        {"a,b,c", "--weight ''", "mcbin: --weight: the name is empty"},
+        {"a,b,c", "--report ''", "mcbin: --report: the name is empty"},
+        {"a,b,c", "--temp-dir ''", "mcbin: --temp-dir: the name is empty"},
+        {"a,b,c", "--exclude ''", "no column is named ''; there are 'a', 'b', 'c'"},
+    };
+    for (const Case& c : cases)
+    {
+        const Outcome outcome =
+            RunOn(std::string(c.header) + "\n1,5,3\n2,6,4\n3,7,5\n", "equal-frequency",
+                  std::string("--bins 2 --format csv ") + c.options + " | sed 1d | cut -d, -f1 | uniq | tr '\\n' ' '");
+        const std::string words = outcome.out.empty() ? outcome.err : "attributes: " + outcome.out;
+        EXPECT_NE(std::string::npos, words.find(c.words)) << c.header << ' ' << c.options << '\n' << words;
+    }
+}
+
 TEST_F(McbinInput, PairsBinForSeveralTargetsInOnePass)
 {
     std::string data = "a,b,p,q\n";
