@@ -66,23 +66,13 @@ void ThrowIfTaken(const TableReader& table, const std::vector<BinColumn>& column
                                     " already; --in-place-columns makes no new ones");
 }
 
-/// A line of a single empty field would be a blank one, which no reader counts.
-void EndLine(std::string& line)
-{
-    if (line.empty())
-        line = "\"\"";
-    line += '\n';
-}
-
 std::string MakeHeader(const TableReader& table, const std::vector<BinColumn>& columns, bool isInPlace)
 {
-    std::vector<std::string> names;
-    for (const std::string& name : table.GetHeader()) names.push_back(QuoteField(name, table.GetDelimiter()));
+    std::string header = table.GetHeader();
     if (!isInPlace)
-        for (const BinColumn& column : columns) names.push_back(QuoteField(column.name, table.GetDelimiter()));
-    std::string header = Join(names, std::string(1, table.GetDelimiter()));
-    EndLine(header);
-    return header;
+        for (const BinColumn& column : columns)
+            header += table.GetDelimiter() + QuoteField(column.name, table.GetDelimiter());
+    return header + table.GetLineEnd();
 }
 
 [[noreturn]] void ThrowBadField(const TableReader& table, const CsvRow& row, const BinColumn& column)
@@ -104,7 +94,7 @@ std::string_view FindField(const TableReader& table, const CsvRow& row, BinColum
     return place.bin ? std::string_view(column.fields[*place.bin]) : std::string_view();
 }
 
-/// Writes rows: the input's fields, some perhaps replaced, and further ones behind them.
+/// Writes rows: the input's fields as they stand there, some perhaps replaced, and further ones behind them.
 class RowWriter
 {
 public:
@@ -119,21 +109,29 @@ public:
     const std::string& MakeLine(const CsvRow& row)
     {
         fLine.clear();
-        for (std::size_t i = 0; i < row.Size(); ++i)
+        if (fOptions.isInPlace)
+            AppendReplaced(row);
+        else
         {
-            if (fOwn[i])
-                Append(FindField(fTable, row, *fOwn[i], fOptions.isBadMissing));
-            else
-                Append(QuoteField(row[i], fTable.GetDelimiter()));
-        }
-        if (!fOptions.isInPlace)
+            Append(row.GetText().fields);
             for (BinColumn& column : fColumns) Append(FindField(fTable, row, column, fOptions.isBadMissing));
+        }
         fLine.pop_back(); // the delimiter behind the last field
-        EndLine(fLine);
+        // A line of a single empty field would be a blank one, which no reader counts.
+        if (fLine.empty())
+            fLine = "\"\"";
+        fLine += row.GetText().end.empty() ? fTable.GetLineEnd() : row.GetText().end;
         return fLine;
     }
 
 private:
+    void AppendReplaced(const CsvRow& row)
+    {
+        SplitFields(row.GetText().fields, fTable.GetDelimiter(), fFields);
+        for (std::size_t i = 0; i < fFields.size(); ++i)
+            Append(fOwn[i] ? FindField(fTable, row, *fOwn[i], fOptions.isBadMissing) : fFields[i]);
+    }
+
     void Append(std::string_view field)
     {
         fLine += field;
@@ -143,7 +141,8 @@ private:
     const TableReader& fTable;
     std::vector<BinColumn>& fColumns;
     const ApplyOptions& fOptions;
-    std::vector<BinColumn*> fOwn; ///< by column of the table: what replaces it, or null
+    std::vector<BinColumn*> fOwn;          ///< by column of the table: what replaces it, or null
+    std::vector<std::string_view> fFields; ///< of the row at hand
     std::string fLine;
 };
 

@@ -98,6 +98,12 @@ void CsvReader::Rewind()
     fNumRows = fNextRow = 0;
     fInRow = false;
     fFailure = nullptr;
+    fCutter.Clear();
+}
+
+std::string_view CsvReader::GetMark() const
+{
+    return fHasMark ? kUtf8Mark : std::string_view();
 }
 
 void CsvReader::ReadBeginning()
@@ -108,7 +114,8 @@ void CsvReader::ReadBeginning()
     fLastTerminator = 0;
     Refill();
     const std::string_view beginning = MakeView(fBegin, fEnd);
-    if (beginning.substr(0, kUtf8Mark.size()) == kUtf8Mark)
+    fHasMark = beginning.substr(0, kUtf8Mark.size()) == kUtf8Mark;
+    if (fHasMark)
         fBegin += kUtf8Mark.size();
     if (beginning.substr(0, 2) == "\xFF\xFE" || beginning.substr(0, 2) == "\xFE\xFF")
         throw Failure(GetName() + ": the file is UTF-16; make it UTF-8 first, as by iconv -f UTF-16 -t UTF-8");
@@ -129,9 +136,18 @@ bool CsvReader::FindLine()
             return true;
         }
         const std::ptrdiff_t size = fEnd - fBegin;
-        // The parser takes parts of a line, too; so a file whose lines end with CR doesn't fill the memory.
-        const bool isForParser = fInRow || FindSpecial(fEnd) < fEnd;
-        if ((isForParser && static_cast<std::size_t>(size) == fBuffer.size()) || !Refill())
+        if (static_cast<std::size_t>(size) == fBuffer.size())
+        {
+            // The parser takes parts of a line, too; so a file whose lines end with CR doesn't fill the memory. A CR at
+            // the end waits for the LF that may follow.
+            const char* const partEnd = fEnd[-1] == '\r' ? fEnd - 1 : fEnd;
+            if (fInRow || FindSpecial(partEnd) < partEnd)
+            {
+                fLineEnd = partEnd;
+                return true;
+            }
+        }
+        if (!Refill())
         {
             fLineEnd = fEnd;
             return fBegin != fEnd;
@@ -182,10 +198,12 @@ const char* CsvReader::FindSpecial(const char* end)
 bool CsvReader::SplitLine(std::string_view line)
 {
     fPlainRow.fLine = fLine++;
+    const std::string_view whole = line;
     if (!line.empty() && line.back() == '\n')
         line.remove_suffix(1);
     if (!line.empty() && line.back() == '\r')
         line.remove_suffix(1);
+    fPlainRow.fRowText = {line, whole.substr(line.size())};
 
     std::vector<std::string_view>& fields = fPlainRow.fFields;
     fields.clear();
@@ -211,6 +229,7 @@ void CsvReader::ParseLine()
     std::swap(fRows.front(), fRows[fNumRows]);
     fNumRows = 0;
     fNextRow = 0;
+    fCutter.Append(MakeView(fBegin, fLineEnd));
     // The last character by itself: if it ends a row, and so isn't one of a quoted field, the parser is between rows.
     Parse(MakeView(std::exchange(fBegin, fLineEnd - 1), fLineEnd - 1));
     fInRow = true;
@@ -285,8 +304,10 @@ void CsvReader::EndRow(int terminator)
     if (!isSecondOfPair)
         ++fLine;
     fLastTerminator = terminator;
+    const RowText text = isSecondOfPair ? RowText() : fCutter.Cut();
     if (isBlank)
         return;
+    fRows[fNumRows].fRowText = text;
     if (fRows.size() == fNumRows + 1)
         fRows.emplace_back();
     ++fNumRows;

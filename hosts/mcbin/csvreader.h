@@ -2,6 +2,7 @@
 #define MCBIN_CSVREADER_H
 
 #include "inputfile.h"
+#include "rowtext.h"
 
 #include <csv.h>
 
@@ -22,6 +23,9 @@ public:
     /// The field without its quotes. `index` must be below Size().
     std::string_view operator[](std::size_t index) const { return fFields[index]; }
 
+    /// The row as it stands in the file.
+    const RowText& GetText() const { return fRowText; }
+
     /// The line of the file on which the row begins, from 1.
     long GetLine() const { return fLine; }
 
@@ -31,6 +35,7 @@ private:
     std::vector<std::string_view> fFields; ///< into fText, or into the reader's buffer for a row without quotes
     std::string fText;                     ///< all fields, one behind the other
     std::vector<std::size_t> fEnds;        ///< of the fields in fText
+    RowText fRowText;                      ///< into the reader's buffer, or into what it keeps for the parser
     long fLine = 0;
 };
 
@@ -38,7 +43,7 @@ private:
 ///
 /// Rows end with LF, CRLF or CR, and the last row needs no end. A field in double quotes may hold delimiters, line ends
 /// and, doubled, quotes; quotes anywhere else are an error. Spaces around a field that isn't quoted are dropped, and so
-/// are blank lines and a UTF-8 mark at the beginning.
+/// are blank lines and a UTF-8 mark at the beginning. The row's text still has its spaces and quotes.
 class CsvReader
 {
 public:
@@ -54,6 +59,8 @@ public:
 
     const std::string& GetName() const { return fFile.GetName(); }
     char GetDelimiter() const { return fDelimiter; }
+    /// The UTF-8 mark at the beginning of the file; empty if there is none.
+    std::string_view GetMark() const;
 
 private:
     struct ParserDeleter
@@ -90,8 +97,10 @@ private:
     const char* fLineEnd = nullptr; ///< what FindLine() has found: behind the line end, or the end of the file
     const char* fSpecial = nullptr; ///< no quote or CR stands from fBegin up to here
     bool fFileRead = false;         ///< there is nothing behind the buffer
+    bool fHasMark = false;
 
     CsvRow fPlainRow;
+    RowCutter fCutter;           ///< has the text that the parser has got
     std::vector<CsvRow> fRows;   ///< the parser's fNumRows finished ones, then the one being read
     std::size_t fNumRows = 0;    ///< rows that the parser has finished
     std::size_t fNextRow = 0;    ///< the one of them that is handed out next

@@ -9,11 +9,11 @@
 namespace
 {
 
-std::vector<std::string> NameColumns(std::vector<std::string> names)
+std::vector<std::string> NameColumns(const CsvRow& header)
 {
-    for (std::size_t i = 0; i < names.size(); ++i)
-        if (names[i].empty())
-            names[i] = "column " + std::to_string(i + 1);
+    std::vector<std::string> names;
+    for (std::size_t i = 0; i < header.Size(); ++i)
+        names.push_back(header[i].empty() ? "column " + std::to_string(i + 1) : std::string(header[i]));
     return names;
 }
 
@@ -32,8 +32,10 @@ TableReader::TableReader(const TableOptions& options) : fReader(Open(options))
     const CsvRow* const header = fReader.NextRow();
     if (!header)
         throw MakeFailure("the file is empty; its first line should name the columns");
-    for (std::size_t i = 0; i < header->Size(); ++i) fHeader.emplace_back((*header)[i]);
-    fColumnNames = NameColumns(fHeader);
+    const RowText& text = header->GetText();
+    fHeader = std::string(fReader.GetMark()) + std::string(text.fields);
+    fLineEnd = text.end.empty() ? "\n" : text.end;
+    fColumnNames = NameColumns(*header);
     for (auto name = fColumnNames.begin(); name != fColumnNames.end(); ++name)
         if (std::find(fColumnNames.begin(), name, *name) != name)
             throw MakeFailure(header->GetLine(), "two columns are named " + Quote(*name));

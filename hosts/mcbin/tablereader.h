@@ -27,8 +27,10 @@ public:
     explicit TableReader(const TableOptions& options);
 
     const std::vector<std::string>& GetColumnNames() const { return fColumnNames; }
-    /// The first row as it stands in the file, where a column may be without a name.
-    const std::vector<std::string>& GetHeader() const { return fHeader; }
+    /// The first row as it stands in the file, behind the file's UTF-8 mark if it has one, and without its line end.
+    const std::string& GetHeader() const { return fHeader; }
+    /// What ends the first row; LF if nothing does.
+    const std::string& GetLineEnd() const { return fLineEnd; }
     char GetDelimiter() const { return fReader.GetDelimiter(); }
     const std::string& GetName() const { return fReader.GetName(); }
 
@@ -53,7 +55,8 @@ public:
 
 private:
     CsvReader fReader;
-    std::vector<std::string> fHeader;
+    std::string fHeader;
+    std::string fLineEnd;
     std::vector<std::string> fColumnNames;
 };
 

@@ -157,6 +157,52 @@ TEST_F(Mcbin, ReadsTheVersionOfItsFilesWhereMissingTextsOfAColumnStandAmongThose
     EXPECT_EQ("x,x_bin\n10,0\n11,1\n-9.0,\nunknown,\n", RunOn("x\n10\n11\n-9.0\nunknown\n", "apply bins.json", "").out);
 }
 
+TEST_F(Mcbin, CopiesWhatItDoesNotMakeByteByByte)
+{
+    std::string train = "x,y\n";
+    for (int i = 0; i < 20; ++i) train += std::to_string(i) + (i < 10 ? ",a\n" : ",b\n");
+    ASSERT_EQ(0, RunOn(train, "supervised", "--target y --format json >bins.json").exitCode);
+    struct Case
+    {
+        const char* data;
+        const char* added;
+        const char* replaced;
+    };
+    const Case cases[] = {
+        {"x, t ,\"u\"\n 1\t, a b ,\"c\"\n", "x, t ,\"u\",x_bin\n 1\t, a b ,\"c\",0\n", "x, t ,\"u\"\n0, a b ,\"c\"\n"},
+        {"x,t\r\n\r\n1,\"a\r\n\"\"b\n\"\r\n  \n19,", "x,t,x_bin\r\n1,\"a\r\n\"\"b\n\",0\r\n19,,1\r\n",
+         "x,t\r\n0,\"a\r\n\"\"b\n\"\r\n1,\r\n"},
+        {"\xEF\xBB\xBFt;x\r \"a;b\" ; \"19\" \rc;1\n", "\xEF\xBB\xBFt;x;x_bin\r \"a;b\" ; \"19\" ;1\rc;1;0\n",
+         "\xEF\xBB\xBFt;x\r \"a;b\" ;1\rc;0\n"},
+        {"x\n\"\"\n\"1\"", "x,x_bin\n\"\",\n\"1\",0\n", "x\n\"\"\n0\n"},
+    };
+    for (const Case& c : cases)
+    {
+        EXPECT_EQ(c.added, RunOn(c.data, "apply bins.json", "").out) << ReadFile(fData.File("err"));
+        EXPECT_EQ(c.replaced, RunOn(c.data, "apply bins.json", "--in-place-columns").out);
+    }
+
+    // The first 65536 bytes end between CR and LF.
+    const std::string name = "\"" + std::string(65536 - 5, 't') + "\"";
+    EXPECT_TRUE("x," + name + ",x_bin\r\n1,,0\r\n" == RunOn("x," + name + "\r\n1,\r\n", "apply bins.json", "").out);
+
+    // Larger than any buffer, with a part of a row at the end of each.
+    for (const std::string end : {"\n", "\r\n", "\r"})
+    {
+        std::string data = "t,x" + end;
+        std::string expected = "t,x,x_bin" + end;
+        for (int i = 0; i < 9000; ++i)
+        {
+            const std::string row =
+                (i % 3 == 0 ? " a" + std::string(static_cast<std::size_t>(i) % 50, 'b') : "\"\"\",\r\n\" ") + "," +
+                std::to_string(i % 20);
+            data += row + end;
+            expected += row + (i % 20 < 10 ? ",0" : ",1") + end;
+        }
+        EXPECT_TRUE(expected == RunOn(data, "apply bins.json", "").out) << "rows that end with " << end;
+    }
+}
+
 TEST_F(Mcbin, AppliesToOtherColumnsInAnotherOrderAndSaysWhatDoesNotFit)
 {
     std::string data = "a,b,p,q\n";
@@ -165,7 +211,7 @@ TEST_F(Mcbin, AppliesToOtherColumnsInAnotherOrderAndSaysWhatDoesNotFit)
     ASSERT_EQ(0, RunOn(data, "supervised", "--pairs a:p,b:p,b:q --format json >bins.json").exitCode);
 
     // The names tell the targets apart; a column without a name stays one; values far outside are in the outer bins.
-    EXPECT_EQ("b;;a;a_bin;b_by_p_bin;b_by_q_bin\n-15;\"x;\"\"y\";1e9;1;1;0\n;;19;0;;\n",
+    EXPECT_EQ("b;;a;a_bin;b_by_p_bin;b_by_q_bin\n -15 ;\"x;\"\"y\";1e9;1;1;0\n;;19;0;;\n",
               RunOn("b;;a\n -15 ;\"x;\"\"y\";1e9\n;;19\n", "apply bins.json", "").out);
     EXPECT_EQ("mcbin: column 'b' has been binned for more than one target, so its bins can't take its place\n",
               RunOn(data, "apply bins.json", "--in-place-columns").err);
