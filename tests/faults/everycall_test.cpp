@@ -63,3 +63,33 @@ TEST(EveryFileCall, MayFailInEqualFrequencyRuns)
 {
     FailEachCall<EqualFrequency, EFBINAlgorithm>(EqualFrequencySettings(6));
 }
+
+// The results show as well that something was lost, but a host has to know before it reads a million records more.
+TEST(FullDisk, EndsTheReadingOfTheSourceWithTheFlushThatMeetsIt)
+{
+    constexpr int kRowsPerFlush = 10000;
+    constexpr int kNumRows = kRowsPerFlush + 500;
+    constexpr int kNumFiles = 2;
+    for (int write = 1; write <= 2 * kNumFiles; ++write)
+    {
+        for (const bool isToldAtClose : {false, true})
+        {
+            SCOPED_TRACE("write " + std::to_string(write) + (isToldAtClose ? " told at the close" : ""));
+            const TempDir dir;
+            BINSettings settings = SupervisedSettings();
+            settings.SetTempDirName(dir.Path());
+            FaultyPlatform platform;
+            platform.fFullAtWrite = write;
+            platform.fIsToldAtClose = isToldAtClose;
+            RecordTable records;
+            for (int i = 0; i < kNumRows; ++i) records.Add({1.0 * (i % 100), i % 100 < 50 ? 0.0 : 1.0});
+            const BINVarList list = AVarList().WithAttribute("age").WithTarget("bought", 2);
+            Supervised host(std::make_unique<BINAlgorithm>(settings, list, &platform));
+
+            EXPECT_EQ(MCBinning::BINStatusCannotOpenTempFile, host.Run(records).GetErrorCode());
+
+            EXPECT_EQ(write <= kNumFiles ? kRowsPerFlush : kNumRows, records.fNumNext);
+            EXPECT_TRUE(host.All().empty());
+        }
+    }
+}

@@ -10,7 +10,9 @@
 class FaultyPlatform : public Platform
 {
 public:
-    int fFailingCall = 0; ///< 0: none
+    int fFailingCall = 0;        ///< 0: none
+    int fFullAtWrite = 0;        ///< the disk is full at this write, counted from 1, and at no other one; 0: at none
+    bool fIsToldAtClose = false; ///< the full disk shows not before the file is closed
     bool fFromThenOn = false;
     int fNumCalls = 0;
     bool fHasFired = false;
@@ -45,7 +47,8 @@ public:
 
     std::size_t WriteDoubles(const double* values, std::size_t count, std::FILE* file) override
     {
-        return fReal->WriteDoubles(values, Fails() ? count / 2 : count, file);
+        const bool isFull = ++fNumWrites == fFullAtWrite;
+        return fReal->WriteDoubles(values, Fails() || (isFull && !fIsToldAtClose) ? count / 2 : count, file);
     }
 
     bool RewindFile(std::FILE* file) override { return !Fails() && fReal->RewindFile(file); }
@@ -54,7 +57,7 @@ public:
     bool CloseFile(std::FILE* file) override
     {
         const bool isClosed = fReal->CloseFile(file);
-        return !Fails() && isClosed;
+        return !Fails() && isClosed && !(fIsToldAtClose && fNumWrites > 0 && fNumWrites == fFullAtWrite);
     }
 
     void RemoveFile(const std::string& path, const FileIdentity& identity) override
@@ -63,6 +66,8 @@ public:
     }
 
 private:
+    int fNumWrites = 0;
+
     bool Fails()
     {
         ++fNumCalls;

@@ -3,6 +3,9 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
+#include <tuple>
+
 using MCMV::gMissingValue;
 
 namespace
@@ -26,6 +29,16 @@ public:
     }
 
     BINAttributeReader* operator->() { return &fReader; }
+
+    /// Somebody else writes behind the last record in each of the files.
+    void AppendToFiles(const std::vector<double>& values) const
+    {
+        for (const std::string& name : fPreparator.fDirectory.FileNames())
+        {
+            std::ofstream file(fPreparator.fDirectory.File(name), std::ios::binary | std::ios::app);
+            for (const double value : values) file.write(reinterpret_cast<const char*>(&value), sizeof(value));
+        }
+    }
 
 private:
     RecordTable fRecords;
@@ -102,6 +115,47 @@ TEST(AttributeReader, AttributeWithoutAValueHasNoFigures)
     EXPECT_EQ(3.0, reader->GetTotalWeightWithMissing());
     EXPECT_EQ(gMissingValue, reader->GetMinValue());
     EXPECT_EQ(gMissingValue, reader->GetMaxValue());
+}
+
+// A sum of tenths depends on their order, and tables are summed in the order of the tuples.
+TEST(AttributeReader, TuplesOfOneValueStandInAnOrderThatIsNotThatOfTheRecords)
+{
+    RecordTable records;
+    Dice dice(1);
+    for (int i = 0; i < 300; ++i)
+        records.Add({1.0 * dice.Below(4), 1.0 * dice.Below(3), 0.1 * (1 + dice.Below(9)), 0.0});
+    RecordTable shuffled = records;
+    dice.Shuffle(shuffled.fRows);
+    const BINVarList list = AVarList().WithAttribute("x").WithTarget("t", 3).WithWeight(kUnrounded).WithAttribute("y");
+    const auto tuplesOf = [&](const RecordTable& table)
+    {
+        LoadedReader reader(list, table);
+        std::vector<std::tuple<double, int, double>> tuples;
+        for (const BINSortTuple& tuple : reader.Pair(0, 1))
+            tuples.emplace_back(tuple.fValue, tuple.fTargetCode, tuple.fWeight);
+        return tuples;
+    };
+
+    EXPECT_EQ(tuplesOf(records), tuplesOf(shuffled));
+}
+
+TEST(AttributeReader, NothingIsReadBehindTheRecordsOfThePass)
+{
+    const RecordTable records{{1, 0, 1, 1}, {2, 1, 1, 1}, {3, 0, 1, 2}};
+    for (const TupleKind kind : {TupleKind::kWithTarget, TupleKind::kWithoutTarget})
+    {
+        LoadedReader reader(FullList(), records, kind);
+
+        reader.AppendToFiles({1, 1, 1, 1});
+
+        std::vector<BINValueTuple>* values = nullptr;
+        if (kind == TupleKind::kWithTarget)
+            EXPECT_EQ(records.fRows.size(), reader.Pair(0, 1).size());
+        else
+            EXPECT_TRUE(reader->GetAttributeData(0, &values).IsOK());
+        EXPECT_EQ(records.fRows.size(), reader->GetNumTuples());
+        EXPECT_EQ(3.0, reader->GetTotalWeight());
+    }
 }
 
 TEST(AttributeReader, PreBinningIsEngagedAboveTheThresholdOnly)

@@ -1,5 +1,6 @@
 #include "data/binaryrecorditerator.h"
 #include "data/binrecordbuffer.h"
+#include "support/groupeddigits.h"
 #include "support/preparatorpeer.h"
 
 #include <gtest/gtest.h>
@@ -114,6 +115,17 @@ TEST(TempFiles, NamesAreConsecutiveTicksThatNothingBears)
     EXPECT_EQ((std::vector<std::string>{preparator.fDirectory.File("abc"), preparator.fDirectory.File("abe")}),
               preparator->GetFileNames());
     EXPECT_EQ(std::vector<std::string>{"abd"}, preparator.fDirectory.FileNames()) << "no file comes into being yet";
+}
+
+TEST(TempFiles, NamesDontFollowTheLocaleOfTheProgram)
+{
+    const GroupedDigitsEverywhere german;
+    BINDataPreparatorPeer preparator(AVarList().WithAttribute("a"));
+    preparator.fPlatform.fTick = 0x1234567890;
+
+    ASSERT_TRUE(preparator->InitTempFiles().IsOK());
+
+    EXPECT_EQ(preparator.fDirectory.File("1234567890"), preparator->GetFileNames().front());
 }
 
 TEST(TempFiles, DirectoryIsJoinedWithASlashUnlessItEndsInASeparator)
