@@ -3,19 +3,28 @@
 
 #include <cstdlib>
 #include <new>
+#include <optional>
 
 namespace
 {
 
 int numAllocations = 0;
 int failingAllocation = 0; ///< its number, counted from 1; 0 for none
+bool isFromThenOn = false; ///< all behind it fail, too
+
+bool Fails()
+{
+    ++numAllocations;
+    return numAllocations == failingAllocation ||
+           (isFromThenOn && failingAllocation > 0 && numAllocations > failingAllocation);
+}
 
 } // namespace
 
 // Not inlined: g++ would see through one of a pair and complain that it doesn't match the other.
 [[gnu::noinline]] void* operator new(std::size_t size)
 {
-    void* memory = ++numAllocations != failingAllocation ? std::malloc(size > 0 ? size : 1) : nullptr;
+    void* memory = Fails() ? nullptr : std::malloc(size > 0 ? size : 1);
     if (memory == nullptr)
         throw std::bad_alloc();
     return memory;
@@ -94,6 +103,8 @@ auto UseAll(const Settings& settings, RecordTable& records)
     auto algorithm = Again([&] { return Create(factory, copiedSettings, copiedList); });
     if (factory.GetStatus().GetErrorCode() == MCBinning::BINStatusOutOfMemory)
         algorithm = Create(factory, copiedSettings, copiedList);
+    if (algorithm == nullptr)
+        throw std::bad_alloc(); // the host gives up
     Host host(std::move(algorithm));
 
     const auto outOfMemory = [] { return MCBinning::MCStatus(MCBinning::BINStatusOutOfMemory, false); };
@@ -133,6 +144,41 @@ void FailEachAllocation(Settings settings)
     EXPECT_GT(n, 300) << "valgrind takes this operator new only with --soname-synonyms=somalloc=nouserintercepts";
 }
 
+/// From each allocation on lets all of them fail, until the host is done before the first one. The host gives up at what
+/// it can't do a second time, and its objects go while there still is no memory.
+template<class Host, class Factory, class Settings>
+void FailFromEachAllocationOn(Settings settings)
+{
+    const TempDir dir;
+    settings.SetTempDirName(dir.Path());
+    const auto undisturbed = [&]
+    {
+        RecordTable records = SomeRecords(50);
+        return UseAll<Host, Factory>(settings, records);
+    }();
+    ASSERT_TRUE(undisturbed.fSecond.IsOK());
+
+    int n = 0;
+    for (bool hasFired = true; hasFired && !::testing::Test::HasFailure();)
+    {
+        SCOPED_TRACE("allocation " + std::to_string(++n) + " and all behind it");
+        RecordTable records = SomeRecords(50);
+        std::optional<decltype(UseAll<Host, Factory>(settings, records))> disturbed;
+        failingAllocation = numAllocations + n;
+        isFromThenOn = true;
+        OrElse([&] { disturbed = UseAll<Host, Factory>(settings, records); }, [] {});
+        hasFired = numAllocations >= failingAllocation;
+        failingAllocation = 0;
+        isFromThenOn = false;
+
+        EXPECT_TRUE(hasFired || disturbed.has_value());
+        if (disturbed.has_value())
+            ExpectSound(undisturbed, *disturbed, MCBinning::BINStatusOutOfMemory);
+        EXPECT_TRUE(dir.IsEmpty());
+    }
+    EXPECT_GT(n, 300);
+}
+
 } // namespace
 
 TEST(EveryAllocation, MayFailForAHostOfSupervisedRuns)
@@ -143,4 +189,10 @@ TEST(EveryAllocation, MayFailForAHostOfSupervisedRuns)
 TEST(EveryAllocation, MayFailForAHostOfEqualFrequencyRuns)
 {
     FailEachAllocation<EqualFrequency, EFBINFactory>(EqualFrequencySettings(6));
+}
+
+TEST(EveryAllocation, MayBeTheLastOneThatAHostGets)
+{
+    FailFromEachAllocationOn<Supervised, BINFactory>(PreBinningSettings());
+    FailFromEachAllocationOn<EqualFrequency, EFBINFactory>(EqualFrequencySettings(6));
 }

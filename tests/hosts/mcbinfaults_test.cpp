@@ -2,6 +2,7 @@
 #include "hosts/mcbinterminal.h"
 
 #include <array>
+#include <chrono>
 #include <csignal>
 #include <filesystem>
 #include <fstream>
@@ -45,6 +46,7 @@ public:
         fProcess = fork();
         if (fProcess == 0)
         {
+            alarm(kLongestRun);
             std::vector<const char*> words{MCBIN_PATH};
             for (const std::string& argument : arguments) words.push_back(argument.c_str());
             words.push_back(nullptr);
@@ -55,7 +57,9 @@ public:
             _exit(127);
         }
         close(fPipe[1]);
-        while (CountWaiting() < fcntl(fPipe[0], F_GETPIPE_SZ)) sched_yield();
+        const auto limit = std::chrono::steady_clock::now() + std::chrono::seconds(kLongestRun);
+        while (CountWaiting() < fcntl(fPipe[0], F_GETPIPE_SZ) && std::chrono::steady_clock::now() < limit)
+            sched_yield();
     }
     Piped(const Piped&) = delete;
     Piped& operator=(const Piped&) = delete;

@@ -4,12 +4,16 @@
 #include <gtest/gtest.h>
 
 #include <array>
+#include <csignal>
 #include <cstdlib>
 #include <string>
 
 #include <pty.h>
 #include <sys/wait.h>
 #include <unistd.h>
+
+/// Seconds after which the system ends a program that a test waits for, so that the wait ends and the test fails.
+constexpr unsigned int kLongestRun = 600;
 
 /// The program on a terminal of its own, in a directory with the data.
 class Terminal
@@ -25,6 +29,7 @@ public:
         fProcess = forkpty(&fMaster, nullptr, nullptr, &size);
         if (fProcess == 0)
         {
+            alarm(kLongestRun);
             setenv("TMPDIR", temporary.c_str(), 1);
             setenv("TERM", "xterm", 1);
             unsetenv("NO_COLOR");
@@ -55,6 +60,10 @@ public:
     /// As the key does.
     void PressCtrlC() const { EXPECT_EQ(1, write(fMaster, "\x03", 1)); }
 
+    /// To the program itself, not to its terminal.
+    void Signal(int number) const { EXPECT_EQ(0, kill(fProcess, number)); }
+
+    /// -1 if it was killed.
     int GetExitCode()
     {
         WaitFor("\xFF"); // never comes

@@ -78,9 +78,12 @@ def test_ctrl_c_raises_keyboard_interrupt_and_leaves_no_file(tmp_path, phase):
     process = subprocess.Popen(
         [sys.executable, "-c", textwrap.dedent(INTERRUPTED), phase, str(tmp_path)], stdout=subprocess.PIPE, text=True
     )
-    assert process.stdout is not None and process.stdout.readline() == "now\n"
-    process.send_signal(signal.SIGINT)
-    rest = process.communicate(timeout=60)[0]
+    try:
+        assert process.stdout is not None and process.stdout.readline() == "now\n"
+        process.send_signal(signal.SIGINT)
+        rest = process.communicate(timeout=60)[0]
+    finally:
+        process.kill()  # where the time of the test was up
 
     assert rest.splitlines()[-1] == "stopped" and process.returncode == 0
     assert list(tmp_path.iterdir()) == []
