@@ -3,6 +3,8 @@
 The estimators work in scikit-learn, on data in memory. The functions work on streams and files of any size.
 """
 
+from importlib.metadata import version as _version
+
 from ._errors import (
     BadBinTableWarning,
     BinningError,
@@ -20,6 +22,8 @@ from ._functions import equal_frequency_bins, supervised_bins
 from ._result import AttributeBins, BinningResult
 from ._status import Status
 
+__version__ = _version("mcbinning")
+
 __all__ = [
     "AttributeBins",
     "BadBinTableWarning",
@@ -36,6 +40,7 @@ __all__ = [
     "Status",
     "StreamError",
     "SupervisedBinner",
+    "__version__",
     "equal_frequency_bins",
     "supervised_bins",
 ]

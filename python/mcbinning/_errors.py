@@ -22,7 +22,7 @@ class DataError(ValueError):
 
     def __init__(self, message: str, column: str | None = None, row: int | None = None) -> None:
         self.message = message
-        self.column = column or None
+        self.column = column
         self.row = row if row is not None and row >= 0 else None
         where = [] if self.column is None else [f"column {self.column!r}"]
         if self.row is not None:

@@ -9,16 +9,21 @@ from typing import Any
 import numpy as np
 import numpy.typing as npt
 import pandas as pd
+import pyarrow as pa
 from sklearn.base import BaseEstimator, TransformerMixin
 from sklearn.utils import Tags, check_array, column_or_1d
+from sklearn.utils._set_output import _get_output_config
 from sklearn.utils.validation import _check_feature_names_in, check_consistent_length, check_is_fitted, validate_data
 
 from . import _core
 from ._errors import BinningError, DataError
-from ._functions import check_settings, make_result
+from ._outcome import make_result
 from ._progress import Progress, reporting
 from ._result import BinningResult, Settings, Variable
-from ._sources import Source, open_source
+from ._settings import check_settings
+from ._sources import Source
+from ._opening import is_table, open_source
+from ._types import Closed, Encode, Method, MissingOutput
 from ._values import Codes, Floats
 
 _ALL_ROWS = 2**62
@@ -29,24 +34,29 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
     """What the two binners share: reading `X`, and the use of the fitted bins."""
 
     n_bins: int
-    closed: str
-    encode: str
-    missing: str
+    closed: Closed
+    encode: Encode
+    missing: MissingOutput
     temp_dir: str | os.PathLike[str] | None
     progress: Progress
 
     result_: BinningResult
     n_features_in_: int
-    _method: str
+    _method: Method
 
-    def transform(self, X: Any) -> npt.NDArray[Any]:
+    def transform(self, X: Any) -> Any:
         """The bins of `X`, in the form that `encode` names."""
         check_is_fitted(self)
         columns = self._read_columns(X)
         bins = [found.bin_numbers(values) for found, values in zip(self.result_.bins, columns)]
         if self.encode == "ordinal":
             return self._as_numbers(bins)
-        return self._as_indicators(bins) if self.encode == "onehot" else self._as_intervals(bins)
+        if self.encode == "onehot":
+            return self._as_indicators(bins)
+        intervals = self._as_intervals(bins)
+        if _get_output_config("transform", self)["dense"] == "polars":
+            return _as_texts(intervals, self.get_feature_names_out())
+        return intervals
 
     def get_feature_names_out(self, input_features: Any = None) -> npt.NDArray[np.object_]:
         """The names of the input, or with `encode="onehot"` a name for each bin of each."""
@@ -62,7 +72,9 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         tags.input_tags.allow_nan = True
         return tags
 
-    def _fit(self, X: Any, codes: npt.NDArray[np.uint8] | None, classes: Sequence[Any], sample_weight: Any) -> None:
+    def _fit(
+        self, X: Any, codes: npt.NDArray[np.uint8] | None, classes: npt.NDArray[Any], sample_weight: Any
+    ) -> None:
         if self.encode not in ("ordinal", "onehot", "interval"):
             raise ValueError(f"encode must be 'ordinal', 'onehot' or 'interval', not {self.encode!r}")
         if self.missing not in ("code", "keep"):
@@ -74,7 +86,7 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
             if rows is not None:
                 check_consistent_length(np.empty(rows), codes)
             feed.add_variable("y", "code", array=codes, num_codes=len(classes))
-            variables.append(Variable("y", "target", "text", categories=tuple(classes)))
+            variables.append(_target_variable(classes))
         if sample_weight is not None:
             feed.add_variable("sample_weight", "weight", array=_check_weights(sample_weight, rows))
             variables.append(Variable("sample_weight", "weight", rounding="none"))
@@ -100,9 +112,11 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
 
     def _open(self, X: Any, reset: bool) -> tuple[_core.Feed, list[Variable], int | None]:
         """A feed of the columns of `X`, read where they lie; and how many rows there are, if that is known."""
-        if hasattr(X, "__arrow_c_stream__"):
+        if is_table(X):
             return self._open_table(X, reset)
         X = self._check(X, reset)
+        if X.dtype.kind in "mM":
+            return self._open_times(X)
         feed = _core.Feed(None)
         names = getattr(self, "feature_names_in_", [f"x{i}" for i in range(X.shape[1])])
         for i, name in enumerate(names):
@@ -110,9 +124,20 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         return feed, [Variable(str(name)) for name in names], X.shape[0]
 
     def _check(self, X: Any, reset: bool) -> npt.NDArray[Any]:
+        X = _with_nan(X)
         array: npt.NDArray[Any] = validate_data(self, X, reset=reset, dtype="numeric", ensure_all_finite=False)
+        if array.dtype.kind in "mM":
+            return array
         # Numbers of 128 bits or in the other byte order are the only ones that the feed can't read where they lie.
         return array if array.dtype.itemsize <= 8 and array.dtype.isnative else array.astype(np.float64)
+
+    def _open_times(self, X: npt.NDArray[Any]) -> tuple[_core.Feed, list[Variable], int | None]:
+        # Of the units Arrow has days and those from the second down.
+        if X.dtype.kind == "M" and np.datetime_data(X.dtype)[0] in ("Y", "M", "W", "h", "m"):
+            X = X.astype("M8[s]")
+        names = getattr(self, "feature_names_in_", [f"x{i}" for i in range(X.shape[1])])
+        columns = [pa.array(np.ascontiguousarray(X[:, i])) for i in range(X.shape[1])]
+        return self._feed_table(open_source(pa.Table.from_arrays(columns, names=list(map(str, names)))))
 
     def _open_table(self, X: Any, reset: bool) -> tuple[_core.Feed, list[Variable], int | None]:
         source = open_source(X)
@@ -120,17 +145,24 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         validate_data(self, named, reset=reset, skip_check_array=True)
         if not source.columns:
             raise DataError("there are no columns")
+        return self._feed_table(source)
+
+    def _feed_table(self, source: Source) -> tuple[_core.Feed, list[Variable], int | None]:
         feed = _core.Feed(source.open(None))
         for i, column in enumerate(source.columns):
+            if column.is_ordered and column.kind != "text":
+                raise DataError("the column holds ordered categories, not numbers", column.name)
             feed.add_variable(column.name, "attribute", column=i)
         variables = [Variable(column.name, kind=column.kind, time_zone=column.time_zone) for column in source.columns]
         return feed, variables, source.rows
 
     def _read_columns(self, X: Any) -> Sequence[Floats]:
-        if hasattr(X, "__arrow_c_stream__"):
-            feed, _, _ = self._open_table(X, reset=False)
-            return feed.read(_ALL_ROWS)
-        return list(self._check(X, reset=False).T)
+        if is_table(X):
+            return self._open_table(X, reset=False)[0].read(_ALL_ROWS)
+        X = self._check(X, reset=False)
+        if X.dtype.kind in "mM":
+            return self._open_times(X)[0].read(_ALL_ROWS)
+        return list(X.T)
 
     def _as_numbers(self, bins: Sequence[Codes]) -> Floats:
         out = np.empty((len(bins[0]), len(bins)))
@@ -171,47 +203,62 @@ class SupervisedBinner(_Binner):
 
     Parameters
     ----------
-    max_distinct : int or None, default=None
-        A feature with more distinct values than this is pre-binned into `n_bins` bins of equal frequency, from which
-        the search for cut points starts. None: never.
+    max_distinct : int, default=None
+        A feature with more distinct values than this, at least 1, is pre-binned into `n_bins` bins of equal frequency,
+        between which it is then cut. None: never.
     n_bins : int, default=1000
-        The number of those pre-bins.
+        The number of those pre-bins, at least 2.
     closed : {"right", "left"}, default="right"
-        The side of a bin that belongs to it.
+        The side of a bin that belongs to it: (a, b] or [a, b).
     small_bin_ratio : float, default=0.0
-        An inner bin whose weight is below this share of its lighter neighbour's is merged away.
+        An inner bin whose weight is below this share, 0 to 1, of its lighter neighbour's is merged away.
     encode : {"ordinal", "onehot", "interval"}, default="ordinal"
-        What `transform` gives: the number of the bin, a column of 0 and 1 for each bin, or the bin in words.
+        What `transform` gives: the number of the bin from 0, a column of 0 and 1 for each bin, or the bin in words.
     missing : {"code", "keep"}, default="code"
         Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
         stays missing.
-    temp_dir : path or None, default=None
-        Where the temporary files go; None for the system's directory.
+    temp_dir : path, default=None
+        The directory of the temporary files, 8 bytes for each row and feature. None: the system's.
     progress : bool or callable, default=False
-        Whether to show progress bars; or what to call with a phase and an index.
+        Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
+        number of records read or the index of the feature that is done.
 
     Attributes
     ----------
-    cut_points_ : list of arrays, by feature
+    cut_points_ : list of numpy.ndarray, by feature
     bin_tables_ : list of pandas.DataFrame, by feature
     statuses_ : list of Status, by feature
     result_ : BinningResult
-    classes_ : array, the categories of `y`
+    classes_ : numpy.ndarray
+        The categories of `y`, in the order that an ordered categorical or an Enum declares, else in ascending order.
     n_features_in_ : int
-    feature_names_in_ : array, if `X` had names
+    feature_names_in_ : numpy.ndarray, if `X` had names
+
+    Raises
+    ------
+    DataError, BinningError, ValueError, TypeError
+        By `fit` and `transform`, as by `supervised_bins`.
+
+    Examples
+    --------
+    >>> import mcbinning as mb
+    >>> binner = mb.SupervisedBinner(encode="interval")
+    >>> ages = [[21], [22], [23], [24], [25], [26], [41], [42], [43], [44], [45], [46]]
+    >>> binner.fit(ages, ["no"] * 6 + ["yes"] * 6).transform([[30], [20]]).tolist()
+    [['(26, +inf)'], ['(-inf, 26]']]
     """
 
-    _method = "supervised"
+    _method: Method = "supervised"
 
     def __init__(
         self,
         *,
         max_distinct: int | None = None,
         n_bins: int = 1000,
-        closed: str = "right",
+        closed: Closed = "right",
         small_bin_ratio: float = 0.0,
-        encode: str = "ordinal",
-        missing: str = "code",
+        encode: Encode = "ordinal",
+        missing: MissingOutput = "code",
         temp_dir: str | os.PathLike[str] | None = None,
         progress: Progress = False,
     ) -> None:
@@ -230,7 +277,7 @@ class SupervisedBinner(_Binner):
         if y is None:
             raise ValueError(f"{type(self).__name__} requires y to be passed, but the target y is None")
         self.classes_, codes = _code_target(y)
-        self._fit(X, codes, self.classes_.tolist(), sample_weight)
+        self._fit(X, codes, self.classes_, sample_weight)
         return self
 
     def __sklearn_tags__(self) -> Tags:
@@ -257,18 +304,54 @@ class SupervisedBinner(_Binner):
 class EqualFrequencyBinner(_Binner):
     """Cuts each feature into bins of equal weight; fewer than asked for, where equal values stay together.
 
-    Parameters and attributes are those of SupervisedBinner, without the ones that are about a target.
+    Parameters
+    ----------
+    n_bins : int, default=10
+        The number of bins, at least 2.
+    closed : {"right", "left"}, default="right"
+        The side of a bin that belongs to it: (a, b] or [a, b).
+    encode : {"ordinal", "onehot", "interval"}, default="ordinal"
+        What `transform` gives: the number of the bin from 0, a column of 0 and 1 for each bin, or the bin in words.
+    missing : {"code", "keep"}, default="code"
+        Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
+        stays missing.
+    temp_dir : path, default=None
+        The directory of the temporary files, 8 bytes for each row and feature. None: the system's.
+    progress : bool or callable, default=False
+        Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
+        number of records read or the index of the feature that is done.
+
+    Attributes
+    ----------
+    cut_points_ : list of numpy.ndarray, by feature
+    bin_tables_ : list of pandas.DataFrame, by feature
+    statuses_ : list of Status, by feature
+    result_ : BinningResult
+    n_features_in_ : int
+    feature_names_in_ : numpy.ndarray, if `X` had names
+
+    Raises
+    ------
+    DataError, BinningError, ValueError, TypeError
+        By `fit` and `transform`, as by `equal_frequency_bins`.
+
+    Examples
+    --------
+    >>> import mcbinning as mb
+    >>> binner = mb.EqualFrequencyBinner(n_bins=2)
+    >>> binner.fit([[1.0], [2.0], [3.0], [4.0]]).transform([[0.0], [float("nan")], [9.0]]).tolist()
+    [[0.0], [2.0], [1.0]]
     """
 
-    _method = "equal-frequency"
+    _method: Method = "equal-frequency"
 
     def __init__(
         self,
         *,
         n_bins: int = 10,
-        closed: str = "right",
-        encode: str = "ordinal",
-        missing: str = "code",
+        closed: Closed = "right",
+        encode: Encode = "ordinal",
+        missing: MissingOutput = "code",
         temp_dir: str | os.PathLike[str] | None = None,
         progress: Progress = False,
     ) -> None:
@@ -282,7 +365,7 @@ class EqualFrequencyBinner(_Binner):
     def fit(self, X: Any, y: Any = None, sample_weight: Any = None) -> EqualFrequencyBinner:
         """Finds the cut points. `X` is an array, a frame, or any Arrow stream; weights may be fractional."""
         check_settings(self.closed, self.n_bins)
-        self._fit(X, None, (), sample_weight)
+        self._fit(X, None, np.empty(0), sample_weight)
         return self
 
     def _settings(self) -> Settings:
@@ -299,12 +382,17 @@ class EqualFrequencyBinner(_Binner):
 
 
 def _code_target(y: Any) -> tuple[npt.NDArray[Any], npt.NDArray[np.uint8]]:
-    """The categories in ascending order, and the code of each row."""
+    """The categories in the order that `y` declares or else in ascending order, and the code of each row."""
+    declared = _declared_order(y)
     y = check_array(
         y, ensure_2d=False, dtype=None, ensure_all_finite="allow-nan", ensure_min_samples=0, input_name="y"
     )
     y = column_or_1d(y, warn=True)
-    codes, classes = pd.factorize(y, sort=True)
+    codes, classes = pd.factorize(y, sort=declared is None)
+    if declared is not None:
+        order = np.argsort(declared.get_indexer(classes))
+        codes = np.where(codes < 0, -1, np.argsort(order)[codes])
+        classes = classes[order]
     if (codes < 0).any():
         raise DataError("the target is missing", "y", int((codes < 0).argmax()))
     if len(classes) > _MOST_CATEGORIES:
@@ -314,9 +402,47 @@ def _code_target(y: Any) -> tuple[npt.NDArray[Any], npt.NDArray[np.uint8]]:
     return classes, codes.astype(np.uint8)
 
 
+def _declared_order(y: Any) -> pd.Index | None:
+    """The categories of an ordered categorical or an Enum."""
+    kind: Any = getattr(y, "dtype", None)
+    if isinstance(kind, pd.CategoricalDtype) and kind.ordered:
+        return kind.categories
+    if type(kind).__module__.partition(".")[0] == "polars" and type(kind).__name__ == "Enum":
+        return pd.Index(kind.categories.to_list())
+    return None
+
+
+def _target_variable(classes: npt.NDArray[Any]) -> Variable:
+    """With the categories as numbers where they are, so that other readers of the result know them as such."""
+    kind = {"b": "boolean", "i": "integer", "u": "integer", "f": "float"}.get(classes.dtype.kind, "text")
+    convert = str if kind == "text" else float
+    return Variable("y", "target", kind, categories=tuple(map(convert, classes.tolist())))
+
+
+def _with_nan(X: Any) -> Any:
+    """An array of objects with NaN in the place of pandas' NA, which is no number to NumPy."""
+    array = np.asarray(X, dtype=object) if isinstance(X, (list, tuple)) and _holds_na(X) else X
+    if not isinstance(array, np.ndarray) or array.dtype != np.dtype(object):
+        return X
+    is_missing = pd.isna(array)
+    return np.where(is_missing, np.nan, array) if is_missing.any() else X
+
+
+def _holds_na(X: Any) -> bool:
+    return any(value is pd.NA for row in X for value in (row if isinstance(row, (list, tuple)) else [row]))
+
+
+def _as_texts(intervals: npt.NDArray[np.object_], names: npt.NDArray[np.object_]) -> Any:
+    """A polars frame of texts. polars itself takes objects, among them a None, for objects."""
+    import polars
+
+    columns = {name: intervals[:, i].tolist() for i, name in enumerate(names)}
+    return polars.DataFrame(columns, schema=dict.fromkeys(columns, polars.String))
+
+
 def _check_weights(sample_weight: Any, rows: int | None) -> Floats:
     weights: Floats = check_array(
-        sample_weight, ensure_2d=False, dtype=np.float64, ensure_all_finite=False, input_name="sample_weight"
+        _with_nan(sample_weight), ensure_2d=False, dtype=np.float64, ensure_all_finite=False, input_name="sample_weight"
     )
     if weights.ndim != 1:
         raise ValueError("Sample weights must be 1D array or scalar")

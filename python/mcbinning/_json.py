@@ -11,6 +11,7 @@ import numpy as np
 from . import _values
 from ._result import AttributeBins, BinningResult, Settings, Variable
 from ._status import Status
+from ._types import Closed
 
 _SCHEMA = "mcobnqrt-bins"
 _SCHEMA_VERSION = 2
@@ -205,7 +206,7 @@ def _dump_bins(found: AttributeBins) -> dict[str, Any]:
     }
 
 
-def _load_bins(member: dict[str, Any], variables: dict[str, Variable], closed: str) -> AttributeBins:
+def _load_bins(member: dict[str, Any], variables: dict[str, Variable], closed: Closed) -> AttributeBins:
     target = None if member["target"] is None else variables[member["target"]]
     target_weights = None
     if target is not None:

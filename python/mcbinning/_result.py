@@ -4,7 +4,7 @@ from __future__ import annotations
 
 import os
 from collections.abc import Iterator, Mapping
-from dataclasses import dataclass
+from dataclasses import dataclass, field
 from functools import cached_property
 from typing import TYPE_CHECKING, Any
 
@@ -12,7 +12,9 @@ import numpy as np
 import pandas as pd
 
 from . import _values
+from ._sources import name_of
 from ._status import Status
+from ._types import Closed, MemoryLimit, Method, Role, Unseen
 from ._values import Codes, Floats
 
 if TYPE_CHECKING:
@@ -20,14 +22,15 @@ if TYPE_CHECKING:
     import matplotlib.figure
     import pyarrow as pa
 
+_ROUNDING = 1e-12
+
 
 @dataclass(frozen=True)
 class Variable:
     """A column of the analysis."""
 
     name: str
-    role: str = "attribute"
-    """`"attribute"`, `"target"` or `"weight"`."""
+    role: Role = "attribute"
     kind: str = "float"
     """What its values are: `"float"`, `"integer"`, `"decimal"`, `"boolean"`, `"date"`, `"timestamp"`, `"text"`."""
     time_zone: str = ""
@@ -50,13 +53,19 @@ class Variable:
             return list(self.categories or ())
         return [_values.decode(float(number), self.kind, self.time_zone) for number in self.categories or ()]
 
+    def category_label(self, code: int) -> str:
+        """The category in words."""
+        if self.kind in ("float", "decimal") and self.categories is not None:
+            return self.format(float(self.categories[code]))
+        return str(self.category_names()[code])
+
     def format(self, value: float) -> str:
         return _values.format_value(value, self.kind, self.time_zone)
 
 
 @dataclass(frozen=True)
 class Settings:
-    closed: str = "right"
+    closed: Closed = "right"
     n_bins: int = 10
     max_distinct: int | None = None
     small_bin_ratio: float | None = None
@@ -69,7 +78,7 @@ class AttributeBins:
     variable: Variable
     target: Variable | None
     status: Status
-    closed: str
+    closed: Closed
     cut_points: Floats
     """In ascending order. Dates are days and timestamps microseconds since 1970; categories are codes."""
     weights: Floats
@@ -107,7 +116,10 @@ class AttributeBins:
     @property
     def gain(self) -> float:
         """By how many bits the bins lower the target's entropy; NaN without a target."""
-        return self.target_entropy - self.model_entropy
+        difference = self.target_entropy - self.model_entropy
+        # No cut raises the entropy, and none at all leaves it: below this the difference is what rounding has left.
+        is_nothing = difference < _ROUNDING * max(1.0, self.target_entropy) or len(self.cut_points) == 0
+        return 0.0 if is_nothing and not np.isnan(difference) else difference
 
     @property
     def borders(self) -> Floats:
@@ -123,7 +135,7 @@ class AttributeBins:
         """The bins in words: an interval, or the categories that are in it."""
         if not self.variable.is_categorical:
             return _values.intervals(self.borders, self.closed, self.variable.format)
-        names = np.array(list(map(str, self.variable.category_names())), dtype=object)
+        names = np.array([self.variable.category_label(code) for code in range(len(self.variable.categories or ()))])
         bins = _values.bin_numbers(np.arange(len(names), dtype=np.float64), self.cut_points, self.closed)
         return ["{" + ", ".join(names[bins == bin]) + "}" for bin in range(len(self.cut_points) + 1)]
 
@@ -167,14 +179,13 @@ class BinningResult(Mapping[Any, AttributeBins]):
     In a notebook it shows itself as its `summary()`.
     """
 
-    method: str
-    """`"supervised"` or `"equal-frequency"`."""
+    method: Method
     settings: Settings
     variables: tuple[Variable, ...]
     status: Status
     bins: tuple[AttributeBins, ...]
-    left_out: tuple[str, ...] = ()
-    """Columns of text, which are binned only if they are asked for."""
+    left_out: Mapping[str, str] = field(default_factory=dict)
+    """What each column holds that was not named, and is not of a kind that is binned unless it is: text, durations."""
     data_name: str | None = None
     records: int | None = None
     """How many were read, whatever their weight."""
@@ -182,10 +193,14 @@ class BinningResult(Mapping[Any, AttributeBins]):
     missing_text: tuple[str, ...] = ()
 
     def __getitem__(self, key: Any) -> AttributeBins:
-        attribute, target = key if isinstance(key, tuple) else (key, None)
         for found in self.bins:
-            if found.attribute == attribute and target in (None, found.target.name if found.target else None):
+            if found.attribute == name_of(key):
                 return found
+        if isinstance(key, tuple) and len(key) == 2:
+            attribute, target = map(name_of, key)
+            for found in self.bins:
+                if found.attribute == attribute and found.target and found.target.name == target:
+                    return found
         raise KeyError(key)
 
     def __iter__(self) -> Iterator[Any]:
@@ -201,7 +216,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return sorted(self.bins, key=lambda found: -found.gain if found.gain == found.gain else np.inf)
 
     def summary(self) -> pd.DataFrame:
-        """A row for each attribute, with the largest gain first."""
+        """A row for each attribute, with the largest gain first, and for each column that was left out."""
         rows = [
             {
                 "attribute": found.attribute,
@@ -219,7 +234,10 @@ class BinningResult(Mapping[Any, AttributeBins]):
             }
             for found in self.by_gain()
         ]
-        frame = pd.DataFrame(rows)
+        rows += [
+            {"attribute": name, "bins": 0, "status": f"left out: {kind}"} for name, kind in self.left_out.items()
+        ]
+        frame = pd.DataFrame(rows).astype({"distinct_values": "Int64"} if rows else {})
         if self.method != "supervised":
             frame = frame.drop(columns=["target", "gain", "target_entropy", "model_entropy"], errors="ignore")
         return frame
@@ -236,7 +254,26 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return pyarrow.Table.from_pandas(self.to_pandas(), preserve_index=False)
 
     def to_json(self, path: str | os.PathLike[str] | None = None) -> str:
-        """Everything, as `mcbin --format json` writes and `mcbin apply` reads it; into a file, too, if one is named."""
+        """Writes all bins as JSON, as `mcbin --format json` does and `mcbin apply` reads it.
+
+        Parameters
+        ----------
+        path : path, default=None
+            The file that the text goes into as well. None: into none.
+
+        Returns
+        -------
+        str
+            The text, from which `from_json` makes the same bins, to the last bit.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2)
+        >>> mb.BinningResult.from_json(bins.to_json())["income"].labels
+        ['(-inf, 49.5]', '(49.5, +inf)']
+        """
         from ._json import dump
 
         text = dump(self)
@@ -247,7 +284,31 @@ class BinningResult(Mapping[Any, AttributeBins]):
 
     @classmethod
     def from_json(cls, source: str | os.PathLike[str]) -> BinningResult:
-        """Reads what `to_json` or `mcbin --format json` gave: the text itself, or the path of a file."""
+        """Reads what `to_json` or `mcbin --format json` wrote.
+
+        Parameters
+        ----------
+        source : str or path
+            The text itself, or the path of a file.
+
+        Returns
+        -------
+        BinningResult
+            As it was written, but for `left_out`, which JSON has no place for.
+
+        Raises
+        ------
+        ValueError
+            The text is no JSON of bins, or of a newer version.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> text = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2).to_json()
+        >>> mb.BinningResult.from_json(text).method
+        'equal-frequency'
+        """
         from ._json import load
 
         text = os.fspath(source)
@@ -257,21 +318,78 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return load(text)
 
     def to_sql(self, dialect: str = "", table: str | None = None, labels: bool = False) -> str:
-        """SQL that gives each row the bins of its values: one CASE expression for each attribute, in a SELECT if
-        `table` names one. The dialect is one of sqlglot's; without one it is standard SQL."""
+        """Writes SQL that finds the bins of each row: a CASE expression for each attribute.
+
+        Parameters
+        ----------
+        dialect : str, default=""
+            One of sqlglot's, such as "duckdb", "postgres" or "bigquery"; standard SQL without one.
+        table : str, default=None
+            The table of the SELECT around the expressions. None: the expressions alone.
+        labels : bool, default=False
+            Whether the bins are told in words; otherwise by their numbers from 0.
+
+        Returns
+        -------
+        str
+            The SQL. It gives NULL for a missing value, and for a category that the bins were made without.
+
+        Raises
+        ------
+        ValueError
+            There is no such dialect.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2)
+        >>> print(bins.to_sql("duckdb"))
+        CASE WHEN "income" IS NULL THEN NULL WHEN "income" <= 49.5 THEN 0 ELSE 1 END AS "income_bin"
+        """
         from ._sql import write
 
         return write(self, dialect, table, labels)
 
-    def transform(self, data: Any, labels: bool = False) -> Any:
-        """The bins of new data: a column of bin numbers from 0 for each attribute, or of the bins in words.
+    def transform(
+        self, data: Any, labels: bool = False, *, unseen: Unseen = "error", memory_limit: MemoryLimit | None = None
+    ) -> Any:
+        """Finds the bins of new data.
 
-        A pandas or polars frame gives one of its kind, an Arrow table gives a table; a path or any other stream gives a
-        `pyarrow.RecordBatchReader`, which reads it batch by batch. A missing value has no bin.
+        Parameters
+        ----------
+        data : table, stream, path or list of paths
+            As `supervised_bins` takes them, with the columns of all attributes.
+        labels : bool, default=False
+            Whether the bins are told in words; otherwise by their numbers from 0.
+        unseen : {"error", "missing"}, default="error"
+            What a category is that the bins were made without: an error with its row and column, or a missing value.
+        memory_limit : int or str, default=None
+            The most memory that the reading of a file may take, as in `supervised_bins`.
+
+        Returns
+        -------
+        pandas.DataFrame, polars.DataFrame, pyarrow.Table or pyarrow.RecordBatchReader
+            A column for each attribute. A pandas or polars frame gives one of its kind, an Arrow table gives a table;
+            a path, a LazyFrame or any other stream gives a reader, which takes the data batch by batch. A missing value
+            has no bin.
+
+        Raises
+        ------
+        DataError
+            A column is missing or of another type, or a category unseen; `column` and `row` tell where.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2)
+        >>> bins.transform(pd.DataFrame({"income": [12, None, 70]}), labels=True)["income"].tolist()
+        ['(-inf, 49.5]', nan, '(49.5, +inf)']
         """
         from ._transform import transform
 
-        return transform(self, data, labels)
+        return transform(self, data, labels, unseen, memory_limit)
 
     def plot(self, attribute: Any = None, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
         """Draws one attribute; the one of the largest gain if none is named."""
@@ -284,8 +402,19 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return plot_all(self, columns)
 
     def __repr__(self) -> str:
-        return f"<BinningResult: {self.method}, {len(self)} results>\n{self.summary().to_string(index=False)}"
+        return f"<BinningResult: {self.method}, {self._count()}>\n{self._shown().to_string(index=False, na_rep='')}"
 
     def _repr_html_(self) -> str:
-        figures = self.summary().to_html(index=False, float_format=lambda value: f"{value:.4g}", na_rep="")
-        return f"<div><p>Bins, {self.method}: {len(self)} results</p>{figures}</div>"
+        figures = self._shown().to_html(index=False, float_format=lambda value: f"{value:.4g}", na_rep="")
+        return f"<div><p>Bins, {self.method}: {self._count()}</p>{figures}</div>"
+
+    def _shown(self) -> pd.DataFrame:
+        """The summary, empty where a column that was left out has no figures."""
+        shown = self.summary()
+        if self.left_out:
+            figures = ["distinct_values", "minimum", "maximum"]
+            shown[figures] = shown[figures].astype(object).where(shown[figures].notna(), "")
+        return shown
+
+    def _count(self) -> str:
+        return f"{len(self)} results" + (f", {len(self.left_out)} columns left out" if self.left_out else "")

@@ -3,6 +3,7 @@
 from __future__ import annotations
 
 import math
+from collections.abc import Iterator
 
 import numpy as np
 import sqlglot.expressions as exp
@@ -11,19 +12,34 @@ from sqlglot import Dialect
 from . import _values
 from ._result import AttributeBins, BinningResult, Variable
 
-# Dialects whose numbers can be NaN. Where that is greater than all others it would fall into the last bin.
-_WITH_NAN_TEST = ("duckdb", "spark", "databricks", "bigquery", "trino", "presto", "clickhouse")
-_WITH_EQUAL_NAN = ("postgres", "snowflake")
-"""They have no function that tells, but there NaN equals itself."""
+# How a dialect tells a NaN, which would fall into the last bin where it is greater than all other numbers.
+_WITH_FUNCTION = (
+    *("athena", "bigquery", "clickhouse", "databricks", "duckdb"),
+    *("dune", "presto", "spark", "spark2", "trino"),
+)
+_WITH_PREDICATE = ("oracle",)
+_WITH_EQUAL_NAN = ("materialize", "postgres", "redshift", "risingwave", "snowflake")
+"""They have no function for it, but there NaN equals itself."""
+_WITH_UNCERTAIN_NAN = ("doris", "dremio", "drill", "druid", "hive", "starrocks")
+"""They have no function in all versions. NaN equals itself or differs from itself, depending on the version."""
+WITHOUT_NAN = (
+    *("", "dax", "exasol", "fabric", "mysql", "prql", "singlestore"),
+    *("solr", "sqlite", "tableau", "teradata", "tsql"),
+)
 
 
 def write(result: BinningResult, dialect: str, table: str | None, labels: bool) -> str:
-    Dialect.get_or_raise(dialect)  # before any work: a name that is not known
+    dialect = _name_of(Dialect.get_or_raise(dialect))
     binned = [found for found in result.bins if not found.status.is_error]
     columns = [exp.alias_(_case(found, dialect, labels), f"{found.attribute}_bin", quoted=True) for found in binned]
     if table is None:
         return ",\n".join(column.sql(dialect=dialect, pretty=True) for column in columns)
     return exp.select("*", *columns).from_(exp.to_table(table)).sql(dialect=dialect, pretty=True)
+
+
+def _name_of(dialect: Dialect) -> str:
+    names: Iterator[str] = (name for name, kind in Dialect.classes.items() if kind is type(dialect))
+    return next(names)
 
 
 def _case(found: AttributeBins, dialect: str, labels: bool) -> exp.Case:
@@ -52,16 +68,27 @@ def _case(found: AttributeBins, dialect: str, labels: bool) -> exp.Case:
 
 def _missing_conditions(variable: Variable, column: exp.Column, dialect: str) -> list[exp.Expression]:
     conditions: list[exp.Expression] = [column.copy().is_(exp.null())]
-    if variable.kind == "float" and dialect in _WITH_NAN_TEST:
-        conditions.append(exp.IsNan(this=column.copy()))
-    if variable.kind == "float" and dialect in _WITH_EQUAL_NAN:
-        conditions.append(column.copy().eq(exp.cast(exp.Literal.string("NaN"), exp.DataType.Type.DOUBLE)))
+    if variable.kind == "float":
+        conditions += _nan_conditions(column, dialect)
     if variable.missing_values:
         conditions.append(column.copy().isin(*[_literal(value, variable) for value in variable.missing_values]))
     if variable.missing_interval is not None:
         left, right = variable.missing_interval
         conditions.append(column.copy().between(_literal(left, variable), _literal(right, variable)))
     return conditions
+
+
+def _nan_conditions(column: exp.Column, dialect: str) -> list[exp.Expression]:
+    equals_nan = column.copy().eq(exp.cast(exp.Literal.string("NaN"), exp.DataType.Type.DOUBLE))
+    if dialect in _WITH_FUNCTION:
+        return [exp.IsNan(this=column.copy())]
+    if dialect in _WITH_PREDICATE:
+        return [exp.Is(this=column.copy(), expression=exp.var("NAN"))]
+    if dialect in _WITH_EQUAL_NAN:
+        return [equals_nan]
+    if dialect in _WITH_UNCERTAIN_NAN:
+        return [column.copy().neq(column.copy()), equals_nan]
+    return []
 
 
 def _literal(value: float | str, variable: Variable) -> exp.Expression:

@@ -4,6 +4,9 @@ from __future__ import annotations
 
 from collections.abc import Sequence
 from dataclasses import dataclass
+from typing import cast
+
+from ._types import Severity
 
 CANCELLED = 1
 BAD_BIN_TABLE = 120002
@@ -45,7 +48,7 @@ class Status:
     """How a run, or the binning of one attribute, ended."""
 
     code: int = 0
-    severity: str = "ok"
+    severity: Severity = "ok"
     """`"ok"`, `"warning"` or `"error"`. An error means that there are no bins; a warning, that there are."""
     discrete: tuple[int, ...] = (0, 0, 0)
     scale: tuple[float, ...] = (0.0, 0.0, 0.0)
@@ -53,7 +56,7 @@ class Status:
     @classmethod
     def from_core(cls, fields: tuple[int, str, Sequence[int], Sequence[float]]) -> Status:
         code, severity, discrete, scale = fields
-        return cls(code, severity, tuple(discrete), tuple(scale))
+        return cls(code, cast(Severity, severity), tuple(discrete), tuple(scale))
 
     @property
     def ok(self) -> bool:

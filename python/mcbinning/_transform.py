@@ -11,16 +11,23 @@ import pyarrow as pa
 from . import _core
 from ._errors import DataError
 from ._result import AttributeBins, BinningResult, Variable
-from ._sources import Source, check_names, columns_of, open_source
+from ._files import Reading
+from ._opening import open_source
+from ._sources import Source, check_names, columns_of
+from ._types import MemoryLimit, Unseen
 
 _ROWS_AT_ONCE = 1 << 17
 
 
-def transform(result: BinningResult, data: Any, labels: bool) -> Any:
+def transform(
+    result: BinningResult, data: Any, labels: bool, unseen: Unseen, memory_limit: MemoryLimit | None
+) -> Any:
+    if unseen not in ("error", "missing"):
+        raise ValueError(f"unseen must be 'error' or 'missing', not {unseen!r}")
     chosen = _one_for_each_attribute(result.bins)
     texts = {found.attribute: found.variable.missing_texts for found in chosen if found.variable.missing_texts}
-    source = open_source(data, result.missing_text, texts)
-    feed = open_values(source, [found.variable for found in chosen], result.missing_text)
+    source = open_source(data, Reading(result.missing_text, texts, memory_limit))
+    feed = open_values(source, [found.variable for found in chosen], result.missing_text, unseen)
     schema = pa.schema([(found.attribute, pa.utf8() if labels else pa.int32()) for found in chosen])
     batches = _batches(feed, chosen, schema, labels)
     if source.rows is None:
@@ -28,7 +35,9 @@ def transform(result: BinningResult, data: Any, labels: bool) -> Any:
     return _like(data, pa.Table.from_batches(batches, schema))
 
 
-def open_values(source: Source, variables: Sequence[Variable], missing_text: Sequence[str]) -> _core.Feed:
+def open_values(
+    source: Source, variables: Sequence[Variable], missing_text: Sequence[str], unseen: Unseen
+) -> _core.Feed:
     """A feed of the variables' values as numbers and codes; what is declared missing is NaN in what it reads."""
     names = [variable.name for variable in variables]
     check_names(source, names)
@@ -47,7 +56,7 @@ def open_values(source: Source, variables: Sequence[Variable], missing_text: Seq
         if variable.categories is not None:
             categories = list(variable.categories)
             feed.set_categories(
-                index, categories if columns[place].kind == "text" else _as_numbers(categories, variable)
+                index, categories if columns[place].kind == "text" else _as_numbers(categories, variable), unseen
             )
     return feed
 

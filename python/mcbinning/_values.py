@@ -79,7 +79,14 @@ def format_value(value: float, kind: str = "float", time_zone: str = "") -> str:
         return "+inf" if value > 0 else "-inf"
     if kind in ("date", "timestamp") and not math.isnan(value):
         return str(decode(value, kind, time_zone))
-    return repr(plain(value))
+    return repr(whole(value, kind))
+
+
+def whole(value: float, kind: str) -> float | int:
+    """A whole number as an int, so that it reads as one: of a column of whole numbers, or of decimals, whatever its
+    size; of others as long as all its digits say something."""
+    is_whole = math.isfinite(value) and value.is_integer() and (kind in ("integer", "decimal") or abs(value) < 1e16)
+    return int(value) if is_whole and not (value == 0 and math.copysign(1, value) < 0) else value
 
 
 def intervals(cut_points: Floats, closed: str, write: Callable[[float], str]) -> list[str]:

@@ -2,6 +2,8 @@
 
 #include "faults.h"
 
+#include <nanobind/stl/string.h>
+
 #include <cstring>
 #include <string>
 #include <utility>
@@ -25,7 +27,8 @@ ArrowOwner<Structure> TakeOut(const nb::capsule& capsule, const char* name)
 class StreamBatches : public Batches
 {
 public:
-    explicit StreamBatches(ArrowOwner<ArrowArrayStream> stream) : fStream(std::move(stream))
+    StreamBatches(ArrowOwner<ArrowArrayStream> stream, nb::object explain)
+        : fStream(std::move(stream)), fExplain(std::move(explain))
     {
         const int code = fStream->get_schema(fStream.operator->(), fSchema.Receive());
         if (code != 0)
@@ -48,10 +51,13 @@ private:
     std::string DescribeError(int code)
     {
         const char* const message = fStream->get_last_error(fStream.operator->());
-        return message != nullptr ? message : std::strerror(code);
+        const std::string text = message != nullptr ? message : std::strerror(code);
+        const nb::gil_scoped_acquire gil;
+        return fExplain.is_none() ? text : nb::cast<std::string>(fExplain(text));
     }
 
     ArrowOwner<ArrowArrayStream> fStream;
+    nb::object fExplain;
     ArrowOwner<ArrowSchema> fSchema;
     ArrowOwner<ArrowArray> fBatch;
 };
@@ -87,9 +93,9 @@ private:
 
 } // namespace
 
-std::unique_ptr<Batches> OpenStream(nb::capsule stream)
+std::unique_ptr<Batches> OpenStream(nb::capsule stream, nb::object explain)
 {
-    return std::make_unique<StreamBatches>(TakeOut<ArrowArrayStream>(stream, "arrow_array_stream"));
+    return std::make_unique<StreamBatches>(TakeOut<ArrowArrayStream>(stream, "arrow_array_stream"), std::move(explain));
 }
 
 std::unique_ptr<Batches> OpenIterator(nb::capsule schema, nb::object iterator)

@@ -11,6 +11,9 @@ namespace
 
 using Storage = ColumnType::Storage;
 
+/// The flag of a schema whose dictionary is ordered, as the Arrow C data interface defines it.
+constexpr std::int64_t kDictionaryOrdered = 1;
+
 bool StartsWith(std::string_view text, std::string_view prefix)
 {
     return text.substr(0, prefix.size()) == prefix;
@@ -128,5 +131,6 @@ ColumnType ReadColumnType(const ArrowSchema& schema)
     ColumnType type = FromFormat(schema.dictionary->format);
     type.isDictionary = true;
     type.indexStorage = FromFormat(schema.format).storage;
+    type.isOrdered = (schema.flags & kDictionaryOrdered) != 0;
     return type;
 }

@@ -41,6 +41,7 @@ struct ColumnType
     /// The stored numbers are places in a dictionary, and what is told above is about its values.
     bool isDictionary = false;
     Storage indexStorage = Storage::kNone; ///< of a dictionary
+    bool isOrdered = false;                ///< the order of the dictionary is that of its values
 
     bool IsText() const
     {

@@ -2,24 +2,27 @@
 #define MCBINNING_FAULTS_H
 
 #include <cstdint>
+#include <optional>
 #include <stdexcept>
 #include <string>
+#include <utility>
 
 /// The data can't be used. Becomes the package's DataError.
 class DataFault : public std::runtime_error
 {
 public:
-    /// `row` counts from 0; -1 where the fault is not one of a row. The column may be empty, too.
-    DataFault(const std::string& message, std::string column = {}, std::int64_t row = -1)
+    /// `row` counts from 0; -1 where the fault is not one of a row. A column's name may be empty; none is nullopt.
+    explicit DataFault(const std::string& message, std::optional<std::string> column = std::nullopt,
+                       std::int64_t row = -1)
         : std::runtime_error(message), fColumn(std::move(column)), fRow(row)
     {
     }
 
-    const std::string& GetColumn() const { return fColumn; }
+    const std::optional<std::string>& GetColumn() const { return fColumn; }
     std::int64_t GetRow() const { return fRow; }
 
 private:
-    std::string fColumn;
+    std::optional<std::string> fColumn;
     std::int64_t fRow;
 };
 

@@ -77,6 +77,17 @@ Variable::Use UseOf(const std::string& use)
     throw nb::value_error("no such use");
 }
 
+Variable::Unseen UnseenOf(const std::string& unseen)
+{
+    if (unseen == "changed")
+        return Variable::Unseen::kChanged;
+    if (unseen == "error")
+        return Variable::Unseen::kError;
+    if (unseen == "missing")
+        return Variable::Unseen::kMissing;
+    throw nb::value_error("no such treatment of unseen categories");
+}
+
 StridedArray Borrow(const Array& array, const std::string& name)
 {
     const StridedArray borrowed{array.data(), array.stride(0) * (array.dtype().bits / 8), array.shape(0),
@@ -220,8 +231,8 @@ public:
         for (const std::string& text : texts) variable.missingTexts.AddValue(text, "");
     }
 
-    /// Tells all categories that there will be, by code.
-    void SetCategories(std::size_t index, nb::list categories)
+    /// Tells all categories that there will be, by code, and what another one is: "changed", "error" or "missing".
+    void SetCategories(std::size_t index, nb::list categories, const std::string& unseen)
     {
         Variable& variable = fVariables.at(index);
         for (nb::handle category : categories)
@@ -232,15 +243,21 @@ public:
                 variable.numbers.Encode(nb::cast<double>(category));
         }
         variable.isComplete = true;
+        variable.unseen = UnseenOf(unseen);
     }
 
-    /// The categories known by now, in ascending order.
+    /// The categories: by code where all have been told, else those known by now, in the order that their column
+    /// declares or else in ascending order.
     nb::list GetCategories(std::size_t index) const
     {
         const Variable& variable = fVariables.at(index);
         nb::list categories;
-        for (const std::string& text : variable.texts.GetSorted()) categories.append(text);
-        for (const double number : variable.numbers.GetSorted()) categories.append(number);
+        const auto append = [&](const auto& table)
+        {
+            for (const auto& key : variable.isComplete ? table.GetKeys() : table.GetSorted()) categories.append(key);
+        };
+        append(variable.texts);
+        append(variable.numbers);
         return categories;
     }
 
@@ -327,7 +344,8 @@ private:
     std::optional<TableBlocks> fReading; ///< where Read has got to
 };
 
-/// A tuple for each column: name, kind of values, time zone, and whether it can be used.
+/// A tuple for each column: name, kind of values, time zone, whether it can be used, and whether it is a dictionary that
+/// declares the order of its values.
 nb::list DescribeColumns(const Table& table)
 {
     const ArrowSchema& schema = table.batches->GetSchema();
@@ -337,7 +355,7 @@ nb::list DescribeColumns(const Table& table)
         const ColumnType type = ReadColumnType(*schema.children[i]);
         const char* const name = schema.children[i]->name;
         columns.append(nb::make_tuple(name != nullptr ? name : "", type.kind, type.timeZone,
-                                      type.storage != ColumnType::Storage::kNone));
+                                      type.storage != ColumnType::Storage::kNone, type.isOrdered));
     }
     return columns;
 }
@@ -380,7 +398,10 @@ NB_MODULE(_core, module)
 
     nb::class_<Table>(module, "Table")
         .def_static(
-            "from_stream", [](nb::capsule stream) { return Table{OpenStream(std::move(stream))}; }, "stream"_a)
+            "from_stream",
+            [](nb::capsule stream, nb::object explain)
+            { return Table{OpenStream(std::move(stream), std::move(explain))}; },
+            "stream"_a, "explain"_a.none() = nb::none())
         .def_static(
             "from_iterator",
             [](nb::capsule schema, nb::object iterator)
@@ -393,7 +414,7 @@ NB_MODULE(_core, module)
         .def("add_variable", &Feed::AddVariable, "name"_a, "use"_a, nb::kw_only(), "column"_a = -1,
              "array"_a.none() = nb::none(), "num_codes"_a = 0)
         .def("declare_missing", &Feed::DeclareMissing, "index"_a, "values"_a, "interval"_a.none(), "texts"_a)
-        .def("set_categories", &Feed::SetCategories, "index"_a, "categories"_a)
+        .def("set_categories", &Feed::SetCategories, "index"_a, "categories"_a, "unseen"_a = "changed")
         .def("categories", &Feed::GetCategories, "index"_a)
         .def("learn_categories", &Feed::LearnCategories)
         .def("read", &Feed::Read, "max_rows"_a)

@@ -5,6 +5,8 @@
 #include <mcobnqrt/mccommon.h>
 
 #include <algorithm>
+#include <array>
+#include <charconv>
 #include <cmath>
 #include <optional>
 #include <string>
@@ -20,16 +22,44 @@ using MCMV::gMissingValue;
 constexpr std::size_t kMaxCategories = 256;
 constexpr double kMissingCode = -1.0;
 
-/// The code of a category that has just been looked up.
-double CheckCode(const Variable& variable, std::size_t code, std::size_t numKnown, std::int64_t row)
+std::string Describe(std::string_view text)
 {
-    if (code < numKnown)
-        return static_cast<double>(code);
+    return "the category '" + std::string(text) + "'";
+}
+
+std::string Describe(double number)
+{
+    std::array<char, 32> text;
+    const std::to_chars_result end = std::to_chars(text.data(), text.data() + text.size(), number);
+    return "the category " + std::string(text.data(), end.ptr);
+}
+
+double EncodeUnseen(const Variable& variable, const std::string& category, std::int64_t row)
+{
+    switch (variable.unseen)
+    {
+    case Variable::Unseen::kMissing:
+        return kMissingCode;
+    case Variable::Unseen::kError:
+        throw DataFault(category + " is not among those that the bins were made of; unseen=\"missing\" gives it no bin",
+                        variable.name, row);
+    case Variable::Unseen::kChanged:
+        break;
+    }
+    throw DataFault(category + " was not there when the data were read for the first time", variable.name, row);
+}
+
+/// The code of a category, which becomes one of `table` where that may still grow.
+template<class Table, class View>
+double EncodeCategory(Variable& variable, Table& table, const View& category, std::int64_t row)
+{
+    if (const std::optional<std::size_t> code = table.Find(category))
+        return static_cast<double>(*code);
     if (variable.isComplete)
-        throw DataFault("there is a category that was not there before", variable.name, row);
-    if (code >= kMaxCategories)
+        return EncodeUnseen(variable, Describe(category), row);
+    if (table.GetSize() >= kMaxCategories)
         throw DataFault("there are more than 256 categories", variable.name, row);
-    return static_cast<double>(code);
+    return static_cast<double>(table.Encode(category));
 }
 
 class ValueField : public FieldReader
@@ -99,8 +129,7 @@ private:
     {
         if (value == gMissingValue || std::isnan(value) || fVariable.missingNumbers.Contains(value))
             return kMissingCode;
-        const std::size_t numKnown = fVariable.numbers.GetSize();
-        return CheckCode(fVariable, fVariable.numbers.Encode(value), numKnown, row);
+        return EncodeCategory(fVariable, fVariable.numbers, value, row);
     }
 
     std::unique_ptr<ColumnReader> fReader;
@@ -113,8 +142,7 @@ double EncodeText(Variable& variable, std::optional<std::string_view> text, std:
         return kMissingCode;
     if (variable.missingTexts.GetNDiscreteValues() > 0 && variable.missingTexts.Contains(std::string(*text)))
         return kMissingCode;
-    const std::size_t numKnown = variable.texts.GetSize();
-    return CheckCode(variable, variable.texts.Encode(*text), numKnown, row);
+    return EncodeCategory(variable, variable.texts, *text, row);
 }
 
 class TextCategoryField : public FieldReader
@@ -168,6 +196,41 @@ private:
     std::vector<double> fCodes; ///< by place; gMissingValue where not looked up yet
     Variable& fVariable;
 };
+
+std::vector<std::string> ReadTexts(const ArrowArray& dictionary, const ColumnType& type)
+{
+    const TextReader reader(dictionary, type.storage, 0);
+    std::vector<std::string> texts;
+    for (std::size_t i = 0; i < static_cast<std::size_t>(dictionary.length); ++i)
+    {
+        if (const std::optional<std::string_view> text = reader.At(i))
+            texts.emplace_back(*text);
+    }
+    return texts;
+}
+
+std::vector<double> ReadNumbers(const ArrowArray& dictionary, ColumnType type)
+{
+    type.isDictionary = false;
+    std::vector<double> numbers(static_cast<std::size_t>(dictionary.length));
+    MakeReader(dictionary, type, 0)->Read(0, numbers.size(), numbers.data());
+    numbers.erase(std::remove_if(numbers.begin(), numbers.end(), [](double number) { return std::isnan(number); }),
+                  numbers.end());
+    return numbers;
+}
+
+/// Tells the variable the order of the categories that an ordered dictionary declares. Once all categories are known
+/// they have their codes, and the order says no more.
+void DeclareOrder(Variable& variable, const ColumnType& type, const ArrowArray& column)
+{
+    if (!type.isDictionary || !type.isOrdered || variable.use != Variable::Use::kCategory || variable.isComplete)
+        return;
+    const bool isMerged = type.IsText()
+                              ? variable.texts.GetDeclaredOrder().Merge(ReadTexts(*column.dictionary, type))
+                              : variable.numbers.GetDeclaredOrder().Merge(ReadNumbers(*column.dictionary, type));
+    if (!isMerged)
+        throw DataFault("two batches declare the categories in different orders", variable.name);
+}
 
 /// The type of the variable's column, if it is one for the variable's use.
 ColumnType CheckType(const ArrowSchema& schema, const Variable& variable)
@@ -267,6 +330,7 @@ std::unique_ptr<FieldReader> TableBlocks::MakeFieldReader(std::size_t index, con
     else
     {
         const ArrowArray& column = *batch->children[variable.column];
+        DeclareOrder(variable, type, column);
         if (type.IsText() && type.isDictionary)
             return std::make_unique<DictionaryCategoryField>(
                 MakePlaceReader(column, type, batch->offset), TextReader(*column.dictionary, type.storage, 0),

@@ -23,6 +23,14 @@ struct Variable
         kWeight
     };
 
+    /// What a category is that is not among the known ones.
+    enum class Unseen
+    {
+        kChanged, ///< an error: the data changed between two readings
+        kError,   ///< an error: the bins were made without it
+        kMissing  ///< a missing value
+    };
+
     std::string name;
     Use use = Use::kAttribute;
 
@@ -34,8 +42,9 @@ struct Variable
     int numCodes = 0;
     NumberCategories numbers;
     TextCategories texts;
-    /// All categories are known, and another one is an error.
+    /// All categories are known, and `unseen` tells what another one is.
     bool isComplete = false;
+    Unseen unseen = Unseen::kChanged;
 
     BINNumericUserMissing missingNumbers;
     BINStringUserMissing missingTexts;

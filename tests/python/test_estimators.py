@@ -122,11 +122,54 @@ def test_polars_output_has_the_names_of_the_columns(mixed):
         (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [np.nan]), "'sample_weight', row 23: the weight is NaN"),
         (dict(X=pa.table({"x": WITH_GAP[:, 0]}).to_reader(), y=TWO_CLASSES[:-1]), "has at least 24 rows, but there are 23"),
         (dict(X=pd.DataFrame({"t": ["a", "b"] * 12}), y=TWO_CLASSES), "column 't': the column holds texts"),
+        (dict(X=np.arange(24).astype("m8[s]")[:, None], y=TWO_CLASSES), "column 'x0': .*duration"),
+        (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [pd.NA]), "'sample_weight', row 23: the weight is NaN"),
     ],
 )
 def test_bad_data_are_refused_with_column_and_row(arguments, message):
     with pytest.raises(ValueError, match=message):
         mb.SupervisedBinner().fit(**arguments)
+
+
+@pytest.mark.parametrize("unit", ["Y", "M", "W", "D", "h", "m", "s", "ms", "us", "ns"])
+def test_a_matrix_of_dates_is_cut_at_dates_and_nat_is_missing(unit):
+    stamps = np.array(["2010", "2011", "2012", "2020", "2021", "2022", "NaT"] * 4, f"M8[{unit}]")
+    binner = mb.SupervisedBinner(encode="interval").fit(stamps[:, None], ["low"] * 3 + ["up"] * 4 + (["low"] * 3 + ["up"] * 4) * 3)
+
+    assert binner.result_["x0"].labels[0].startswith("(-inf, 201") and len(binner.cut_points_[0]) == 1
+    assert [label == "missing" for label in binner.transform(stamps[:7, None])[:, 0]] == [False] * 6 + [True]
+
+
+@pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
+@pytest.mark.parametrize("form", [lambda rows: np.array(rows, dtype=object), list, pd.DataFrame])
+def test_na_among_objects_is_missing(form):
+    rows = [[value, 1.0] for value in [*WITH_GAP[:, 0], pd.NA, None]]
+    binner = mb.SupervisedBinner().fit(form(rows), [*TWO_CLASSES, "up", "low"])
+
+    assert binner.cut_points_[0].tolist() == [3.0]
+    assert binner.transform(form(rows))[-2:, 0].tolist() == [2.0, 2.0]
+
+
+def test_polars_output_in_words_is_text_even_with_missing_values():
+    X = pl.DataFrame({"x": [None, *WITH_GAP[:, 0]]})  # polars takes the first value for the type of all
+    for missing in ("keep", "code"):
+        binner = mb.SupervisedBinner(encode="interval", missing=missing).set_output(transform="polars")
+        out = binner.fit(X.lazy(), ["up", *TWO_CLASSES]).transform(X)
+        assert out.schema == {"x": pl.String}
+        assert out["x"].to_list()[:2] == ["missing" if missing == "code" else None, "(-inf, 3]"]
+
+
+@pytest.mark.parametrize(
+    ("y", "kind"),
+    [([1, 2] * 12, "integer"), ([0.5, 2.0] * 12, "float"), ([True, False] * 12, "boolean"), (["a", "b"] * 12, "text")],
+)
+@pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
+def test_json_of_a_fitted_binner_has_its_classes_as_they_are(y, kind):
+    result = mb.SupervisedBinner().fit(WITH_GAP, y).result_
+    again = mb.BinningResult.from_json(result.to_json())
+
+    assert again["x0"].target.kind == kind
+    assert again["x0"].target.category_names() == result["x0"].target.category_names() == sorted(set(y))
 
 
 @pytest.mark.parametrize(

@@ -212,6 +212,13 @@ def test_columns_of_a_pandas_frame_need_no_texts_as_names():
 
     assert list(mb.equal_frequency_bins(frame, n_bins=2)) == ["2020", "('a', 'b')"]
     assert mb.equal_frequency_bins(frame, ["2020"], n_bins=2).transform(frame)["2020"].tolist() == [0] * 10 + [1] * 10
+    result = mb.supervised_bins(frame.assign(y=frame[2020] > 20), "y", [2020, ("a", "b")], missing={2020: 0})
+    assert list(mb.equal_frequency_bins(frame, 2020, n_bins=2)) == ["2020"]
+    assert result[2020] is result["2020"] and result[2020].missing_weight == 1.0
+    assert result[("a", "b")] is result["('a', 'b')"] and result[2020, "y"] is result[2020]
+    with pytest.raises(mb.DataError, match="column '0': there is no such column") as caught:
+        mb.supervised_bins(frame, 0)
+    assert caught.value.column == "0"
     with pytest.raises(mb.DataError, match="column 'a': there are several columns of this name"):
         mb.equal_frequency_bins(frame.set_axis(["a", "a"], axis=1))
 
@@ -219,12 +226,18 @@ def test_columns_of_a_pandas_frame_need_no_texts_as_names():
 def test_text_is_left_out_unless_it_is_named(mixed):
     frame = mixed[["x", "y"]].assign(kind=mixed["y"].str.upper())
 
-    assert mb.supervised_bins(frame, "y").left_out == ("kind",)
+    assert mb.supervised_bins(frame, "y").left_out == {"kind": "text"}
     result = mb.supervised_bins(frame, "y", attributes=["kind"])
     assert result["kind"].labels == ["{A}", "{B}", "{C}"]
     assert result.transform(frame)["kind"].tolist() == [ord(text) - ord("a") for text in frame["y"]]
-    with pytest.raises(mb.DataError, match="column 'kind', row 2: there is a category that was not there before"):
-        result.transform(pd.DataFrame({"kind": ["A", "C", "D"]}))
+    news = pd.DataFrame({"kind": ["A", "C", "D", None, "B"]})
+    for data in (news, news.astype("category"), pl.from_pandas(news)):
+        with pytest.raises(mb.DataError, match="column 'kind', row 2: the category 'D' is not among") as caught:
+            result.transform(data)
+        assert (caught.value.column, caught.value.row) == ("kind", 2)
+        assert pl.DataFrame(result.transform(data, unseen="missing"))["kind"].to_list() == [0, 2, None, None, 1]
+    with pytest.raises(ValueError, match="unseen must be 'error' or 'missing', not 'ignore'"):
+        result.transform(news, unseen="ignore")
 
 
 def failing_reader(table: pa.Table) -> pa.RecordBatchReader:
@@ -247,8 +260,11 @@ def failing_reader(table: pa.Table) -> pa.RecordBatchReader:
         ({"x": [1.0] * 2, "w": [1.0, np.nan]}, {"weight": "w"}, mb.DataError, "column 'w', row 1: the weight is NaN"),
         ({"x": [1.0], "w": [np.inf]}, {"weight": "w"}, mb.DataError, "column 'w', row 0: the weight is infinite"),
         ({"x": range(300), "y": range(300)}, {"target": "y"}, mb.DataError, "'y', row 256: there are more than 256"),
-        ({"x": [[1.0], [2.0]]}, {}, mb.DataError, "column 'x': .*nested"),
-        ({"x": [datetime.time(1, 30)]}, {}, mb.DataError, "column 'x': .*time of day"),
+        ({"x": [[1.0], [2.0]]}, {"attributes": ["x"]}, mb.DataError, "column 'x': .*nested"),
+        ({"x": [datetime.time(1, 30)]}, {"attributes": ["x"]}, mb.DataError, "column 'x': .*time of day"),
+        ({"": [datetime.time(1, 30)]}, {}, mb.DataError, r"nothing to bin.*'' \(time of day\)"),
+        ({"x": [1.0], "": [1]}, {"attributes": [0]}, mb.DataError, "column '0': there is no such column"),
+        ({"x": [1.0], "": [-1]}, {"weight": ""}, mb.DataError, "column '', row 0: the weight is negative"),
         ({"x": [1.0]}, {"attributes": []}, mb.DataError, "no attribute is named"),
         ({"x": [1.0]}, {"missing": {"x": "none"}}, mb.DataError, "column 'x': what is declared missing.*'none'"),
         ({"x": [1.0]}, {"missing": {"x": (9, 1)}}, mb.DataError, r"column 'x': .*\(9, 1\) begins above its end"),
@@ -276,7 +292,7 @@ def test_a_path_or_a_frame_that_cannot_be_read_says_why(tmp_path):
     with pytest.raises(mb.StreamError, match="Line: 30002"):
         mb.equal_frequency_bins(tmp_path / "late.csv")
     with pytest.raises(mb.DataError, match="column 'mixed'") as refused:
-        mb.equal_frequency_bins(pd.DataFrame({"x": [1, 2], "mixed": [1, "a"]}))
+        mb.equal_frequency_bins(pd.DataFrame({"x": [1, 2], "mixed": [1, "a"]}), attributes=["mixed"])
     assert refused.value.column == "mixed"
     with pytest.raises(mb.DataError, match="a table with named columns is needed"):
         mb.equal_frequency_bins(pl.Series("x", [1.0, 2.0]))

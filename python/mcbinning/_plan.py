@@ -1,0 +1,168 @@
+"""Which columns take part in a run, and as what."""
+
+from __future__ import annotations
+
+from collections.abc import Iterable, Mapping, Sequence
+from dataclasses import dataclass
+from typing import Any
+
+import numpy as np
+
+from . import _core, _values
+from ._errors import DataError
+from ._result import Variable
+from ._sources import Column, Source, check_names, name_of
+from ._types import Missing
+
+
+def names_to_bin(source: Source, attributes: Any, others: Sequence[str | None]) -> list[str]:
+    """Those that the user named, or all columns that can be measured but the `others`."""
+    if attributes is not None:
+        is_one = isinstance(attributes, str) or not isinstance(attributes, Iterable)
+        return list(dict.fromkeys(map(name_of, [attributes] if is_one else attributes)))
+    left_out = columns_left_out(source, others)
+    names = [column.name for column in source.columns if column.name not in others and column.name not in left_out]
+    if not names:
+        named = ", ".join(f"{name!r} ({kind})" for name, kind in left_out.items())
+        named = f"; left out are {named}" if named else ""
+        raise DataError(f"there is nothing to bin: no column holds numbers{named}")
+    return names
+
+
+def columns_left_out(source: Source, others: Sequence[str | None]) -> dict[str, str]:
+    """By name: what a column holds that is binned only if it is named, or not at all."""
+    return {
+        column.name: column.kind
+        for column in source.columns
+        if column.name not in others and (column.kind == "text" or not column.is_usable)
+    }
+
+
+def name_missing(missing: Missing | None) -> dict[str, Any]:
+    return {name_of(column): declared for column, declared in (missing or {}).items()}
+
+
+def parse_missing(declared: Any, kind: str) -> tuple[tuple[Any, ...], tuple[float, float] | None]:
+    """What the user declared missing in a column of this kind: values, as texts or numbers, and an interval."""
+    items = declared if isinstance(declared, (list, set, frozenset, np.ndarray)) else [declared]
+    intervals = [item for item in items if isinstance(item, tuple)]
+    values = [item for item in items if not isinstance(item, tuple)]
+    if len(intervals) > 1 or any(len(ends) != 2 for ends in intervals):
+        raise ValueError("at most one interval, of two ends, can be declared missing")
+    if kind == "text":
+        if intervals:
+            raise ValueError("an interval of texts can't be declared missing")
+        return tuple(map(str, values)), None
+    numbers = tuple(_values.encode(value, kind) for value in values)
+    if not intervals:
+        return numbers, None
+    left, right = (_values.encode(end, kind) for end in intervals[0])
+    if not left <= right:
+        raise ValueError(f"the interval {intervals[0]} begins above its end")
+    return numbers, (left, right)
+
+
+@dataclass(frozen=True)
+class Plan:
+    """Which columns take part, and as what."""
+
+    source: Source
+    pairs: Sequence[tuple[str, str | None]]
+    target: str | None
+    """That of all pairs, if they have one."""
+    weight: str | None
+    missing: Mapping[str, Any]
+
+    def __post_init__(self) -> None:
+        check_names(self.source, [*self.names, *self.missing])
+        if not self.pairs:
+            raise DataError("there is nothing to bin: no attribute is named")
+        for attribute, target in self.pairs:
+            if attribute == target:
+                raise DataError("the column can't be attribute and target at once", attribute)
+            if self.weight is not None and self.weight in (attribute, target):
+                raise DataError("the weight can't be attribute or target, too", self.weight)
+
+    @property
+    def targets(self) -> list[str]:
+        return list(dict.fromkeys(target for _, target in self.pairs if target is not None))
+
+    @property
+    def names(self) -> list[str]:
+        """Of the variables, in the order of the columns."""
+        taking_part = {self.weight, *self.targets, *(attribute for attribute, _ in self.pairs)}
+        in_order = [column.name for column in self.source.columns if column.name in taking_part]
+        return in_order + sorted(name for name in taking_part if name is not None and name not in in_order)
+
+    def open_feed(self, directory: str) -> _core.Feed:
+        """A feed that knows all categories."""
+        categorical = [name for name in self.names if self._use(name) == "category"]
+        if not categorical:
+            return self._make_feed(self.names)
+        if self.source.is_once:
+            feed = self._make_feed(self.names)
+            feed.spool(directory)
+            known = feed
+            indices = {name: self.names.index(name) for name in categorical}
+        else:
+            known = self._make_feed(categorical)
+            known.learn_categories()
+            feed = self._make_feed(self.names)
+            indices = {name: i for i, name in enumerate(categorical)}
+        for name in categorical:
+            categories = known.categories(indices[name])
+            self._check_categories(name, categories)
+            if known is not feed:
+                feed.set_categories(self.names.index(name), categories)
+        return feed
+
+    def variables(self, feed: _core.Feed) -> list[Variable]:
+        return [self._variable(feed, index, name) for index, name in enumerate(self.names)]
+
+    def _column(self, name: str) -> Column:
+        return next(column for column in self.source.columns if column.name == name)
+
+    def _use(self, name: str) -> str:
+        if name == self.weight:
+            return "weight"
+        column = self._column(name)
+        is_category = name in self.targets or column.kind == "text" or column.is_ordered
+        return "category" if is_category else "attribute"
+
+    def _missing(self, name: str) -> tuple[tuple[Any, ...], tuple[float, float] | None]:
+        try:
+            return parse_missing(self.missing.get(name, []), self._column(name).kind)
+        except (TypeError, ValueError, OverflowError) as error:
+            raise DataError(f"what is declared missing can't be used: {error}", name) from error
+
+    def _make_feed(self, names: list[str]) -> _core.Feed:
+        table = self.source.open(names)
+        places = [fields[0] for fields in table.columns]
+        feed = _core.Feed(table)
+        for index, name in enumerate(names):
+            feed.add_variable(name, self._use(name), column=places.index(name))
+            values, interval = self._missing(name)
+            is_text = self._column(name).kind == "text"
+            feed.declare_missing(index, [] if is_text else list(values), interval, list(values) if is_text else [])
+        return feed
+
+    def _variable(self, feed: _core.Feed, index: int, name: str) -> Variable:
+        column = self._column(name)
+        use = self._use(name)
+        return Variable(
+            name,
+            "weight" if use == "weight" else "target" if name == self.target else "attribute",
+            column.kind,
+            column.time_zone,
+            tuple(feed.categories(index)) if use == "category" else None,
+            *self._missing(name),
+            rounding="none" if use == "weight" else None,
+        )
+
+    def _check_categories(self, name: str, categories: list[Any]) -> None:
+        if len(categories) == 0:
+            raise DataError("no row has a category: the data are empty, or all is missing", name)
+        if len(categories) == 1:
+            column = self._column(name)
+            category = categories[0] if column.kind == "text" else _values.decode(categories[0], column.kind)
+            raise DataError(f"there is a single category, {category!r}; at least 2 are needed", name)

@@ -1,0 +1,31 @@
+"""Checks of the settings of a run."""
+
+from __future__ import annotations
+
+import numbers
+import os
+import tempfile
+from typing import Any
+
+_LARGEST_INT = 2**31 - 1
+
+
+def check_settings(
+    closed: str, n_bins: int, max_distinct: int | None = None, small_bin_ratio: float = 0.0
+) -> None:
+    if closed not in ("right", "left"):
+        raise ValueError(f"closed must be 'right' or 'left', not {closed!r}")
+    _check_whole("n_bins", n_bins, 2)
+    if max_distinct is not None:
+        _check_whole("max_distinct", max_distinct, 1)
+    if not 0.0 <= small_bin_ratio <= 1.0:
+        raise ValueError(f"small_bin_ratio must be from 0 to 1, not {small_bin_ratio}")
+
+
+def _check_whole(name: str, value: Any, least: int) -> None:
+    if not isinstance(value, numbers.Integral) or not least <= int(value) <= _LARGEST_INT:
+        raise ValueError(f"{name} must be a whole number of at least {least}, not {value!r}")
+
+
+def directory_of(temp_dir: str | os.PathLike[str] | None) -> str:
+    return os.fspath(temp_dir) if temp_dir is not None else tempfile.gettempdir()

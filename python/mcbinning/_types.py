@@ -1,0 +1,21 @@
+"""The words that options and results are told in."""
+
+from __future__ import annotations
+
+from collections.abc import Mapping
+from typing import Any, Literal
+
+Closed = Literal["right", "left"]
+Encode = Literal["ordinal", "onehot", "interval"]
+MissingOutput = Literal["code", "keep"]
+Unseen = Literal["error", "missing"]
+Method = Literal["supervised", "equal-frequency"]
+Role = Literal["attribute", "target", "weight"]
+Severity = Literal["ok", "warning", "error"]
+
+Missing = Mapping[Any, Any]
+"""By column: the value that stands for missing, or a list of such values. A tuple of two numbers among them is an
+interval, both ends included; there is at most one."""
+
+MemoryLimit = int | str
+"""Bytes, as a number or as a text such as "512MB"."""
