@@ -6,7 +6,10 @@
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
+#include <optional>
+#include <system_error>
 
+#include <fcntl.h>
 #include <stdlib.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -14,12 +17,69 @@
 namespace
 {
 
-/// mkstemp makes files for their owner alone; the ones that are kept get what any new file gets.
-void GiveUsualMode(int descriptor)
+namespace fs = std::filesystem;
+
+/// Whether the path is a name of one of this process's own descriptors, which is a link for the system.
+bool IsDescriptor(const fs::path& path)
 {
-    const mode_t mask = umask(0);
-    umask(mask);
-    fchmod(descriptor, 0666 & ~mask);
+    std::error_code error;
+    const fs::path descriptors = fs::canonical("/proc/self/fd", error);
+    return !error && fs::is_symlink(fs::symlink_status(path, error)) &&
+           fs::canonical(fs::absolute(path).parent_path(), error) == descriptors;
+}
+
+/// What a chain of links leads to, as a shell's > has it: a file that is there or not, or a descriptor, as behind
+/// /dev/stdout. Sets errno and gives nothing if the chain doesn't end.
+std::optional<fs::path> FollowLinks(fs::path path)
+{
+    constexpr int kMostLinks = 40; // as many as the system follows
+    std::error_code error;
+    for (int i = 0; i < kMostLinks; ++i)
+    {
+        if (!fs::is_symlink(fs::symlink_status(path, error)) || IsDescriptor(path))
+            return path;
+        path = path.parent_path() / fs::read_symlink(path, error); // an absolute one replaces the directory
+    }
+    errno = ELOOP;
+    return std::nullopt;
+}
+
+bool IsOtherThanAFile(const fs::path& path)
+{
+    std::error_code error;
+    const fs::file_status status = fs::status(path, error);
+    return fs::exists(status) && !fs::is_regular_file(status);
+}
+
+/// mkstemp makes files for their owner alone. One that is kept gets what the umask leaves, as any new file, or takes
+/// over from the file that it replaces.
+void GiveMode(int descriptor, const std::string& replaced)
+{
+    struct stat former = {};
+    if (stat(replaced.c_str(), &former) != 0)
+    {
+        const mode_t mask = umask(0);
+        umask(mask);
+        fchmod(descriptor, 0666 & ~mask);
+        return;
+    }
+    // Only root can give a file away, and others only to groups of their own.
+    const bool isSameGroup = fchown(descriptor, former.st_uid, former.st_gid) == 0 ||
+                             fchown(descriptor, static_cast<uid_t>(-1), former.st_gid) == 0;
+    // What the former group could do is not for another one.
+    fchmod(descriptor, former.st_mode & (isSameGroup ? 0777 : 0707));
+}
+
+/// So that the new name outlasts a loss of power. It has been given by now, and what system can't flush a directory, or
+/// lets it be written but not read, has nothing to tell.
+void FlushDirectory(const std::string& path)
+{
+    const fs::path directory = fs::path(path).parent_path();
+    const int descriptor = open(directory.empty() ? "." : directory.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    if (descriptor < 0)
+        return;
+    fsync(descriptor);
+    close(descriptor);
 }
 
 } // namespace
@@ -32,17 +92,20 @@ void OutputFile::Closer::operator()(std::FILE* file) const
 
 OutputFile::OutputFile(const std::string& path) : fPath(path)
 {
-    std::error_code error;
-    const std::filesystem::file_status status = std::filesystem::status(path, error);
     if (path == "-")
     {
         fPath = "standard output";
         fFile.reset(stdout);
+        return;
     }
-    else if (std::filesystem::exists(status) && !std::filesystem::is_regular_file(status))
+    const std::optional<fs::path> target = FollowLinks(path);
+    if (target && IsDescriptor(*target))
+        // To open it once more would begin at the front of a file that a shell has opened.
+        fFile.reset(fdopen(dup(std::stoi(target->filename().string())), "wb"));
+    else if (target && IsOtherThanAFile(*target))
         fFile.reset(std::fopen(path.c_str(), "wb"));
-    else
-        OpenTemporary();
+    else if (target)
+        OpenTemporary(target->string());
     if (!fFile)
         Fail();
 }
@@ -53,19 +116,17 @@ OutputFile::~OutputFile()
         unlink(fTemporary.c_str());
 }
 
-void OutputFile::OpenTemporary()
+void OutputFile::OpenTemporary(const std::string& target)
 {
-    // A link stays one: what it leads to is replaced.
-    std::error_code error;
-    const std::filesystem::path target = std::filesystem::canonical(fPath, error);
-    if (!error)
-        fPath = target.string();
-    std::string name = fPath + ".XXXXXX";
+    // A file needn't be writable to be replaced, but its mode says that it isn't to be lost.
+    if (access(target.c_str(), W_OK) != 0 && errno != ENOENT)
+        Fail();
+    fTarget = target;
+    std::string name = target + ".XXXXXX";
     const int descriptor = mkstemp(name.data());
     if (descriptor < 0)
         Fail();
     fTemporary = name;
-    GiveUsualMode(descriptor);
     fFile.reset(fdopen(descriptor, "wb"));
 }
 
@@ -79,11 +140,25 @@ void OutputFile::Commit()
 {
     if (std::fflush(fFile.get()) != 0)
         Fail();
+    if (!fTemporary.empty())
+        Secure(fileno(fFile.get()));
     if (fFile.get() != stdout && std::fclose(fFile.release()) != 0)
         Fail();
-    if (!fTemporary.empty() && std::rename(fTemporary.c_str(), fPath.c_str()) != 0)
+    if (fTemporary.empty())
+        return;
+    ThrowIfInterrupted();
+    if (std::rename(fTemporary.c_str(), fTarget.c_str()) != 0)
         Fail();
     fTemporary.clear();
+    FlushDirectory(fTarget);
+}
+
+/// The contents go to the disk ahead of the name: after a loss of power it must not be that of an empty file.
+void OutputFile::Secure(int descriptor) const
+{
+    GiveMode(descriptor, fTarget);
+    if (fsync(descriptor) != 0 && errno != EINVAL) // which a file system says that has nothing to flush
+        Fail();
 }
 
 void OutputFile::Fail() const

@@ -11,9 +11,11 @@ struct PipeClosed
 {
 };
 
-/// A file that is written as a whole or not at all: until Commit() it has another name in the same directory, and is
-/// removed if it doesn't come to that. What isn't a regular file, such as a device or standard output, is written as it
-/// stands. All operations throw a Failure if the system refuses.
+/// A file that is written as a whole or not at all: until Commit() it has another name in the same directory and is
+/// its owner's alone, and it is removed if it doesn't come to that. A link stays one, and the file that it leads to is
+/// replaced. What isn't a regular file is written as it stands: a device, a pipe, and a descriptor of the process such
+/// as /dev/stdout, whatever that leads to. All operations throw a Failure if the system refuses, also for a file that
+/// may not be written.
 class OutputFile
 {
 public:
@@ -25,7 +27,9 @@ public:
 
     void Write(std::string_view text);
 
-    /// Everything has been written: gives the file its name, in place of one that has it.
+    /// Everything has been written: flushes the file to the disk and gives it its name, in place of one that has it.
+    /// It takes over the mode of the latter, with owner and group where the system allows; a new one gets what the
+    /// umask leaves. \throw Interrupted, and nothing is replaced, after a signal that asks for the end.
     void Commit();
 
 private:
@@ -34,10 +38,12 @@ private:
         void operator()(std::FILE* file) const;
     };
 
-    void OpenTemporary();
+    void OpenTemporary(const std::string& target);
+    void Secure(int descriptor) const;
     [[noreturn]] void Fail() const;
 
-    std::string fPath;
+    std::string fPath;      ///< as it was asked for, for messages
+    std::string fTarget;    ///< what the links lead to; empty if no file is replaced
     std::string fTemporary; ///< the name for the time being; empty if there is no need of one
     std::unique_ptr<std::FILE, Closer> fFile;
 };
