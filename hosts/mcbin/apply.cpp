@@ -4,6 +4,7 @@
 #include "csvoutput.h"
 #include "failure.h"
 #include "figures.h"
+#include "interrupt.h"
 #include "jsoninput.h"
 #include "options.h"
 #include "outputfile.h"
@@ -165,5 +166,6 @@ void ApplyBins(const ApplyOptions& options, Progress& progress)
         progress.CountRow();
         output.Write(writer.MakeLine(*row));
     }
+    ThrowIfInterrupted(); // the signal may have ended what writes the table, and come a moment later
     output.Commit();
 }

@@ -51,8 +51,6 @@ void PrintTitle(std::ostream& os, const Findings& findings)
     if (findings.records)
         os << ' ' << *findings.records << " records.";
     os << " Made by " << EscapeHtml(findings.componentVersion) << ".</p>\n";
-    if (findings.status.GetErrorCode() == MCBinning::BINStatusCancelled)
-        os << "<p><strong>The run was interrupted: this is what was found up to then.</strong></p>\n";
 }
 
 void PrintOverviewRow(std::ostream& os, const Findings& findings, const Result& result, std::size_t rank)

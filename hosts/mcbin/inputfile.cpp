@@ -86,7 +86,12 @@ std::size_t InputFile::Read(char* buffer, std::size_t size)
     {
         read += std::fread(buffer + read, 1, size - read, fFile.get());
         if (!std::ferror(fFile.get()))
+        {
+            // A Ctrl-C ends the program that writes into a pipe, too, and then what has come isn't all there was.
+            if (read < size)
+                ThrowIfInterrupted();
             return read;
+        }
         if (errno != EINTR)
             throw MakeFailure(fName);
         ThrowIfInterrupted();

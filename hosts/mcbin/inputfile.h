@@ -19,7 +19,8 @@ public:
     /// for the system's. Only to be called before anything is read.
     void MakeRewindable(const std::string& directory);
 
-    /// Fills `buffer` unless the file ends before, and gives the number of bytes.
+    /// Fills `buffer` unless the file ends before, and gives the number of bytes. \throw Interrupted if the file ends
+    /// after a signal that asks for the end: the signal may be what has cut it short.
     std::size_t Read(char* buffer, std::size_t size);
 
     /// Only to be called after MakeRewindable().

@@ -14,6 +14,7 @@
 #include "tableoutput.h"
 #include "tablereader.h"
 #include "terminal.h"
+#include "text.h"
 
 #include <algorithm>
 #include <clocale>
@@ -54,6 +55,12 @@ std::string Print(const Findings& findings, Format format)
     return os.str();
 }
 
+/// All that is said on standard error, in one line each, goes through here: it quotes names and texts of the data.
+void Tell(const std::string& words)
+{
+    std::cerr << "mcbin: " << Printable(words) << '\n';
+}
+
 void WriteOut(const std::string& text)
 {
     OutputFile output("-");
@@ -61,23 +68,39 @@ void WriteOut(const std::string& text)
     output.Commit();
 }
 
+/// Writes the page unless a signal has asked for the end: the page of a whole run is worth more than that of a part.
+/// \return what has gone wrong, for later: a full disk is no reason to lose the tables.
+std::exception_ptr WriteReport(OutputFile& report, const Findings& findings)
+{
+    try
+    {
+        ThrowIfInterrupted();
+        std::ostringstream page;
+        PrintHtml(page, findings);
+        report.Write(page.str());
+        report.Commit();
+    }
+    catch (const Failure&)
+    {
+        return std::current_exception();
+    }
+    catch (const Interrupted&)
+    {
+        Tell("interrupted; the report is not written");
+    }
+    return nullptr;
+}
+
+/// Behind a signal nothing is a success, even if the last record had been read.
 int GetExitCode(const Findings& findings, bool isStrict)
 {
-    if (findings.status.GetErrorCode() == MCBinning::BINStatusCancelled)
+    if (IsInterrupted())
     {
-        std::cerr << "mcbin: interrupted; these are the results up to then\n";
+        Tell("interrupted; these are the results up to then");
         return kInterrupted;
     }
     const auto isFlagged = [](const Result& result) { return !result.status.IsOK(); };
     return isStrict && std::any_of(findings.results.begin(), findings.results.end(), isFlagged) ? kFlagged : 0;
-}
-
-void WriteReport(OutputFile& report, const Findings& findings)
-{
-    std::ostringstream page;
-    PrintHtml(page, findings);
-    report.Write(page.str());
-    report.Commit();
 }
 
 int Bin(const BinOptions& options)
@@ -87,21 +110,12 @@ int Bin(const BinOptions& options)
     tableOptions.isReadTwice = true;
     tableOptions.spoolDirectory = options.settings.tempDirectory;
     TableReader table(tableOptions);
-    // A name that can't be written is found out before the work, and a full disk is no reason to lose the tables.
+    // A name that can't be written is found out before the work.
     std::optional<OutputFile> report;
     if (!options.output.report.empty())
         report.emplace(options.output.report);
     const Findings findings = FindBins(table, options, progress);
-    std::exception_ptr failure;
-    try
-    {
-        if (report)
-            WriteReport(*report, findings);
-    }
-    catch (const Failure&)
-    {
-        failure = std::current_exception();
-    }
+    const std::exception_ptr failure = report ? WriteReport(*report, findings) : nullptr;
     WriteOut(Print(findings, options.output.format));
     if (failure)
         std::rethrow_exception(failure);
@@ -125,7 +139,8 @@ int Run(int argc, char** argv)
     }
     catch (const CLI::ParseError& error)
     {
-        std::cerr << "mcbin: " << error.what() << "\nRun 'mcbin --help' for more information.\n";
+        Tell(error.what());
+        std::cerr << "Run 'mcbin --help' for more information.\n";
         return kUsage;
     }
     if (request.isManPage)
@@ -155,20 +170,20 @@ int main(int argc, char** argv)
     }
     catch (const Interrupted&)
     {
-        std::cerr << "mcbin: interrupted; there are no results yet\n";
+        Tell("interrupted; there are no results yet");
         return kInterrupted;
     }
     catch (const PipeClosed&)
     {
-        // Who closed it knows.
+        // The reader closed the pipe; there is nobody to tell.
     }
     catch (const std::bad_alloc&)
     {
-        std::cerr << "mcbin: out of memory\n";
+        Tell("out of memory");
     }
     catch (const std::exception& error)
     {
-        std::cerr << "mcbin: " << error.what() << '\n';
+        Tell(error.what());
     }
     return kFailure;
 }

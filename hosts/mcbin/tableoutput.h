@@ -16,7 +16,8 @@ struct Screen
 
 /// Prints the findings for a person to read: the attributes in the order of their gain, each with a row for each bin,
 /// then in a line each those that have no cut points, and the columns that were left out. Weights, borders and
-/// entropies are exact; gains, shares and what follows from shares are rounded.
+/// entropies are exact; gains, shares and what follows from shares are rounded. Texts of the data are printable, also
+/// where standard output is no terminal: a file of tables is shown on one later.
 void PrintTables(std::ostream& os, const Findings& findings, const Screen& screen);
 
 #endif

@@ -5,6 +5,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <cstdint>
 
 #include <fnmatch.h>
 
@@ -15,6 +16,20 @@ namespace
 bool IsControl(char32_t value)
 {
     return value < 0x20 || (value >= 0x7F && value < 0xA0);
+}
+
+/// What sets the direction of writing, so that a text can be shown as another one, and the ends of lines and paragraphs
+/// beyond Latin-1.
+bool IsFormat(char32_t value)
+{
+    return value == 0x061C || value == 0x200E || value == 0x200F || (value >= 0x2028 && value <= 0x202E) ||
+           (value >= 0x2066 && value <= 0x2069);
+}
+
+/// A byte that is no text, or a control character of ASCII, is "\x0a", any other character "\u202e".
+void AppendEscaped(std::string& text, const CodePoint& point)
+{
+    text += fmt::format(point.size > 1 ? "\\u{:04x}" : "\\x{:02x}", static_cast<std::uint32_t>(point.value));
 }
 
 std::string MakePadding(const std::string& text, std::size_t width)
@@ -32,10 +47,10 @@ std::string Printable(std::string_view text)
         const CodePoint point = GetFirst(text);
         const std::string_view bytes = text.substr(0, point.size);
         text.remove_prefix(point.size);
-        if (point.isValid && !IsControl(point.value))
+        if (point.isValid && !IsControl(point.value) && !IsFormat(point.value))
             printable += bytes;
         else
-            for (const char c : bytes) printable += fmt::format("\\x{:02x}", static_cast<unsigned char>(c));
+            AppendEscaped(printable, point);
     }
     return printable;
 }

@@ -6,8 +6,8 @@
 #include <string_view>
 #include <vector>
 
-/// Text of the data made fit for a terminal line: control characters, such as line ends, and bytes that are no UTF-8
-/// become escapes like "\x0a".
+/// Text of the data made fit for a terminal line: control characters, such as line ends, what sets the direction of
+/// writing, and bytes that are no UTF-8 become escapes like "\x0a" and "\u202e".
 std::string Printable(std::string_view text);
 
 /// The same in single quotes, for a message.

@@ -97,6 +97,7 @@ private:
 };
 
 using McbinFaults = Mcbin;
+using McbinFaultsOnTerminal = McbinOnTerminal;
 
 constexpr const char* kIris = "'" EXAMPLE_DATA "/iris.csv'";
 
@@ -203,7 +204,7 @@ TEST_F(McbinFaults, ADirectoryThatMayOnlyBeReadIsAFailureInWords)
     EXPECT_TRUE(std::filesystem::is_empty(locked));
 }
 
-TEST_F(McbinFaults, AFileThatChangesBetweenThePassesIsAFailureAndOneThatVanishesIsNot)
+TEST_F(McbinFaultsOnTerminal, AFileThatChangesBetweenThePassesIsAFailureAndOneThatVanishesIsNot)
 {
     const std::string data = MakeTable(200000, 6);
     const auto end = static_cast<std::streamoff>(data.size());
@@ -298,11 +299,13 @@ TEST_F(McbinFaults, ADamagedFileOfBinsIsRefusedInWordsThatNameIt)
     EXPECT_EQ("mcbin: none.json: No such file or directory\n", Run("apply none.json data.csv").err);
 }
 
-TEST_F(McbinFaults, CtrlCAmongTheAttributesPrintsWhatWasFound)
+TEST_F(McbinFaultsOnTerminal, CtrlCAmongTheAttributesPrintsWhatWasFound)
 {
     Write("data.csv", MakeTable(100000, 12));
+    Write("page.html", "former");
 
-    Terminal terminal(fData.Path(), fTemporary.Path(), "supervised data.csv --target y --format json >bins.json");
+    Terminal terminal(fData.Path(), fTemporary.Path(),
+                      "supervised data.csv --target y --format json --report page.html >bins.json");
     ASSERT_TRUE(terminal.WaitFor("binned 1 of 12: x0")) << terminal.GetText();
     terminal.PressCtrlC();
 
@@ -311,9 +314,11 @@ TEST_F(McbinFaults, CtrlCAmongTheAttributesPrintsWhatWasFound)
     const Outcome applied = Shell("head -n 3 data.csv | mcbin apply bins.json -");
     EXPECT_NE(std::string::npos, applied.out.find(",x0_bin")) << applied.err;
     EXPECT_EQ(std::string::npos, applied.out.find(",x11_bin"));
+    EXPECT_NE(std::string::npos, terminal.GetText().find("mcbin: interrupted; the report is not written"));
+    EXPECT_EQ("former", ReadFile(fData.File("page.html"))) << "the page of a whole run";
 }
 
-TEST_F(McbinFaults, CtrlCInAPassEndsItWithoutResults)
+TEST_F(McbinFaultsOnTerminal, CtrlCInAPassEndsItWithoutResults)
 {
     Write("data.csv", MakeTable(200000, 6));
 
@@ -328,7 +333,7 @@ TEST_F(McbinFaults, CtrlCInAPassEndsItWithoutResults)
     }
 }
 
-TEST_F(McbinFaults, CtrlCWhileBinsAreAppliedLeavesTheFormerFile)
+TEST_F(McbinFaultsOnTerminal, CtrlCWhileBinsAreAppliedLeavesTheFormerFile)
 {
     Write("data.csv", MakeTable(200000, 6));
     Run("supervised data.csv --target y --format json >bins.json");

@@ -18,10 +18,14 @@ std::string MakeTable(int rows)
     return data;
 }
 
-class McbinKilled : public Mcbin
+class McbinKilled : public McbinOnTerminal
 {
 protected:
-    void SetUp() override { Write("data.csv", MakeTable(200000)); }
+    void SetUp() override
+    {
+        McbinOnTerminal::SetUp();
+        Write("data.csv", MakeTable(200000));
+    }
 
     /// What is left is the subject here.
     void TearDown() override {}

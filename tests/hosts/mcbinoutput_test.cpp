@@ -34,6 +34,7 @@ std::string CollectNumbers(const std::string& page)
 }
 
 using McbinOutput = Mcbin;
+using McbinOutputOnTerminal = McbinOnTerminal;
 
 } // namespace
 
@@ -182,7 +183,7 @@ TEST_F(McbinOutput, HelpAndManualPageHaveTheSameTexts)
     EXPECT_EQ(0u, Run("--version").out.find("mcbin "));
 }
 
-TEST_F(McbinOutput, OnATerminalTablesAreColouredUnlessThatIsUnwanted)
+TEST_F(McbinOutputOnTerminal, OnATerminalTablesAreColouredUnlessThatIsUnwanted)
 {
     const std::string run = "supervised '" EXAMPLE_DATA "/iris.csv' --target species";
 
@@ -199,7 +200,7 @@ TEST_F(McbinOutput, OnATerminalTablesAreColouredUnlessThatIsUnwanted)
     }
 }
 
-TEST_F(McbinOutput, TablesFitTheTerminalAndStandStraightWithWideCharacters)
+TEST_F(McbinOutputOnTerminal, TablesFitTheTerminalAndStandStraightWithWideCharacters)
 {
     const char* const places[] = {"東京", "大阪", "emoji😀", "e\u0301te\u0301", "a very long name of a category"};
     std::string data = "値,place,ja\n";

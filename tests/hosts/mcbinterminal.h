@@ -1,11 +1,15 @@
 #ifndef MCOBNQRT_TESTS_MCBINTERMINAL_H
 #define MCOBNQRT_TESTS_MCBINTERMINAL_H
 
+#include "hosts/mcbinrun.h"
+
 #include <gtest/gtest.h>
 
 #include <array>
+#include <cerrno>
 #include <csignal>
 #include <cstdlib>
+#include <cstring>
 #include <string>
 
 #include <pty.h>
@@ -79,6 +83,21 @@ private:
     int fMaster = -1;
     pid_t fProcess = -1;
     std::string fText;
+};
+
+/// For tests that need a Terminal.
+class McbinOnTerminal : public Mcbin
+{
+protected:
+    void SetUp() override
+    {
+        int master = -1;
+        int slave = -1;
+        if (openpty(&master, &slave, nullptr, nullptr, nullptr) != 0)
+            GTEST_SKIP() << "this test needs a pseudo-terminal, and the system gives none: " << std::strerror(errno);
+        close(master);
+        close(slave);
+    }
 };
 
 #endif
