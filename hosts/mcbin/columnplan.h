@@ -36,11 +36,19 @@ struct Column
     bool isBelieved = false;                       ///< to hold numbers alone, by its first rows
     long nNumbers = 0;                             ///< fields that are numbers, of those looked at
     long nTexts = 0;                               ///< fields that are something else
-    std::string firstText;                         ///< the first of the latter
-    long firstTextLine = 0;                        ///< and its line
+    long nOrnamented = 0;                          ///< of the latter: numbers with signs such as $ around or in them
+    std::string firstOrnamented;                   ///< the first of these
+    std::string firstText;                         ///< the first of nTexts, or the category that is one too many
+    long firstTextLine = 0;                        ///< its line
     std::set<std::string, std::less<>> categories; ///< the different fields, if it may be categorical
 
     bool IsUsed() const { return isAttribute || isTarget || isWeight; }
+
+    /// Whether it holds text, as at least half of its fields do, and wasn't said to hold anything else.
+    bool IsText() const { return kind == ColumnKind::kUnknown && nTexts > 0 && nTexts >= nNumbers; }
+
+    /// Whether its texts are numbers for the most part, written with signs that this tool doesn't read.
+    bool IsOrnamented() const { return nOrnamented > nTexts / 2; }
 };
 
 /// All columns of a table in their order, and what is to be done with them.

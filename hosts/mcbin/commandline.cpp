@@ -2,17 +2,22 @@
 
 #include "delimiter.h"
 #include "numbers.h"
+#include "text.h"
 
 #include <mcobnqrt/binfactory.h>
 #include <mcobnqrt/binsettings.h>
 #include <mcobnqrt/binvarlist.h>
 #include <mcobnqrt/ibinalgorithm.h>
 
+#include <algorithm>
 #include <limits>
 #include <map>
 #include <memory>
+#include <numeric>
 #include <optional>
 #include <string>
+#include <utility>
+#include <vector>
 
 namespace
 {
@@ -30,7 +35,11 @@ constexpr const char* kSupervisedExamples = R"(Examples:
   mcbin supervised iris.csv --target species
   mcbin supervised people.csv --target income --weight weight --missing-text '?' --report people.html
   mcbin supervised loans.csv --target default --format json > bins.json
-  mcbin supervised survey.csv --pairs 'age:bought,income:bought,age:returned' --missing age=-9:-1)";
+  mcbin supervised survey.csv --pairs 'age:bought,income:bought,age:returned' --missing age=-9:-1
+
+A numeric target is cut into bins, whose numbers are its categories then:
+  mcbin equal-frequency cars.csv --attributes price --bins 4 --format json > price.json
+  mcbin apply price.json cars.csv | mcbin supervised - --target price_bin --exclude price)";
 
 constexpr const char* kEqualFrequencyExamples = R"(Examples:
   mcbin equal-frequency iris.csv --bins 4
@@ -46,7 +55,7 @@ constexpr const char* kExitCodes = R"(Exit codes:
   1    failure: a file, a row or the data cannot be used, or the output cannot be written
   2    the command line is wrong
   3    with --strict: done, but an attribute carries a warning or an error
-  130  interrupted; what was found before that has been printed)";
+  130  interrupted; what was found before that has been printed, and no file is written)";
 
 CLI::Validator MakeDelimiterCheck()
 {
@@ -138,9 +147,10 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
         ->check(CLI::IsMember({"truncate", "closest"}))
         ->option_text("truncate|closest")
         ->group("Columns");
-    AddRepeated(command, "--categorical", columns.categorical,
-                "Columns of categories, also if they are numbers; an attribute's are binned in sorted order",
-                "NAME,...")
+    AddRepeated(
+        command, "--categorical", columns.categorical,
+        "Columns of categories, at most 256, also if they are numbers; an attribute's are binned in sorted order",
+        "NAME,...")
         ->group("Columns");
     AddRepeated(command, "--continuous", columns.continuous,
                 "Columns of numbers, also if most fields are something else", "NAME,...")
@@ -182,7 +192,8 @@ void AddOutput(CLI::App& command, OutputOptions& output)
                     {"table", Format::kTable}, {"json", Format::kJson}, {"csv", Format::kCsv}, {"sql", Format::kSql}};
                 output.format = formats.at(name);
             },
-            "table: to read (the default). json: everything, for apply and other programs. csv: a row for each bin. "
+            "table: to read (the default), with control characters of the data as \\x0a. json: everything, for apply "
+            "and other programs. csv: a row for each bin. "
             "sql: a CASE expression for each attribute")
         ->check(CLI::IsMember({"table", "json", "csv", "sql"}))
         ->option_text("FORMAT")
@@ -204,7 +215,11 @@ void AddSupervised(CLI::App& app, Request& request)
         "supervised", "Cut the columns of numbers where they separate the categories of a target best");
     AddTable(command, request.bin.table);
     CLI::Option* const target =
-        command.add_option("--target", request.bin.columns.target, "The column whose categories are to be separated")
+        command
+            .add_option(
+                "--target", request.bin.columns.target,
+                "The column whose categories are to be separated, from 2 to 256; a column of numbers is cut into "
+                "bins first, as the last example shows")
             ->check(MakeNameCheck())
             ->option_text("NAME")
             ->group("Columns");
@@ -295,6 +310,31 @@ void AddApply(CLI::App& app, Request& request)
     command.callback([&request] { request.command = Request::Command::kApply; });
 }
 
+/// How many letters must be put in, taken out or replaced to make one word of the other.
+std::size_t GetDistance(const std::string& left, const std::string& right)
+{
+    std::vector<std::size_t> row(right.size() + 1); // by end of right: the distance from left up to letter i
+    std::iota(row.begin(), row.end(), std::size_t(0));
+    for (std::size_t i = 0; i < left.size(); ++i)
+    {
+        std::size_t diagonal = std::exchange(row[0], i + 1);
+        for (std::size_t j = 0; j < right.size(); ++j)
+        {
+            const std::size_t replaced = diagonal + (left[i] == right[j] ? 0 : 1);
+            diagonal = row[j + 1];
+            row[j + 1] = std::min({replaced, row[j] + 1, row[j + 1] + 1});
+        }
+    }
+    return row.back();
+}
+
+/// Whether the word is the beginning of the name, or is mistyped in no more than every third letter of it.
+bool IsNear(const std::string& word, const std::string& name)
+{
+    const bool isBeginning = !word.empty() && name.compare(0, word.size(), word) == 0;
+    return isBeginning || GetDistance(word, name) <= std::max<std::size_t>(2, name.size() / 3);
+}
+
 /// The version of the tool, which is the library's.
 std::string GetVersion()
 {
@@ -325,4 +365,20 @@ std::unique_ptr<CLI::App> MakeCommandLine(Request& request)
                 throw CLI::RequiredError("A command");
         });
     return app;
+}
+
+void ThrowUnlessCommand(const CLI::App& app, int argc, const char* const* argv)
+{
+    const std::string word = argc > 1 ? argv[1] : "-";
+    if (!word.empty() && word.front() == '-')
+        return;
+    std::vector<std::string> names;
+    for (const CLI::App* const command : app.get_subcommands([](const CLI::App*) { return true; }))
+        names.push_back(command->get_name());
+    if (std::find(names.begin(), names.end(), word) != names.end())
+        return;
+    const auto near =
+        std::find_if(names.begin(), names.end(), [&](const std::string& name) { return IsNear(word, name); });
+    const std::string advice = near == names.end() ? "there are " + Join(names, ", ") : "did you mean '" + *near + "'?";
+    throw CLI::ParseError("no such command: " + Quote(word) + "; " + advice, CLI::ExitCodes::InvalidError);
 }

@@ -27,4 +27,8 @@ struct Request
 /// The options, commands and help texts of the tool; parsing fills `request`, which must outlive the result.
 std::unique_ptr<CLI::App> MakeCommandLine(Request& request);
 
+/// \throw CLI::ParseError if the first argument is neither an option nor the name of a command. It tells which command may
+/// be meant, or else which there are.
+void ThrowUnlessCommand(const CLI::App& app, int argc, const char* const* argv);
+
 #endif

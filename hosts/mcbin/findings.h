@@ -81,6 +81,7 @@ struct Findings
     MCBinning::MCStatus status;
     std::vector<Result> results;
     std::vector<std::string> leftOut; ///< columns of text, with an example each; not part of the JSON form
+    std::vector<std::string> notes;   ///< for the user, beside the results; not part of the JSON form either
 
     const Variable& GetAttribute(const Result& result) const
     {

@@ -117,6 +117,7 @@ int Bin(const BinOptions& options)
     const Findings findings = FindBins(table, options, progress);
     const std::exception_ptr failure = report ? WriteReport(*report, findings) : nullptr;
     WriteOut(Print(findings, options.output.format));
+    for (const std::string& note : findings.notes) Tell(note);
     if (failure)
         std::rethrow_exception(failure);
     return GetExitCode(findings, options.output.isStrict);
@@ -128,6 +129,7 @@ int Run(int argc, char** argv)
     const std::unique_ptr<CLI::App> app = MakeCommandLine(request);
     try
     {
+        ThrowUnlessCommand(*app, argc, argv);
         app->parse(argc, argv);
     }
     catch (const CLI::Success& help)

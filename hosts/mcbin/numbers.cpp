@@ -47,6 +47,21 @@ double ParseNumberOrNaN(std::string_view text)
     return isNumber ? value : ParseUnusualNumber(text);
 }
 
+std::string FindOrnaments(std::string_view text)
+{
+    constexpr std::string_view kOrnaments = ",$%";
+    if (text.find_first_of(kOrnaments) == std::string_view::npos)
+        return "";
+    std::string number;
+    std::string found;
+    for (const char c : text)
+        if (kOrnaments.find(c) == std::string_view::npos)
+            number += c;
+        else if (found.find(c) == std::string::npos)
+            found += c;
+    return ParseNumber(number) ? found : "";
+}
+
 std::string FormatNumber(double value)
 {
     // Left to itself, to_chars writes 100000 as 1e+05, being the shorter one by a character.

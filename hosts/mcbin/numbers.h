@@ -14,6 +14,13 @@ std::optional<double> ParseNumber(std::string_view text);
 /// whole, for which the processor waits half as long as it takes to read the number.
 double ParseNumberOrNaN(std::string_view text);
 
+/// What keeps the text from being a number: those of the comma, $ and % that it has, each once, if it is a number
+/// without them, such as "$," of "$1,234.50". Otherwise empty.
+std::string FindOrnaments(std::string_view text);
+
+/// For a message about such numbers.
+constexpr const char* kPlainNumbers = "numbers are written as in 1234.5, without commas, $ and %";
+
 /// The number in as few digits as read back to the same double. Infinities are "inf" and "-inf".
 std::string FormatNumber(double value);
 

@@ -31,7 +31,7 @@ TableRecordSource::TableRecordSource(TableReader& table, const ColumnPlan& plan,
 {
     for (std::size_t i = 0; i < variables.columns.size(); ++i)
         fFields.push_back({variables.columns[i], &plan.columns[variables.columns[i]],
-                           FindEncoder(variables.list, static_cast<int>(i))});
+                           FindEncoder(variables.list, static_cast<int>(i)), MergeWatch()});
     fTable.Rewind();
 }
 
@@ -58,7 +58,7 @@ const MCCommon::Record* TableRecordSource::Next()
     return &fRecord;
 }
 
-double TableRecordSource::Convert(const Field& field, std::string_view text)
+double TableRecordSource::Convert(Field& field, std::string_view text)
 {
     if (fPlan.IsMissing(*field.column, text))
         return MCMV::gMissingValue;
@@ -66,7 +66,11 @@ double TableRecordSource::Convert(const Field& field, std::string_view text)
         return ConvertCategory(field, text);
     const double number = ParseNumberOrNaN(text);
     if (!std::isnan(number))
+    {
+        field.merges.Look(text, number);
+        fNumWeighted += field.column->isWeight && number > 0.0 ? 1 : 0;
         return number;
+    }
     if (field.column->isBelieved)
         throw NotOnlyNumbers();
     if (!fPlan.isBadMissing)

@@ -1,6 +1,8 @@
 #ifndef MCBIN_RECORDSOURCE_H
 #define MCBIN_RECORDSOURCE_H
 
+#include "mergewatch.h"
+
 #include <mcobnqrt/ibinrecordsource.h>
 #include <mcobnqrt/mccommon.h>
 
@@ -32,15 +34,22 @@ public:
     /// Null at the end. It is the same record each time.
     const MCCommon::Record* Next() override;
 
+    /// How many of the records handed out have a weight above 0, before it is rounded.
+    long CountWeighted() const { return fNumWeighted; }
+
+    /// By variable index: whether different whole numbers have become one.
+    const MergeWatch& GetMergeWatch(std::size_t index) const { return fFields[index].merges; }
+
 private:
     struct Field
     {
         std::size_t place;               ///< of the column in the table
         const Column* column;            ///< the same
         const BINStringEncoder* encoder; ///< null for a number
+        MergeWatch merges;
     };
 
-    double Convert(const Field& field, std::string_view text);
+    double Convert(Field& field, std::string_view text);
     double ConvertCategory(const Field& field, std::string_view text);
 
     TableReader& fTable;
@@ -49,6 +58,7 @@ private:
     std::vector<Field> fFields;   ///< by variable index
     const CsvRow* fRow = nullptr; ///< what HasNext() has found for Next(); null if it hasn't looked
     long fRowsLeft;               ///< how many more rows there should be
+    long fNumWeighted = 0;
     MCCommon::Record fRecord;
     std::string fCategory; ///< kept for its memory
 };

@@ -4,6 +4,7 @@
 #include "columnplan.h"
 #include "failure.h"
 #include "interrupt.h"
+#include "notes.h"
 #include "progress.h"
 #include "recordsource.h"
 #include "statuswords.h"
@@ -118,6 +119,7 @@ Findings FindBins(TableReader& table, const BinOptions& options, Progress& progr
     else
         RunEqualFrequency(findings, variables, source, options.settings, progress);
     progress.Erase();
+    findings.notes = MakeNotes(findings, plan, variables, source);
     return findings;
 }
 

@@ -1,5 +1,6 @@
 #include "tableprofile.h"
 
+#include "columnfaults.h"
 #include "columnplan.h"
 #include "numbers.h"
 #include "progress.h"
@@ -7,13 +8,12 @@
 #include "text.h"
 #include "utf8.h"
 
+#include <fmt/format.h>
+
 #include <string_view>
 
 namespace
 {
-
-/// A run takes the codes from 0 to 255.
-constexpr std::size_t kMostCategories = 256;
 
 void ProfileNumber(Column& column, std::string_view field, long line, Care care)
 {
@@ -29,21 +29,28 @@ void ProfileNumber(Column& column, std::string_view field, long line, Care care)
         column.firstText = field;
         column.firstTextLine = line;
     }
+    if (!FindOrnaments(field).empty() && column.nOrnamented++ == 0)
+        column.firstOrnamented = field;
 }
 
 void ProfileCategory(const TableReader& table, Column& column, std::size_t place, std::string_view field, long line)
 {
-    if (column.categories.find(field) != column.categories.end())
+    if (column.categories.find(field) != column.categories.end() || column.categories.size() > kMostCategories)
         return;
     if (!IsText(field))
         throw table.MakeFailure(
             line, place, Quote(Shorten(field)) + " is not UTF-8 text; convert the file first, for instance with iconv");
     column.categories.emplace(field);
-    if (column.categories.size() > kMostCategories)
+    if (column.categories.size() <= kMostCategories)
+        return;
+    // Nothing can be done without the target. Of the others all are to be told together.
+    if (column.isTarget)
         throw table.MakeFailure(line, place,
-                                "more than " + std::to_string(kMostCategories) +
-                                    " categories, which are too many for a " +
-                                    (column.isTarget ? "target" : "categorical attribute"));
+                                fmt::format("more than {} categories, which are too many for a target; how a column of "
+                                            "numbers becomes one is told by 'mcbin supervised --help'",
+                                            kMostCategories));
+    column.firstText = field;
+    column.firstTextLine = line;
 }
 
 void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t place, std::string_view field, long line,
@@ -58,20 +65,12 @@ void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t place,
         ProfileNumber(column, field, line, care);
 }
 
-void SettleKind(const TableReader& table, const ColumnPlan& plan, std::size_t place, Column& column)
+/// Of a column that has no fault.
+void SettleKind(Column& column)
 {
-    if (column.kind == ColumnKind::kCategorical)
-        return;
-    const bool isText = column.kind == ColumnKind::kUnknown && column.nTexts > 0 && column.nTexts >= column.nNumbers;
-    if (isText && column.isNamed)
-        throw table.MakeFailure(column.firstTextLine, place,
-                                "holds text, such as " + Quote(Shorten(column.firstText)) +
-                                    "; with --categorical its categories are binned in sorted order");
-    if (isText)
+    if (column.IsText())
         column.isAttribute = false;
-    else if (column.nTexts > 0 && !plan.isBadMissing)
-        throw table.MakeNotANumber(column.firstTextLine, place, column.firstText);
-    else
+    else if (column.kind == ColumnKind::kUnknown)
         column.kind = ColumnKind::kContinuous;
 }
 
@@ -88,7 +87,8 @@ void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care
     }
     if (plan.nRows == 0)
         throw table.MakeFailure("there is no row below the header");
-    for (std::size_t i = 0; i < plan.columns.size(); ++i)
-        if (plan.columns[i].IsUsed())
-            SettleKind(table, plan, i, plan.columns[i]);
+    ThrowIfFaulty(table, plan);
+    for (Column& column : plan.columns)
+        if (column.IsUsed())
+            SettleKind(column);
 }

@@ -87,12 +87,13 @@ Failure TableReader::MakeFailure(long line, std::size_t column, const std::strin
 
 Failure TableReader::MakeNotANumber(long line, std::size_t column, std::string_view field) const
 {
-    std::string withoutCommas(field);
-    withoutCommas.erase(std::remove(withoutCommas.begin(), withoutCommas.end(), ','), withoutCommas.end());
-    const bool hasCommas = withoutCommas.size() < field.size() && ParseNumber(withoutCommas);
-    return MakeFailure(line, column,
-                       Quote(Shorten(field)) +
-                           (hasCommas ? " is not a number: it has a comma, and numbers are written as in 1234.5"
-                                      : " is not a number; if it stands for a missing value, say so with "
-                                        "--missing-text, and with --bad missing for all such fields"));
+    std::vector<std::string> ornaments;
+    for (const char c : FindOrnaments(field)) ornaments.push_back(c == ',' ? "a comma" : "a " + std::string(1, c));
+    return MakeFailure(
+        line, column,
+        Quote(Shorten(field)) +
+            (ornaments.empty()
+                 ? " is not a number; if it stands for a missing value, say so with --missing-text, and "
+                   "with --bad missing for all such fields"
+                 : " is not a number: it has " + Join(ornaments, " and ") + ", and numbers are written as in 1234.5"));
 }

@@ -2,8 +2,10 @@
 
 #include "columnplan.h"
 #include "failure.h"
+#include "numbers.h"
 #include "text.h"
 
+#include <algorithm>
 #include <string>
 
 namespace
@@ -78,8 +80,11 @@ Variables MakeVariables(const ColumnPlan& plan, IBINVariable::BINWRoundingOption
     if (!hasAttribute)
     {
         const std::vector<std::string> leftOut = plan.DescribeLeftOut();
+        const auto isOrnamented = [](const Column& column) { return column.IsOrnamented(); };
+        const bool isAny = std::any_of(plan.columns.begin(), plan.columns.end(), isOrnamented);
         throw Failure("there is nothing to bin: no column that could be an attribute has numbers" +
-                      (leftOut.empty() ? "" : "; they hold text: " + Join(leftOut, ", ")));
+                      (leftOut.empty() ? "" : "; they hold text: " + Join(leftOut, ", ")) +
+                      (isAny ? std::string("; ") + kPlainNumbers : ""));
     }
     AddPairs(variables, plan, variableOfColumn);
     return variables;

@@ -161,9 +161,10 @@ TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
         {"\xFF\xFEx", ": the file is UTF-16; make it UTF-8 first, as by iconv -f UTF-16 -t UTF-8"},
         {"x;y\n1;a\n2,5;b\n3;b\n",
          ", line 3: column 'x': '2,5' is not a number: it has a comma, and numbers are written "
-         "as in 1234.5"},
+         "as in 1234.5; --exclude leaves the column out, and --categorical bins its fields as categories"},
         {"x,y\n1,a\n2,b\nmany,a\n", ", line 4: column 'x': 'many' is not a number; if it stands for a missing value, "
-                                    "say so with --missing-text, and with --bad missing for all such fields"},
+                                    "say so with --missing-text, and with --bad missing for all such fields; "
+                                    "--exclude leaves the column out, and --categorical bins its fields as categories"},
     };
     for (const Case& c : cases)
     {
@@ -195,7 +196,7 @@ TEST_F(McbinInput, NumbersAreThoseOfADoubleWithADecimalPoint)
     }
     EXPECT_EQ(
         "mcbin: there is nothing to bin: no column that could be an attribute has numbers; they hold text: x ('1,5' in "
-        "line 2)\n",
+        "line 2); numbers are written as in 1234.5, without commas, $ and %\n",
         RunOn("x;y\n1,5;a\n2,5;b\n", "supervised", "--target y").err);
 }
 
@@ -234,7 +235,8 @@ TEST_F(McbinInput, ATargetHasFrom2To256Categories)
     for (int i = 1; i <= 256; ++i) data += std::to_string(i) + "," + std::to_string(i) + "\n";
 
     EXPECT_EQ(0, RunOn(data, "supervised", "--target y").exitCode);
-    EXPECT_EQ("mcbin: data.csv, line 258: column 'y': more than 256 categories, which are too many for a target\n",
+    EXPECT_EQ("mcbin: data.csv, line 258: column 'y': more than 256 categories, which are too many for a target; how a "
+              "column of numbers becomes one is told by 'mcbin supervised --help'\n",
               RunOn(data + "1,257\n", "supervised", "--target y").err);
     EXPECT_EQ("mcbin: column 'y' has a single category, '3'; a target needs at least 2\n",
               RunOn("x,y\n1,3\n2,\n", "supervised", "--target y").err);
