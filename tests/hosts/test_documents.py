@@ -53,3 +53,9 @@ def test_the_readme_shows_what_quickstart_prints(shell):
     assert command in (ROOT / "quickstart").read_text(encoding="utf-8").replace("$mcbin", "mcbin")
     assert shell(command).splitlines() == shown
     assert page.startswith("The same as a page")
+
+
+def test_the_tests_that_hold_a_promise_are_there():
+    named = re.findall(r"`(tests(?:/[\w.]+)+|test)`", (ROOT / "SECURITY.md").read_text(encoding="utf-8"))
+
+    assert len(named) > 20 and [path for path in named if not (ROOT / path).exists()] == []
