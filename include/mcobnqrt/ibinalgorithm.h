@@ -26,7 +26,9 @@ public:
     IBINAlgorithm(const IBINAlgorithm&) = default;
     IBINAlgorithm& operator=(const IBINAlgorithm&) = default;
 
-    /// Removes the temporary files. What GetOutput() and GetSettings() gave dangles afterwards.
+    /// Removes the temporary files, if this is the process that made them: a child process that fork() made may delete
+    /// its copy of the object, and the files stay the parent's. No other operation is for the child, as both would read
+    /// through the same open files. What GetOutput() and GetSettings() gave dangles afterwards.
     virtual ~IBINAlgorithm() = default;
 
     /// The name of the component and the version of the library, for the host's reports.
@@ -51,12 +53,18 @@ public:
     /// The listener and the cancel query are called from here. An exception of theirs, of the source, or of an
     /// allocation passes through; if it ended the reading of the source, the object has no data and later calls say so.
     ///
-    /// \return OK; the warning BINStatusSomeResultsFlagged if a result of this or an earlier call carries a status of
-    ///         its own, to be read there; BINStatusCancelled, with the results found so far kept; or the error that
-    ///         stopped the call before a result was made: BINStatusBadNumberOfBins, BINStatusNoValidPairs,
-    ///         BINStatusNoRecords (no record, none of positive weight, or no source), BINStatusTargetUnusable,
-    ///         BINStatusTooManyCategories, BINStatusTempDirNotFound, BINStatusCannotOpenTempFile, BINStatusOutOfMemory.
-    ///         A call after a failed reading of the source gives that failure again.
+    /// They and the source may call operations of this object, Run too, but they must not delete it. Such an inner call
+    /// works as any other and adds its results in between. While the records are being read there are no data yet, and
+    /// it gives BINStatusNoRecords. The outer call goes on with the number of bins and with what its lists held when
+    /// it began. A cancel query that calls Run is asked by that call, too.
+    ///
+    /// \return OK; the warning BINStatusSomeResultsFlagged if a pair that this or an earlier call has binned, or tried
+    ///         to, carries a status of its own, to be read in its result; BINStatusCancelled, with the results found so
+    ///         far kept; or the error that stopped the call before a result was made: BINStatusBadNumberOfBins,
+    ///         BINStatusNoValidPairs, BINStatusNoRecords (no record, none of positive weight, none ahead of a cancel, or
+    ///         no source), BINStatusTargetUnusable, BINStatusTooManyCategories, BINStatusTempDirNotFound,
+    ///         BINStatusCannotOpenTempFile, BINStatusOutOfMemory. An entry that is refused for its indices or roles
+    ///         raises no warning here. A call after a failed reading of the source gives that failure again.
     virtual MCBinning::MCStatus Run(IBINRecordSource* source, const std::vector<int>* attributes,
                                     const std::vector<int>* targets) = 0;
 

@@ -27,7 +27,9 @@ public:
     IEFBINAlgorithm(const IEFBINAlgorithm&) = default;
     IEFBINAlgorithm& operator=(const IEFBINAlgorithm&) = default;
 
-    /// Removes the temporary files. What GetOutput() and GetSettings() gave dangles afterwards.
+    /// Removes the temporary files, if this is the process that made them: a child process that fork() made may delete
+    /// its copy of the object, and the files stay the parent's. No other operation is for the child, as both would read
+    /// through the same open files. What GetOutput() and GetSettings() gave dangles afterwards.
     virtual ~IEFBINAlgorithm() = default;
 
     /// The name of the component and the version of the library, for the host's reports.
@@ -45,12 +47,19 @@ public:
     /// The listener and the cancel query are called from here. An exception of theirs, of the source, or of an
     /// allocation passes through; if it ended the reading of the source, the object has no data and later calls say so.
     ///
-    /// \return OK; the warning BINStatusSomeResultsFlagged if a result of this or an earlier call carries a status of
-    ///         its own, to be read there; BINStatusCancelled, with the results found so far kept; or the error that
-    ///         stopped the call before a result was made: BINStatusBadNumberOfBins, BINStatusBadAttributeIndex (no
-    ///         entry can be binned), BINStatusNoRecords (no record, none of positive weight, or no source),
-    ///         BINStatusTooManyCategories, BINStatusTempDirNotFound, BINStatusCannotOpenTempFile, BINStatusOutOfMemory.
-    ///         A call after a failed reading of the source gives that failure again.
+    /// They and the source may call operations of this object, Run too, but they must not delete it. Such an inner call
+    /// works as any other and adds its results in between. While the records are being read there are no data yet, and
+    /// it gives BINStatusNoRecords. The outer call goes on with the number of bins and with what its list held when
+    /// it began. A cancel query that calls Run is asked by that call, too.
+    ///
+    /// \return OK; the warning BINStatusSomeResultsFlagged if an attribute that this or an earlier call has binned, or
+    ///         tried to, carries a status of its own, to be read in its result; BINStatusCancelled, with the results
+    ///         found so far kept; or the error that stopped the call before a result was made:
+    ///         BINStatusBadNumberOfBins, BINStatusBadAttributeIndex (no entry can be binned), BINStatusNoRecords (no
+    ///         record, none of positive weight, none ahead of a cancel, or no source), BINStatusTooManyCategories,
+    ///         BINStatusTempDirNotFound, BINStatusCannotOpenTempFile, BINStatusOutOfMemory. An entry that is refused
+    ///         for its index or role raises no warning here. A call after a failed reading of the source gives that
+    ///         failure again.
     virtual MCBinning::MCStatus Run(IBINRecordSource* source, const std::vector<int>* attributes) = 0;
 
     /// Replaces the cancel query, which may be null and stays the host's. A cancel already seen stays seen.

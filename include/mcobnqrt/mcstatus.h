@@ -17,9 +17,11 @@ namespace MCBinning
 /// come from Run or a factory, unless a store is named.
 enum BINStatusCode : int
 {
-    /// The host cancelled. The results found before that are there and good.
+    /// The host cancelled. The results found before that are there and good. From Run, unless the cancel came ahead of
+    /// the first record: then BINStatusNoRecords.
     BINStatusCancelled = 1,
-    /// No memory for the algorithm, its record buffer or its table of values.
+    /// No memory for the algorithm, its record buffer or its table of values, or more than 4294967295 records with a
+    /// weight above 0.
     BINStatusOutOfMemory = 3,
     /// The temporary directory doesn't exist, or no file can be made in it.
     BINStatusTempDirNotFound = 120001,
@@ -30,7 +32,7 @@ enum BINStatusCode : int
     /// with a single category; else of one without a place in the analysis; else -1: no variable at all, or no
     /// attribute.
     BINStatusInvalidVarList = 120003,
-    /// There is no source, or it has no record, or none whose weight is above 0.
+    /// There is no source, or it has no record, or none whose weight is above 0, or none ahead of a cancel.
     BINStatusNoRecords = 120004,
     /// Of a result: a variable can't play the part it was listed for, being the weight, the target, or both of a pair.
     BINStatusRoleConflict = 120005,
@@ -61,7 +63,9 @@ enum BINStatusCode : int
     BINStatusSingleCategoryTarget = 120016,
     /// Of a result, warning: no cut separates the target's categories well enough; the result is one bin.
     BINStatusNoCutPoints = 120017,
-    /// Warning: the run is done, and a result of this or an earlier run carries a status of its own, to be read there.
+    /// Warning: the run is done, and the result of an attribute or pair that this or an earlier run has treated carries
+    /// a status of its own, to be read there. Entries of a list that were refused for their indices or roles don't
+    /// count.
     BINStatusSomeResultsFlagged = 120018,
     /// Of a result, warning: no equal-frequency cut point; the result is one bin. Discrete slot 0: the attribute's
     /// index.

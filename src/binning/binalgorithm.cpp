@@ -18,11 +18,12 @@ MCStatus BINAlgorithm::Run(IBINRecordSource* source, const std::vector<int>* att
 {
     // Unsigned: the -1 that nobody has replaced is a threshold that no attribute passes.
     const auto threshold = static_cast<unsigned int>(fSettings.GetNumDistinctValueThreshold());
-    fNumberOfBins = fSettings.GetNumberOfBins();
-    if (fNumberOfBins <= 0)
+    const int numberOfBins = fSettings.GetNumberOfBins();
+    if (numberOfBins <= 0)
         return MakeError(MCBinning::BINStatusBadNumberOfBins);
     const bool hasLists = attributes != nullptr || targets != nullptr;
-    if (hasLists && !CheckAttributeTargetPairs(attributes, targets))
+    const std::vector<Entry> entries = hasLists ? CheckAttributeTargetPairs(attributes, targets) : ListAll();
+    if (hasLists && !IsAnyOK(entries))
         return MakeError(MCBinning::BINStatusNoValidPairs);
     if (fCancelMonitor.IsCancelled())
         return CloseRun(MCStatus());
@@ -30,21 +31,40 @@ MCStatus BINAlgorithm::Run(IBINRecordSource* source, const std::vector<int>* att
     const MCStatus status = PrepareOnce(source, TupleKind::kWithTarget, threshold);
     if (status.IsError())
         return status;
-    return CloseRun(BinAllAttributes(attributes, targets));
+    if (!hasLists && !IsListTargetUsable())
+        return CloseRun(MakeError(MCBinning::BINStatusTargetUnusable));
+    return CloseRun(BinAllEntries(entries, numberOfBins));
 }
 
-/// Gives each entry its verdict. \return whether some entry can be binned.
-bool BINAlgorithm::CheckAttributeTargetPairs(const std::vector<int>* attributes, const std::vector<int>* targets)
+/// Every attribute against the list's target, if it has one.
+std::vector<BINAlgorithm::Entry> BINAlgorithm::ListAll() const
+{
+    std::vector<Entry> entries;
+    for (int attribute = 0; attribute < GetNumVariables(); ++attribute)
+    {
+        if (attribute != fTargetIndex && attribute != fWeightIndex)
+            entries.push_back({attribute, fTargetIndex, MCStatus()});
+    }
+    return entries;
+}
+
+/// Gives each entry of the host's lists its verdict. Empty for lists that don't belong together.
+std::vector<BINAlgorithm::Entry> BINAlgorithm::CheckAttributeTargetPairs(const std::vector<int>* attributes,
+                                                                         const std::vector<int>* targets) const
 {
     if (attributes == nullptr || (targets != nullptr && attributes->size() != targets->size()))
-        return false;
-    fPairStatus.clear();
-    for (std::size_t entry = 0; entry < attributes->size(); ++entry)
+        return {};
+    std::vector<Entry> entries;
+    entries.reserve(attributes->size());
+    for (std::size_t i = 0; i < attributes->size(); ++i)
     {
-        const int attribute = (*attributes)[entry];
-        fPairStatus.push_back(targets != nullptr ? CheckPair(attribute, (*targets)[entry]) : CheckAttribute(attribute));
+        const int attribute = (*attributes)[i];
+        if (targets != nullptr)
+            entries.push_back({attribute, (*targets)[i], CheckPair(attribute, (*targets)[i])});
+        else
+            entries.push_back({attribute, fTargetIndex, CheckAttribute(attribute)});
     }
-    return IsAnyOK(fPairStatus);
+    return entries;
 }
 
 MCStatus BINAlgorithm::CheckPair(int attribute, int target) const
@@ -67,63 +87,51 @@ MCStatus BINAlgorithm::CheckAttribute(int attribute) const
     return hasOtherRole ? MakeError(MCBinning::BINStatusRoleConflict) : MCStatus();
 }
 
-/// \return the status of the pair treated last, or BINStatusTargetUnusable if there was nothing to treat.
-MCStatus BINAlgorithm::BinAllAttributes(const std::vector<int>* attributes, const std::vector<int>* targets)
+bool BINAlgorithm::IsListTargetUsable() const
 {
-    BINEFPreProcess preProcess(fNumberOfBins, fRightBorderClosed);
-    const Lend lend(fPreProcess, preProcess);
+    bool isUsable = false;
+    return !fAttributeReader->IsVariableUsable(fTargetIndex, &isUsable).IsError() && isUsable;
+}
+
+/// \return the status of the pair treated last.
+MCStatus BINAlgorithm::BinAllEntries(const std::vector<Entry>& entries, int numberOfBins)
+{
+    const BINEFPreProcess preProcess(numberOfBins, fRightBorderClosed);
     AttributeReports reports(fSettings, fPlatform);
     MCStatus status;
-    const auto treat = [&](int attribute, int target)
+    for (const Entry& entry : entries)
     {
-        status = BinAttributeTargetPair(attribute, target);
-        reports.CountAttribute(attribute, status);
-    };
-
-    if (attributes == nullptr)
-    {
-        bool isUsable = false;
-        if (fAttributeReader->IsVariableUsable(fTargetIndex, &isUsable).IsError() || !isUsable)
-            return MakeError(MCBinning::BINStatusTargetUnusable);
-        for (int attribute = 0; attribute < GetNumVariables(); ++attribute)
+        if (entry.fVerdict.IsOK())
         {
-            if (attribute != fTargetIndex && attribute != fWeightIndex)
-                treat(attribute, fTargetIndex);
+            status = BinAttributeTargetPair(entry.fAttribute, entry.fTarget, preProcess);
+            reports.CountAttribute(entry.fAttribute, status);
         }
-        return status;
-    }
-    const std::vector<MCStatus> verdicts = fPairStatus; // a copy: a callback of the host may run the object again
-    for (std::size_t entry = 0; entry < attributes->size(); ++entry)
-    {
-        const int attribute = (*attributes)[entry];
-        const int target = targets != nullptr ? (*targets)[entry] : fTargetIndex;
-        if (verdicts[entry].IsOK())
-            treat(attribute, target);
         else
         {
             PairResult refused;
-            refused.fStatus = verdicts[entry];
-            Store(refused, attribute, target);
+            refused.fStatus = entry.fVerdict;
+            Store(refused, entry.fAttribute, entry.fTarget);
         }
     }
     return status;
 }
 
-MCStatus BINAlgorithm::BinAttributeTargetPair(int attribute, int target)
+MCStatus BINAlgorithm::BinAttributeTargetPair(int attribute, int target, const BINEFPreProcess& preProcess)
 {
     if (fCancelMonitor.IsCancelled())
         return CloseStep(MCStatus());
-    const PairResult result = BinCurrentPair(attribute, target);
+    const PairResult result = BinPair(attribute, target, preProcess);
     Store(result, attribute, target);
     return CloseStep(result.fStatus);
 }
 
 /// Loads a pair and bins it. Of the warnings the last one found stands: a target with one category hides all others.
-BINAlgorithm::PairResult BINAlgorithm::BinCurrentPair(int attribute, int target)
+BINAlgorithm::PairResult BINAlgorithm::BinPair(int attribute, int target, const BINEFPreProcess& preProcess)
 {
     PairResult result;
     result.fMinimum = result.fMaximum = result.fModelEntropy = gMissingValue;
-    result.fStatus = fAttributeReader->GetAttributeTargetData(attribute, target, &fTuples);
+    std::vector<BINSortTuple>* tuples = nullptr; // the reader's
+    result.fStatus = fAttributeReader->GetAttributeTargetData(attribute, target, &tuples);
     if (result.fStatus.IsError())
         return result;
 
@@ -140,7 +148,7 @@ BINAlgorithm::PairResult BINAlgorithm::BinCurrentPair(int attribute, int target)
         return result;
     }
     fNumTargetCategories = reader.GetNumTargetCats();
-    BinTuples(result);
+    BinTuples(tuples, preProcess, result);
     if (result.fNumDistinct == 1)
         result.fStatus = AboutIndex(MakeWarning(MCBinning::BINStatusSingleValueAttribute), attribute);
     if (fNumTargetCategories == 1)
@@ -148,16 +156,17 @@ BINAlgorithm::PairResult BINAlgorithm::BinCurrentPair(int attribute, int target)
     return result;
 }
 
-void BINAlgorithm::BinTuples(PairResult& result)
+void BINAlgorithm::BinTuples(const std::vector<BINSortTuple>* tuples, const BINEFPreProcess& preProcess,
+                             PairResult& result)
 {
     if (!fAttributeReader->IsPreBinningEngaged())
     {
-        result.fStatus = BinAttributeDirect(fTuples, result.fCutPoints, result.fCells, result.fModelEntropy);
+        result.fStatus = BinAttributeDirect(tuples, result.fCutPoints, result.fCells, result.fModelEntropy);
         return;
     }
     std::vector<double> cuts;
-    if (fPreProcess->PreBinEqualFrequency(fTuples, fRecordCount, cuts, result.fTotalWeight))
-        result.fStatus = BinAttributePreBinned(fTuples, cuts, result.fCutPoints, result.fCells, result.fModelEntropy);
+    if (preProcess.PreBinEqualFrequency(tuples, fRecordCount, cuts, result.fTotalWeight))
+        result.fStatus = BinAttributePreBinned(tuples, cuts, result.fCutPoints, result.fCells, result.fModelEntropy);
 }
 
 /// Where the store refuses the indices, the pair leaves no trace.

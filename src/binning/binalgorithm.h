@@ -11,6 +11,8 @@
 #include <set>
 #include <vector>
 
+class BINEFPreProcess;
+
 /// The driver of supervised runs: has the records read once, takes each pair of attribute and target in turn, has its
 /// cut points found, and stores what was found.
 ///
@@ -55,6 +57,14 @@ public:
 private:
     friend class BINAlgorithmPeer; // the unit tests' way in
 
+    /// What a call of Run is to treat.
+    struct Entry
+    {
+        int fAttribute;
+        int fTarget;
+        MCBinning::MCStatus fVerdict; ///< OK, or why the pair can't be binned
+    };
+
     /// What is stored of one pair.
     struct PairResult
     {
@@ -69,13 +79,16 @@ private:
         double fModelEntropy = 0.0;
     };
 
-    bool CheckAttributeTargetPairs(const std::vector<int>* attributes, const std::vector<int>* targets);
+    std::vector<Entry> ListAll() const;
+    std::vector<Entry> CheckAttributeTargetPairs(const std::vector<int>* attributes,
+                                                 const std::vector<int>* targets) const;
     MCBinning::MCStatus CheckPair(int attribute, int target) const;
     MCBinning::MCStatus CheckAttribute(int attribute) const;
-    MCBinning::MCStatus BinAllAttributes(const std::vector<int>* attributes, const std::vector<int>* targets);
-    MCBinning::MCStatus BinAttributeTargetPair(int attribute, int target);
-    PairResult BinCurrentPair(int attribute, int target);
-    void BinTuples(PairResult& result);
+    bool IsListTargetUsable() const;
+    MCBinning::MCStatus BinAllEntries(const std::vector<Entry>& entries, int numberOfBins);
+    MCBinning::MCStatus BinAttributeTargetPair(int attribute, int target, const BINEFPreProcess& preProcess);
+    PairResult BinPair(int attribute, int target, const BINEFPreProcess& preProcess);
+    void BinTuples(const std::vector<BINSortTuple>* tuples, const BINEFPreProcess& preProcess, PairResult& result);
     void Store(const PairResult& result, int attribute, int target);
 
     void TallyDistinct(const std::vector<BINSortTuple>& tuples, std::vector<double>& values,
@@ -90,10 +103,8 @@ private:
 
     std::size_t NumCategories() const { return fNumTargetCategories; }
 
-    unsigned int fNumTargetCategories = 1;        ///< K of the current pair
-    std::vector<MCBinning::MCStatus> fPairStatus; ///< a verdict for each entry of the last list
-    int fTargetIndex;                             ///< the list's target, -1 without one
-    std::vector<BINSortTuple>* fTuples = nullptr; ///< the reader's, for the current pair
+    unsigned int fNumTargetCategories = 1; ///< K of the current pair
+    int fTargetIndex;                      ///< the list's target, -1 without one
 };
 
 #endif

@@ -19,10 +19,11 @@
 #include <utility>
 #include <vector>
 
-class BINEFPreProcess;
-
 /// What the two drivers share: the copies that they work on, the one preparation of the data, and how statuses travel
 /// from an attribute to the end of a run. `Interface` is the abstract class that the host knows.
+///
+/// Wherever the host is called, it may call Run of the same object again. So what one call of Run works on is in its
+/// local variables, and a member that a call changes is not read by it behind a call into the host.
 template<class Interface, class Settings, class Output>
 class BinningDriver : public Interface
 {
@@ -44,7 +45,7 @@ public:
 
     Settings* GetSettings() override { return &fSettings; }
 
-    /// The algorithm's own copy of the variable list.
+    /// The algorithm's own copy of the variable list. No variable of it is to be removed or replaced during a Run.
     virtual BINVarList* GetVarList() { return &fVarList; }
 
 protected:
@@ -60,7 +61,11 @@ protected:
     {
         if (fDataPreparator != nullptr)
             return fPreparationStatus;
-        if (source == nullptr || !source->HasNext())
+        const bool hasRecord = source != nullptr && source->HasNext();
+        // A source that runs the object from its HasNext() has the data prepared by that inner call.
+        if (fDataPreparator != nullptr)
+            return fPreparationStatus;
+        if (!hasRecord)
             return MakeError(MCBinning::BINStatusNoRecords);
         auto preparator = std::make_unique<BINDataPreparator>(&fVarList, &fCancelMonitor, fSettings.GetTempDirName(),
                                                               fSettings.GetProgressListener(),
@@ -69,11 +74,12 @@ protected:
         reader->SetNumDistinctValueThreshold(threshold);
         fDataPreparator = std::move(preparator);
         fAttributeReader = std::move(reader);
+        fRightBorderClosed = fSettings.IsRightBorderClosed();
 
-        // An exception of the host ends the preparation as if there were no record.
+        // There is no record for an inner call of Run until all are read, and none at all after an exception of the
+        // host.
         fPreparationStatus = MakeError(MCBinning::BINStatusNoRecords);
         fPreparationStatus = fAttributeReader->ReadRecords();
-        fRightBorderClosed = fSettings.IsRightBorderClosed();
         return fPreparationStatus;
     }
 
@@ -95,10 +101,10 @@ protected:
         return status;
     }
 
-    static bool IsAnyOK(const std::vector<MCBinning::MCStatus>& verdicts)
+    template<class Entry>
+    static bool IsAnyOK(const std::vector<Entry>& entries)
     {
-        return std::any_of(verdicts.begin(), verdicts.end(),
-                           [](const MCBinning::MCStatus& verdict) { return verdict.IsOK(); });
+        return std::any_of(entries.begin(), entries.end(), [](const Entry& entry) { return entry.fVerdict.IsOK(); });
     }
 
     bool HasVariable(int index) const { return index >= 0 && index < GetNumVariables(); }
@@ -126,7 +132,6 @@ private:
 protected:
     unsigned int fRecordCount = 0; ///< tuples of the attribute or pair treated last
     bool fRightBorderClosed = true;
-    int fNumberOfBins = 0;
     Settings fSettings;
     BINVarList fVarList;
     MCBinning::MCStatus fStatus; ///< the last of an attribute or pair that was not OK, or cancelled; never OK again
@@ -135,25 +140,9 @@ protected:
     // In this order: the reader closes its files before the preparator removes them.
     std::unique_ptr<BINDataPreparator> fDataPreparator;
     std::unique_ptr<BINAttributeReader> fAttributeReader;
-    BINEFPreProcess* fPreProcess = nullptr; ///< alive during the loop over the attributes
     int fWeightIndex;
     Output fOutput;
     Platform* fPlatform;
-};
-
-/// Lends an object to a member for as long as a scope lasts.
-template<class Object>
-class Lend
-{
-public:
-    Lend(Object*& member, Object& object) : fMember(member), fFormer(member) { fMember = &object; }
-    Lend(const Lend&) = delete;
-    Lend& operator=(const Lend&) = delete;
-    ~Lend() { fMember = fFormer; }
-
-private:
-    Object*& fMember;
-    Object* fFormer; ///< not null where the host runs the algorithm again from one of its callbacks
 };
 
 #endif

@@ -15,10 +15,11 @@ EFBINAlgorithm::~EFBINAlgorithm() = default;
 
 MCStatus EFBINAlgorithm::Run(IBINRecordSource* source, const std::vector<int>* attributes)
 {
-    fNumberOfBins = fSettings.GetNumberOfBins();
-    if (fNumberOfBins <= 0)
+    const int numberOfBins = fSettings.GetNumberOfBins();
+    if (numberOfBins <= 0)
         return MakeError(MCBinning::BINStatusBadNumberOfBins);
-    if (attributes != nullptr && !CheckAttributeList(*attributes))
+    const std::vector<Entry> entries = attributes != nullptr ? CheckAttributeList(*attributes) : ListAll();
+    if (attributes != nullptr && !IsAnyOK(entries))
         return MakeError(MCBinning::BINStatusBadAttributeIndex);
     if (fCancelMonitor.IsCancelled())
         return CloseRun(MCStatus());
@@ -27,15 +28,28 @@ MCStatus EFBINAlgorithm::Run(IBINRecordSource* source, const std::vector<int>* a
     const MCStatus status = PrepareOnce(source, TupleKind::kWithoutTarget, kNoThreshold);
     if (status.IsError())
         return status;
-    return CloseRun(BinAllAttributes(attributes));
+    return CloseRun(BinAllEntries(entries, numberOfBins));
 }
 
-/// Gives each entry its verdict. \return whether some entry can be binned.
-bool EFBINAlgorithm::CheckAttributeList(const std::vector<int>& attributes)
+/// Every variable but the weight.
+std::vector<EFBINAlgorithm::Entry> EFBINAlgorithm::ListAll() const
 {
-    fAttributeStatus.clear();
-    for (const int attribute : attributes) fAttributeStatus.push_back(CheckAttribute(attribute));
-    return IsAnyOK(fAttributeStatus);
+    std::vector<Entry> entries;
+    for (int attribute = 0; attribute < GetNumVariables(); ++attribute)
+    {
+        if (attribute != fWeightIndex)
+            entries.push_back({attribute, MCStatus()});
+    }
+    return entries;
+}
+
+/// Gives each entry of the host's list its verdict.
+std::vector<EFBINAlgorithm::Entry> EFBINAlgorithm::CheckAttributeList(const std::vector<int>& attributes) const
+{
+    std::vector<Entry> entries;
+    entries.reserve(attributes.size());
+    for (const int attribute : attributes) entries.push_back({attribute, CheckAttribute(attribute)});
+    return entries;
 }
 
 MCStatus EFBINAlgorithm::CheckAttribute(int attribute) const
@@ -46,45 +60,31 @@ MCStatus EFBINAlgorithm::CheckAttribute(int attribute) const
 }
 
 /// \return the status of the attribute treated last.
-MCStatus EFBINAlgorithm::BinAllAttributes(const std::vector<int>* attributes)
+MCStatus EFBINAlgorithm::BinAllEntries(const std::vector<Entry>& entries, int numberOfBins)
 {
-    BINEFPreProcess preProcess(fNumberOfBins, fRightBorderClosed);
-    const Lend lend(fPreProcess, preProcess);
+    const BINEFPreProcess preProcess(numberOfBins, fRightBorderClosed);
     AttributeReports reports(fSettings, fPlatform);
     MCStatus status;
-    const auto treat = [&](int attribute)
+    for (const Entry& entry : entries)
     {
-        status = BinAttribute(attribute);
-        reports.CountAttribute(attribute, status);
-    };
-
-    if (attributes == nullptr)
-    {
-        for (int attribute = 0; attribute < GetNumVariables(); ++attribute)
+        if (entry.fVerdict.IsOK())
         {
-            if (attribute != fWeightIndex)
-                treat(attribute);
+            status = BinAttribute(entry.fAttribute, preProcess);
+            reports.CountAttribute(entry.fAttribute, status);
         }
-        return status;
-    }
-    const std::vector<MCStatus> verdicts = fAttributeStatus; // a copy: a callback of the host may run the object again
-    for (std::size_t entry = 0; entry < attributes->size(); ++entry)
-    {
-        const int attribute = (*attributes)[entry];
-        if (verdicts[entry].IsOK())
-            treat(attribute);
         else // where the store refuses the index, the entry leaves no trace
-            fOutput.SetAttributeResults(verdicts[entry], {}, {}, attribute, 0, 0.0, 0.0, 0.0, 0.0);
+            fOutput.SetAttributeResults(entry.fVerdict, {}, {}, entry.fAttribute, 0, 0.0, 0.0, 0.0, 0.0);
     }
     return status;
 }
 
-MCStatus EFBINAlgorithm::BinAttribute(int attribute)
+MCStatus EFBINAlgorithm::BinAttribute(int attribute, const BINEFPreProcess& preProcess)
 {
     if (fCancelMonitor.IsCancelled())
         return CloseStep(MCStatus());
 
-    MCStatus status = fAttributeReader->GetAttributeData(attribute, &fTuples);
+    std::vector<BINValueTuple>* tuples = nullptr; // the reader's
+    MCStatus status = fAttributeReader->GetAttributeData(attribute, &tuples);
     if (status.IsError())
     {
         fOutput.SetAttributeResults(status, {}, {}, attribute, 0, 0.0, 0.0, gMissingValue, gMissingValue);
@@ -98,7 +98,7 @@ MCStatus EFBINAlgorithm::BinAttribute(int attribute)
         status = MakeWarning(MCBinning::BINStatusNoValidValues);
     else
     {
-        fPreProcess->BinEqualFrequency(fTuples, fRecordCount, cuts, counts, reader.GetTotalWeight());
+        preProcess.BinEqualFrequency(tuples, fRecordCount, cuts, counts, reader.GetTotalWeight());
         if (cuts.empty())
             status = AboutIndex(MakeWarning(MCBinning::BINStatusNoEFCutPoints), attribute);
         if (reader.GetNumDistinct() == 1)

@@ -10,6 +10,8 @@
 #include <iosfwd>
 #include <vector>
 
+class BINEFPreProcess;
+
 /// The driver of equal-frequency runs: has the records read once, takes each attribute in turn, has it cut, and stores
 /// what was found.
 class EFBINAlgorithm : public BinningDriver<IEFBINAlgorithm, EFBINSettings, EFBINOutput>
@@ -22,13 +24,18 @@ public:
     void Display(std::ostream& os) override;
 
 private:
-    bool CheckAttributeList(const std::vector<int>& attributes);
-    MCBinning::MCStatus CheckAttribute(int attribute) const;
-    MCBinning::MCStatus BinAllAttributes(const std::vector<int>* attributes);
-    MCBinning::MCStatus BinAttribute(int attribute);
+    /// What a call of Run is to treat.
+    struct Entry
+    {
+        int fAttribute;
+        MCBinning::MCStatus fVerdict; ///< OK, or why the attribute can't be binned
+    };
 
-    std::vector<MCBinning::MCStatus> fAttributeStatus; ///< a verdict for each entry of the last list
-    std::vector<BINValueTuple>* fTuples = nullptr;     ///< the reader's, for the current attribute
+    std::vector<Entry> ListAll() const;
+    std::vector<Entry> CheckAttributeList(const std::vector<int>& attributes) const;
+    MCBinning::MCStatus CheckAttribute(int attribute) const;
+    MCBinning::MCStatus BinAllEntries(const std::vector<Entry>& entries, int numberOfBins);
+    MCBinning::MCStatus BinAttribute(int attribute, const BINEFPreProcess& preProcess);
 };
 
 #endif

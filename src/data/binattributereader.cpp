@@ -69,7 +69,8 @@ MCStatus BINAttributeReader::ReadRecords()
     if (status.IsError())
         return status;
     const BINVarList& list = *fPreparator->GetVarList();
-    fHasWeight = list.GetWeightIndex() >= 0;
+    fWeightPosition = PositionOf(list.GetWeightIndex());
+    fHasWeight = fWeightPosition >= 0;
     fHasTarget = fTupleKind == TupleKind::kWithTarget;
     fNumRecords = fPreparator->GetNumRecords();
     fFileNames = fPreparator->GetFileNames();
@@ -84,10 +85,7 @@ MCStatus BINAttributeReader::ReadRecords()
     if (fHasTarget && list.GetTargetIndex() >= 0)
         fTargetIterator = OpenPosition(fTargetPosition);
     if (fHasWeight)
-    {
-        fWeightPosition = PositionOf(list.GetWeightIndex());
         fWeightIterator = OpenPosition(fWeightPosition);
-    }
     return status; // a file that didn't open is tried again at each read, and fails that read alone
 }
 

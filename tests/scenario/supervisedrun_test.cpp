@@ -246,33 +246,6 @@ TEST(SupervisedRun, ReportsEveryAttributeThatIsTreatedWithoutAnError)
     EXPECT_GE(everyThird.fSeconds.at(0), 0.0);
 }
 
-TEST(SupervisedRun, HostMayRunTheObjectAgainFromItsListener)
-{
-    class Nested : public ProgressListener
-    {
-    public:
-        void ReportProgress(ProgressReport&) override
-        {
-            fRun->SetProgressListener(nullptr);
-            const std::vector<int> attributes{3};
-            fRun->Run(nullptr, &attributes, nullptr);
-        }
-        IBINAlgorithm* fRun = nullptr;
-    };
-    Nested listener;
-    Supervised run(FullList());
-    listener.fRun = run.operator->();
-    run->SetProgressListener(&listener);
-    RecordTable records = FullRecords();
-
-    EXPECT_EQ(kFlagged, run.Run(records, {0, 0}));
-
-    const std::vector<BINAttributeTargetResults> results = run.All();
-    ASSERT_EQ(4U, results.size()) << "each of the two attributes, and what its report asked for";
-    ExpectSame(results[0], results[2]);
-    ExpectSame(results[1], results[3]);
-}
-
 TEST(SupervisedRun, DisplayShowsWhatThereIs)
 {
     Supervised run(FullList());
