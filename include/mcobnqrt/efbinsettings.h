@@ -54,9 +54,9 @@ public:
     bool SetNumberOfBins(int value);
     int GetNumberOfBins() const { return fNumberOfBins; }
 
-    /// Where the temporary files go; any name is taken, and Run finds out whether files can be made there. Default: the
-    /// directory for temporary files that the system names (POSIX: TMPDIR, else /tmp), without trailing separator. Read
-    /// with the records.
+    /// Where the temporary files go; any name is taken, and Run finds out whether files can be made there. Default:
+    /// what TMPDIR of the environment names, if that is a directory that files can be made in, without trailing
+    /// separator; else /tmp, if that is one; else "./". Read with the records.
     void SetTempDirName(const std::string& name) { fTempDirName = name; }
     std::string GetTempDirName() const { return fTempDirName; }
 

@@ -22,6 +22,7 @@ struct FileIdentity
     std::uint64_t fDevice = 0;
     std::uint64_t fNode = 0;
     std::int64_t fBirth = 0; ///< when it was made, since systems give the number of a removed file again; 0 if unknown
+    std::int64_t fMaker = 0; ///< the process that made it; doesn't tell it from other files
 };
 
 /// All that the library needs of its system: a clock, and the files of the spool. One object serves any number of
@@ -65,15 +66,16 @@ public:
     /// Closes the stream, which is gone afterwards in any case. False if something written didn't reach the file.
     virtual bool CloseFile(std::FILE* file) = 0;
 
-    /// Removes the file, if `path` still is that file. A failure reaches nobody: there is nothing left to do about it.
+    /// Removes the file, if `path` still is that file and this process made it. A failure reaches nobody: there is
+    /// nothing left to do about it.
     virtual void RemoveFile(const std::string& path, const FileIdentity& identity) = 0;
 };
 
 /// The platform that the program runs on; lives as long as the program.
 Platform* SystemPlatform();
 
-/// The directory where the user's programs put their temporary files, without trailing separator; "./" if there is
-/// none.
+/// The directory where the user's programs put their temporary files, without trailing separator: TMPDIR of the
+/// environment if it is a directory that files can be made in, else /tmp if that is one, else "./".
 std::string SystemTempDirectory();
 
 #endif

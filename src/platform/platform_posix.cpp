@@ -2,8 +2,7 @@
 
 #include <cerrno>
 #include <chrono>
-#include <filesystem>
-#include <system_error>
+#include <cstdlib>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -60,10 +59,9 @@ bool IsTakenName(const std::string& path)
     return lstat(path.c_str(), &found) == 0;
 }
 
-/// Whether we could make a file in the directory of `path`, as the user whose rights count for opening.
-bool IsDirectoryUsable(const std::string& path)
+/// Whether we could make a file in the directory, as the user whose rights count for opening.
+bool IsDirectoryUsable(const std::string& directory)
 {
-    const std::string directory = DirectoryOf(path);
     struct stat found = {};
     return stat(directory.c_str(), &found) == 0 && S_ISDIR(found.st_mode) &&
            faccessat(AT_FDCWD, directory.c_str(), W_OK | X_OK, AT_EACCESS) == 0;
@@ -84,14 +82,16 @@ std::int64_t TimeOfBirth(int directory, const char* path)
 
 FileIdentity IdentityOf(const struct stat& found, std::int64_t birth)
 {
-    return {static_cast<std::uint64_t>(found.st_dev), static_cast<std::uint64_t>(found.st_ino), birth};
+    return {static_cast<std::uint64_t>(found.st_dev), static_cast<std::uint64_t>(found.st_ino), birth, getpid()};
 }
 
+/// A time of birth tells two files apart only where it is known of both: a system may tell it at one time and refuse to
+/// at another.
 bool IsSameFile(const struct stat& found, std::int64_t birth, const FileIdentity& identity)
 {
-    const FileIdentity other = IdentityOf(found, birth);
-    return S_ISREG(found.st_mode) && other.fDevice == identity.fDevice && other.fNode == identity.fNode &&
-           other.fBirth == identity.fBirth;
+    const bool isSameBirth = birth == identity.fBirth || birth == 0 || identity.fBirth == 0;
+    return S_ISREG(found.st_mode) && static_cast<std::uint64_t>(found.st_dev) == identity.fDevice &&
+           static_cast<std::uint64_t>(found.st_ino) == identity.fNode && isSameBirth;
 }
 
 /// Sets `found` if the descriptor is open on that file.
@@ -109,7 +109,7 @@ NameState StateOfUnopenedName(const std::string& path, int error)
         return NameState::kTooManyOpenFiles;
     if (IsTakenName(path))
         return NameState::kTaken;
-    if (error == ENAMETOOLONG || error == ENOTDIR || !IsDirectoryUsable(path))
+    if (error == ENAMETOOLONG || error == ENOTDIR || !IsDirectoryUsable(DirectoryOf(path)))
         return NameState::kDirectoryMissing;
     return NameState::kFree;
 }
@@ -194,6 +194,9 @@ public:
 
     void RemoveFile(const std::string& path, const FileIdentity& identity) override
     {
+        // A child process that fork() made has a copy of what knows the file, but the file is still its parent's.
+        if (identity.fMaker != getpid())
+            return;
         struct stat found = {};
         if (lstat(path.c_str(), &found) == 0 && IsSameFile(found, TimeOfBirth(AT_FDCWD, path.c_str()), identity))
             unlink(path.c_str());
@@ -210,10 +213,13 @@ Platform* SystemPlatform()
 
 std::string SystemTempDirectory()
 {
-    std::error_code error;
-    std::string directory = std::filesystem::temp_directory_path(error).string();
-    if (error || directory.empty())
-        return "./";
-    while (directory.size() > 1 && directory.back() == '/') directory.pop_back();
-    return directory;
+    const char* const fromEnvironment = std::getenv("TMPDIR");
+    for (std::string directory : {fromEnvironment != nullptr ? fromEnvironment : "", "/tmp"})
+    {
+        if (!IsDirectoryUsable(directory))
+            continue;
+        while (directory.size() > 1 && directory.back() == '/') directory.pop_back();
+        return directory;
+    }
+    return "./";
 }

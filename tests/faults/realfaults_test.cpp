@@ -4,16 +4,23 @@
 #include "support/tempdir.h"
 
 #include <cerrno>
+#include <cstddef>
+#include <cstdlib>
 #include <ctime>
 #include <fstream>
+#include <iterator>
 #include <sstream>
 #include <stdexcept>
 #include <tuple>
 
 #include <fcntl.h>
+#include <linux/filter.h>
+#include <linux/seccomp.h>
 #include <sys/mount.h>
+#include <sys/prctl.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/syscall.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -97,6 +104,17 @@ rlim_t LimitFileHandles(rlim_t limit)
     std::swap(limit, handles.rlim_cur);
     setrlimit(RLIMIT_NOFILE, &handles);
     return limit;
+}
+
+/// From now on the system refuses to tell this process when a file was made. False if that can't be had.
+bool ForbidTimesOfBirth()
+{
+    sock_filter steps[] = {BPF_STMT(BPF_LD | BPF_W | BPF_ABS, offsetof(seccomp_data, nr)),
+                           BPF_JUMP(BPF_JMP | BPF_JEQ | BPF_K, __NR_statx, 0, 1),
+                           BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ERRNO | ENOSYS),
+                           BPF_STMT(BPF_RET | BPF_K, SECCOMP_RET_ALLOW)};
+    const sock_fprog program{static_cast<unsigned short>(std::size(steps)), steps};
+    return prctl(PR_SET_NO_NEW_PRIVS, 1, 0, 0, 0) == 0 && prctl(PR_SET_SECCOMP, SECCOMP_MODE_FILTER, &program) == 0;
 }
 
 /// The files, with the times of their last reading and writing.
@@ -380,6 +398,86 @@ TEST(RealFault, TwoProcessesInOneDirectoryAtOneTickDontMeet)
     EXPECT_EQ(0, countFailures());
     EXPECT_EQ(0, ExitCodeOf(child));
     EXPECT_TRUE(dir.IsEmpty());
+}
+
+TEST(RealFault, AChildThatDeletesTheObjectLeavesTheFilesToItsParent)
+{
+    const TempDir dir;
+    RecordTable records = Ages(200);
+    auto host = AHost(dir.Path());
+    EXPECT_EQ(0, CodeOfRun(*host, records));
+    EFBINSettings settings = EqualFrequencySettings(4);
+    settings.SetTempDirName(dir.Path());
+    auto otherHost = std::make_unique<EqualFrequency>(AgeList(), settings);
+    RecordTable otherRecords = Ages(200);
+    EXPECT_TRUE(otherHost->Run(otherRecords).IsOK());
+    ASSERT_EQ(4U, dir.FileNames().size());
+
+    const auto deleteBoth = [&]
+    {
+        host.reset();
+        otherHost.reset();
+        return 0;
+    };
+    EXPECT_EQ(0, ExitCodeOf(StartChild(deleteBoth)));
+
+    EXPECT_EQ(4U, dir.FileNames().size());
+    EXPECT_EQ(0, CodeOfRun(*host, records));
+    deleteBoth();
+    EXPECT_TRUE(dir.IsEmpty());
+}
+
+TEST(RealFault, AFileWhoseTimeOfBirthIsNotToldAnyMoreIsStillOurs)
+{
+    const TempDir dir;
+    constexpr int kSkip = 77;
+    const auto runTwiceAndDelete = [&dir]
+    {
+        RecordTable records = Ages(200);
+        auto host = AHost(dir.Path());
+        if (CodeOfRun(*host, records) != 0)
+            return 1;
+        if (!ForbidTimesOfBirth())
+            return kSkip;
+        if (CodeOfRun(*host, records) != 0)
+            return 2;
+        host.reset();
+        return dir.IsEmpty() ? 0 : 3;
+    };
+
+    const int code = ExitCodeOf(StartChild(runTwiceAndDelete));
+
+    if (code == kSkip)
+        GTEST_SKIP() << "no system call can be forbidden here";
+    EXPECT_EQ(0, code);
+
+    // The other way round: not told at first.
+    std::FILE* file = nullptr;
+    FileIdentity identity;
+    ASSERT_EQ(NameState::kFree, SystemPlatform()->CreateNewFile(dir.File("f"), file, identity));
+    SystemPlatform()->CloseFile(file);
+    identity.fBirth = 0;
+    SystemPlatform()->RemoveFile(dir.File("f"), identity);
+    EXPECT_TRUE(dir.IsEmpty());
+}
+
+TEST(RealFault, WithoutADirectoryForTemporaryFilesTheyGoWhereTheProgramIs)
+{
+    const TempDir dir;
+    constexpr int kSkip = 77;
+    const auto nameDirectory = [&dir]
+    {
+        unsetenv("TMPDIR");
+        if (chroot(dir.Path().c_str()) != 0 || chdir("/") != 0)
+            return kSkip;
+        return SystemTempDirectory() == "./" ? 0 : 1;
+    };
+
+    const int code = ExitCodeOf(StartChild(nameDirectory));
+
+    if (code == kSkip)
+        GTEST_SKIP() << "this user may not change the root directory";
+    EXPECT_EQ(0, code);
 }
 
 TEST(RealFault, AnExceptionOfTheHostEndsTheReadingOrLosesNothing)

@@ -2,10 +2,15 @@
 #include <mcobnqrt/efbinsettings.h>
 
 #include "platform/platform.h"
+#include "support/tempdir.h"
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+#include <fstream>
 #include <limits>
+#include <map>
+#include <optional>
 #include <sstream>
 
 /// What the settings of both kinds of run have in common.
@@ -46,6 +51,30 @@ TYPED_TEST(SettingsOfBothKinds, DifferByFourFiguresAndNotByTheDirectory)
 
     EXPECT_TRUE(directory == plain);
     for (const TypeParam& other : {attributes, cases, border, bins}) EXPECT_FALSE(other == plain);
+}
+
+TYPED_TEST(SettingsOfBothKinds, TakeTheDirectoryOfTheEnvironmentIfFilesCanBeMadeThere)
+{
+    const char* const inherited = std::getenv("TMPDIR");
+    const std::optional<std::string> former = inherited != nullptr ? std::optional(inherited) : std::nullopt;
+    const TempDir directory;
+    std::ofstream(directory.File("file")) << "no directory";
+    std::map<std::string, std::string> found;
+
+    const std::vector<std::string> values{directory.Path() + "//", directory.File("none"), directory.File("file"), ""};
+    for (const std::string& value : values)
+    {
+        setenv("TMPDIR", value.c_str(), 1);
+        found[value] = TypeParam().GetTempDirName();
+    }
+    unsetenv("TMPDIR");
+    const std::string withoutVariable = TypeParam().GetTempDirName();
+    if (former)
+        setenv("TMPDIR", former->c_str(), 1);
+
+    EXPECT_EQ(directory.Path(), found[values.front()]);
+    for (std::size_t i = 1; i < values.size(); ++i) EXPECT_EQ("/tmp", found[values[i]]) << values[i];
+    EXPECT_EQ("/tmp", withoutVariable);
 }
 
 TEST(SupervisedSettings, RefuseAThresholdOutOfRange)
