@@ -64,6 +64,8 @@ private:
     std::vector<BINAttributeTargetResults> fResults;
     /// By attribute and target: the place in fResults of the first entry of that pair.
     std::map<std::pair<int, int>, int> fResultIndex;
+    /// By attribute: the places in fResults of its entries, in the order of storing.
+    std::map<int, std::vector<int>> fAttributeIndex;
 };
 
 #endif

@@ -152,12 +152,15 @@ public:
     void Display(std::ostream& os) const;
 
 private:
+    class NameIndex;
+
     IBINVariable* At(int index) const;
     bool MayAdd(const std::string& name, IBINVariable::VariableRole role) const;
     int Append(std::unique_ptr<IBINVariable> variable);
     int AppendCategorical(std::unique_ptr<IBINVariable> variable);
 
     std::vector<std::unique_ptr<IBINVariable>> fVars;
+    std::unique_ptr<NameIndex> fNames; ///< null or of all of fVars; may be out of date
     int fNumContVars = 0;
     int fNumCatVars = 0;
     int fTargetIndex = -1;

@@ -6,6 +6,7 @@
 #include <mcobnqrt/mcstatus.h>
 
 #include <iosfwd>
+#include <map>
 #include <vector>
 
 /// The results of an equal-frequency algorithm. The algorithm adds an entry for each attribute that it treats; the host
@@ -48,6 +49,7 @@ public:
 
 private:
     std::vector<BINAttributeResults> fResults; ///< in the order of storing
+    std::map<int, int> fResultIndex;           ///< by attribute: the place in fResults of its first entry
 };
 
 #endif

@@ -4,6 +4,7 @@
 #include <mcobnqrt/binstringencoder.h>
 
 #include "metadata/metadataprinters.h"
+#include "metadata/nameindex.h"
 #include "metadata/ownership.h"
 
 #include <ostream>
@@ -39,6 +40,8 @@ BINCatVar& BINCatVar::operator=(const BINCatVar& other)
         return *this;
     // Copied first: what can fail must not leave a mixture of two variables.
     BINCatVar copy(other);
+    if (fName != copy.fName)
+        NoteNameChange();
     fName.swap(copy.fName);
     fLabel.swap(copy.fLabel);
     fRole = copy.fRole;

@@ -3,6 +3,7 @@
 #include <mcobnqrt/ibinusermissing.h>
 
 #include "metadata/metadataprinters.h"
+#include "metadata/nameindex.h"
 #include "metadata/ownership.h"
 
 #include <ostream>
@@ -24,6 +25,8 @@ BINContVar& BINContVar::operator=(const BINContVar& other)
         return *this;
     // Copied first: what can fail must not leave a mixture of two variables.
     BINContVar copy(other);
+    if (fName != copy.fName)
+        NoteNameChange();
     fName.swap(copy.fName);
     fLabel.swap(copy.fLabel);
     fRole = copy.fRole;

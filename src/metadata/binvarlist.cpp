@@ -8,6 +8,8 @@
 #include <mcobnqrt/binstringusermissing.h>
 #include <mcobnqrt/binweightvar.h>
 
+#include "base/growth.h"
+#include "metadata/nameindex.h"
 #include "metadata/ownership.h"
 
 #include <algorithm>
@@ -73,6 +75,7 @@ BINVarList& BINVarList::operator=(const BINVarList& other)
     // Copied first: what can fail must not leave half a list.
     BINVarList copy(other);
     fVars.swap(copy.fVars);
+    fNames.swap(copy.fNames);
     fNumContVars = copy.fNumContVars;
     fNumCatVars = copy.fNumCatVars;
     fTargetIndex = copy.fTargetIndex;
@@ -171,6 +174,8 @@ IBINVariable* BINVarList::GetTargetVariable() const
 
 int BINVarList::FindVariable(const std::string& name) const
 {
+    if (fNames != nullptr && fNames->IsUpToDate())
+        return fNames->Find(name);
     const auto place = std::find_if(fVars.begin(), fVars.end(),
                                     [&name](const auto& variable) { return variable->GetVariableName() == name; });
     return place == fVars.end() ? kNone : static_cast<int>(place - fVars.begin());
@@ -248,6 +253,8 @@ bool BINVarList::RemoveVar(int index)
     const bool isTarget = variable->GetVariableRole() == IBINVariable::RoleTarget;
     const bool isWeight = index == fWeightIndex;
 
+    if (fNames != nullptr)
+        fNames->Remove(index);
     fVars.erase(fVars.begin() + index);
     if (isContinuous)
         --fNumContVars;
@@ -359,6 +366,10 @@ bool BINVarList::MayAdd(const std::string& name, IBINVariable::VariableRole role
 
 int BINVarList::Append(std::unique_ptr<IBINVariable> variable)
 {
+    if (fNames == nullptr || !fNames->IsUpToDate())
+        fNames = std::make_unique<NameIndex>(fVars);
+    ReserveOneMore(fVars);
+    fNames->Append(variable->GetVariableName()); // the last step that can fail
     fVars.push_back(std::move(variable));
     return static_cast<int>(fVars.size()) - 1;
 }

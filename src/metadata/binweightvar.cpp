@@ -2,6 +2,7 @@
 
 #include <mcobnqrt/ibinusermissing.h>
 
+#include "metadata/nameindex.h"
 #include "metadata/ownership.h"
 
 #include <ostream>
@@ -25,6 +26,8 @@ BINWeightVar& BINWeightVar::operator=(const BINWeightVar& other)
         return *this;
     // Copied first: what can fail must not leave a mixture of two variables.
     BINWeightVar copy(other);
+    if (fName != copy.fName)
+        NoteNameChange();
     fName.swap(copy.fName);
     fLabel.swap(copy.fLabel);
     fUserMissing.swap(copy.fUserMissing);

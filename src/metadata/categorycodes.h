@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_CATEGORYCODES_H
 #define MCOBNQRT_CATEGORYCODES_H
 
-#include "metadata/growth.h"
+#include "base/growth.h"
 
 #include <iosfwd>
 #include <map>

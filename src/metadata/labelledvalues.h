@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_LABELLEDVALUES_H
 #define MCOBNQRT_LABELLEDVALUES_H
 
-#include "metadata/growth.h"
+#include "base/growth.h"
 
 #include <cstddef>
 #include <ostream>

@@ -1,5 +1,6 @@
 #include <mcobnqrt/binoutput.h>
 
+#include "base/growth.h"
 #include "results/resultparts.h"
 
 #include <cstddef>
@@ -47,6 +48,7 @@ BINOutput& BINOutput::operator=(const BINOutput& other)
     BINOutput copy(other);
     fResults.swap(copy.fResults);
     fResultIndex.swap(copy.fResultIndex);
+    fAttributeIndex.swap(copy.fAttributeIndex);
     return *this;
 }
 
@@ -74,12 +76,16 @@ MCStatus BINOutput::SetAttributeTargetResults(MCStatus status, const std::set<do
     entry.fMaximum = maximum;
     entry.fModelEntropy = modelEntropy;
 
-    // The node of the index is allocated ahead of the entry, and linking it in can't throw: both fields grow, or
-    // neither does. A pair that has an entry already keeps its node, so that its first entry is the one that is found.
+    // What the indices need is allocated ahead of the entry, and linking it in can't throw: all fields grow, or none
+    // does. A pair that has an entry already keeps its node, so that its first entry is the one that is found.
+    const int place = static_cast<int>(fResults.size());
     decltype(fResultIndex) node;
-    node.emplace(std::make_pair(attribute, target), static_cast<int>(fResults.size()));
+    node.emplace(std::make_pair(attribute, target), place);
+    std::vector<int>& placesOfAttribute = fAttributeIndex[attribute];
+    ReserveOneMore(placesOfAttribute);
     fResults.push_back(std::move(entry));
     fResultIndex.merge(node);
+    placesOfAttribute.push_back(place);
     return MCStatus();
 }
 
@@ -94,15 +100,16 @@ MCStatus BINOutput::GetAttributeTargetCutPoints(int attribute, int target, BINAt
 
 MCStatus BINOutput::GetAttributeCutPoints(int attribute, std::vector<BINAttributeTargetResults>& results) const
 {
-    std::vector<BINAttributeTargetResults> found;
-    for (const BINAttributeTargetResults& entry : fResults)
-        if (entry.GetAttributeIndex() == attribute)
-            found.push_back(entry);
-    if (found.empty())
+    const auto places = fAttributeIndex.find(attribute);
+    // A store that failed for want of memory may have left an attribute without an entry.
+    if (places == fAttributeIndex.end() || places->second.empty())
         return MakeError(MCBinning::BINStatusIndexOutOfRange);
 
+    std::vector<BINAttributeTargetResults> found;
+    found.reserve(places->second.size());
+    for (const int place : places->second) found.push_back(fResults[static_cast<std::size_t>(place)]);
     const MCStatus lastStatus = found.back().GetStatus();
-    results.reserve(results.size() + found.size()); // the last allocation
+    ReserveMore(results, found.size()); // the last allocation
     std::move(found.begin(), found.end(), std::back_inserter(results));
     return lastStatus;
 }

@@ -2,8 +2,9 @@
 
 #include "results/resultparts.h"
 
-#include <algorithm>
+#include <cstddef>
 #include <type_traits>
+#include <utility>
 
 using MCBinning::MCStatus;
 
@@ -17,7 +18,9 @@ EFBINOutput::EFBINOutput(const EFBINOutput& other) = default;
 
 EFBINOutput& EFBINOutput::operator=(const EFBINOutput& other)
 {
-    fResults = std::vector<BINAttributeResults>(other.fResults);
+    EFBINOutput copy(other);
+    fResults.swap(copy.fResults);
+    fResultIndex.swap(copy.fResultIndex);
     return *this;
 }
 
@@ -41,18 +44,22 @@ MCStatus EFBINOutput::SetAttributeResults(MCStatus status, const std::vector<dou
     entry.fTotalWeightWithMissing = totalWeightWithMissing;
     entry.fMinimum = minimum;
     entry.fMaximum = maximum;
+
+    // The node of the index is allocated ahead of the entry, and linking it in can't throw: both fields grow, or
+    // neither does. An attribute that has an entry already keeps its node.
+    decltype(fResultIndex) node;
+    node.emplace(attribute, static_cast<int>(fResults.size()));
     fResults.push_back(std::move(entry));
+    fResultIndex.merge(node);
     return MCStatus();
 }
 
 MCStatus EFBINOutput::GetAttributeCutPoints(int attribute, BINAttributeResults& results) const
 {
-    const auto found =
-        std::find_if(fResults.begin(), fResults.end(),
-                     [attribute](const BINAttributeResults& entry) { return entry.GetAttributeIndex() == attribute; });
-    if (found == fResults.end())
+    const auto found = fResultIndex.find(attribute);
+    if (found == fResultIndex.end())
         return MakeError(MCBinning::BINStatusIndexOutOfRange);
-    return CopyEntry(*found, results);
+    return CopyEntry(fResults[static_cast<std::size_t>(found->second)], results);
 }
 
 MCStatus EFBINOutput::GetAllCutPoints(std::vector<BINAttributeResults>& results) const

@@ -1,6 +1,8 @@
 #include "metadata/recordlayout.h"
+#include "support/hostdata.h"
 
 #include <mcobnqrt/bincatnumencoder.h>
+#include <mcobnqrt/bincontvar.h>
 #include <mcobnqrt/binnumericusermissing.h>
 #include <mcobnqrt/binstringencoder.h>
 #include <mcobnqrt/binstringusermissing.h>
@@ -225,6 +227,63 @@ TEST(VarList, CopiesShareNothing)
 
     EXPECT_EQ(before, Shown(copy));
     EXPECT_TRUE(copy.GetTargetIndex() == 3 && copy.GetWeightIndex() == 2);
+}
+
+TEST(VarList, NamesAreFoundWhateverIsAddedRemovedCopiedOrAssigned)
+{
+    constexpr unsigned int kSeed = 7;
+    SCOPED_TRACE(kSeed);
+    Dice dice(kSeed);
+    const std::vector<std::string> names{"a", "b", "c", "d", "e", "f"};
+    const auto anyName = [&] { return names[static_cast<std::size_t>(dice.Below(6))]; };
+    BINVarList list;
+    const auto findPlainly = [&list](const std::string& name)
+    {
+        for (int i = 0; i < static_cast<int>(list.Size()); ++i)
+        {
+            if (list.GetVarAt(i)->GetVariableName() == name)
+                return i;
+        }
+        return -1;
+    };
+    int numAssigned = 0;
+    int numAddedAfterAssignment = 0;
+
+    for (int step = 0; step < 2000; ++step)
+    {
+        const std::string name = anyName();
+        const bool isKnown = findPlainly(name) >= 0;
+        const int index = dice.Below(7);
+        switch (dice.Below(8))
+        {
+        case 0:
+            list.AddWeightVar(name, "", IBINVariable::RoundClosest); // may bear a name that is taken
+            break;
+        case 1:
+            list.RemoveVar(index);
+            break;
+        case 2:
+            EXPECT_EQ(isKnown, list.RemoveVar(name));
+            break;
+        case 3: // behind the list's back, and two variables may then have one name
+            if (auto* variable = dynamic_cast<BINContVar*>(list.GetVarAt(index)))
+            {
+                *variable = BINContVar(name, "", kAttribute);
+                ++numAssigned;
+            }
+            break;
+        case 4:
+            list = BINVarList(list);
+            break;
+        default:
+            ASSERT_EQ(isKnown, list.AddContVar(name, "", kAttribute) < 0) << name << " at step " << step;
+            numAddedAfterAssignment += !isKnown && numAssigned > 0 ? 1 : 0;
+        }
+        for (const std::string& wanted : names)
+            ASSERT_EQ(findPlainly(wanted), list.FindVariable(wanted)) << wanted << " at step " << step;
+    }
+    EXPECT_GT(numAssigned, 50);
+    EXPECT_GT(numAddedAfterAssignment, 100);
 }
 
 TEST(VarList, DisplayShowsCountersThenEachVariable)

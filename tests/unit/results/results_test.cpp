@@ -110,6 +110,23 @@ TEST(SupervisedOutput, IsAssignedWithBothItsEntriesAndTheirIndex)
     EXPECT_TRUE(assigned.GetAttributeTargetCutPoints(3, 1, results).IsOK());
     EXPECT_TRUE(assigned.GetAttributeTargetCutPoints(7, 8, results) == kBadIndex);
     EXPECT_TRUE(assigned.GetAttributeTargetCutPoints(5, 1, results) == kBadIndex);
+    std::vector<BINAttributeTargetResults> several;
+    EXPECT_TRUE(assigned.GetAttributeCutPoints(3, several).IsOK());
+    EXPECT_TRUE(assigned.GetAttributeCutPoints(7, several) == kBadIndex);
+}
+
+TEST(EqualFrequencyOutput, IsAssignedWithBothItsEntriesAndTheirIndex)
+{
+    EFBINOutput output, assigned;
+    AddEF(output, 3);
+    AddEF(assigned, 7);
+    assigned = output;
+    AddEF(output, 5);
+
+    BINAttributeResults results;
+    EXPECT_TRUE(assigned.GetAttributeCutPoints(3, results).IsOK());
+    EXPECT_TRUE(assigned.GetAttributeCutPoints(7, results) == kBadIndex);
+    EXPECT_TRUE(assigned.GetAttributeCutPoints(5, results) == kBadIndex);
 }
 
 TEST(EqualFrequencyOutput, FindsTheFirstEntryAndRefusesIndicesByTwoCodes)

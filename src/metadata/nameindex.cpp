@@ -1,0 +1,64 @@
+#include "metadata/nameindex.h"
+
+#include "base/growth.h"
+
+#include <mcobnqrt/ibinvariable.h>
+
+#include <algorithm>
+#include <atomic>
+#include <limits>
+#include <utility>
+
+namespace
+{
+
+std::atomic<std::uint64_t> numNameChanges{0};
+
+} // namespace
+
+void NoteNameChange()
+{
+    ++numNameChanges;
+}
+
+BINVarList::NameIndex::NameIndex(const std::vector<std::unique_ptr<IBINVariable>>& variables)
+    : fNumNameChanges(numNameChanges)
+{
+    for (const auto& variable : variables) Append(variable->GetVariableName());
+}
+
+bool BINVarList::NameIndex::IsUpToDate() const
+{
+    return fNumNameChanges == numNameChanges;
+}
+
+int BINVarList::NameIndex::Find(const std::string& name) const
+{
+    const auto [begin, end] = fNameOfText.equal_range(name);
+    if (begin == end)
+        return -1;
+    std::uint64_t number = std::numeric_limits<std::uint64_t>::max(); // a weight may bear the name, too
+    for (auto found = begin; found != end; ++found) number = std::min(number, found->second->fNumber);
+    const auto place =
+        std::lower_bound(fNames.begin(), fNames.end(), number,
+                         [](const auto& candidate, std::uint64_t wanted) { return candidate->fNumber < wanted; });
+    return static_cast<int>(place - fNames.begin());
+}
+
+void BINVarList::NameIndex::Append(std::string name)
+{
+    auto made = std::make_unique<const Name>(Name{std::move(name), fNextNumber});
+    ReserveOneMore(fNames);
+    fNameOfText.emplace(made->fText, made.get()); // the last step that can fail
+    fNames.push_back(std::move(made));
+    ++fNextNumber;
+}
+
+void BINVarList::NameIndex::Remove(int index)
+{
+    const auto place = fNames.begin() + index;
+    const auto [begin, end] = fNameOfText.equal_range((*place)->fText);
+    fNameOfText.erase(
+        std::find_if(begin, end, [&place](const auto& candidate) { return candidate.second == place->get(); }));
+    fNames.erase(place);
+}
