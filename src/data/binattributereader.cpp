@@ -8,7 +8,6 @@
 #include <mcobnqrt/binvarlist.h>
 
 #include <algorithm>
-#include <exception>
 
 using MCBinning::BinaryRecordIterator;
 using MCBinning::MCStatus;
@@ -25,7 +24,7 @@ std::unique_ptr<std::vector<Tuple>> MakeTuples(unsigned int count)
     {
         return std::make_unique<std::vector<Tuple>>(count);
     }
-    catch (const std::exception&)
+    catch (...) // bad_alloc, length_error, or whatever the program's own operator new throws
     {
         return nullptr; // the caller's status says so
     }

@@ -24,12 +24,13 @@ void DisplayNumbers(std::ostream& out, const char* label, const Numbers& numbers
 } // namespace
 
 BINDataPreparator::BINDataPreparator(BINVarList* varList, BINCancelMonitor* cancelMonitor, std::string tempDirName,
-                                     ProgressListener* listener, int nSkippedCasesReports, Platform* platform)
+                                     ProgressListener* listener, int nSkippedCasesReports, Platform* platform,
+                                     unsigned int maxNumRecords)
     : fTempDirName(std::move(tempDirName)), fProgressListener(listener), fNSkippedCasesReports(nSkippedCasesReports),
       fVarList(varList), fMaxCodes(varList->Size(), 0), fUsable(varList->Size(), true), fOrigRecSize(varList->Size()),
       fInputRecSize(static_cast<unsigned int>(varList->GetNumAttributeVars())), fCancelMonitor(cancelMonitor),
-      fHasWeight(varList->GetWeightIndex() >= 0 ? 1 : 0), fHasTarget(varList->GetTargetIndex() >= 0 ? 1 : 0),
-      fPlatform(platform)
+      fMaxNumRecords(maxNumRecords), fHasWeight(varList->GetWeightIndex() >= 0 ? 1 : 0),
+      fHasTarget(varList->GetTargetIndex() >= 0 ? 1 : 0), fPlatform(platform)
 {
     fProcRecSize = fInputRecSize + static_cast<unsigned int>(fHasTarget + fHasWeight);
     fVariableIndex.reserve(fOrigRecSize);

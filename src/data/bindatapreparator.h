@@ -10,6 +10,7 @@
 
 #include <cstdint>
 #include <iosfwd>
+#include <limits>
 #include <string>
 #include <vector>
 
@@ -40,8 +41,10 @@ public:
 
     /// Fixes the layout; does no input or output. All that is pointed to outlives the object; the listener may be null.
     /// `nSkippedCasesReports` is the number of records between two reports of the pass, 0 for no report.
+    /// `maxNumRecords` is the number of records that can be accepted.
     BINDataPreparator(BINVarList* varList, BINCancelMonitor* cancelMonitor, std::string tempDirName,
-                      ProgressListener* listener, int nSkippedCasesReports, Platform* platform = SystemPlatform());
+                      ProgressListener* listener, int nSkippedCasesReports, Platform* platform = SystemPlatform(),
+                      unsigned int maxNumRecords = std::numeric_limits<unsigned int>::max());
     BINDataPreparator(const BINDataPreparator&) = delete;
     BINDataPreparator& operator=(const BINDataPreparator&) = delete;
     /// Removes the temporary files. Whoever reads them has closed them by then.
@@ -51,8 +54,8 @@ public:
     ///
     /// \return OK, or the error after which there are no data: BINStatusNoRecords when no record was accepted,
     ///         BINStatusCancelled, BINStatusTooManyCategories for the only categorical variable,
-    ///         BINStatusInvalidVarList when some variable has no position, or what InitTempFiles() or FlushBuffer()
-    ///         gave.
+    ///         BINStatusInvalidVarList when some variable has no position, BINStatusOutOfMemory for more records than
+    ///         can be accepted, or what InitTempFiles() or FlushBuffer() gave.
     MCBinning::MCStatus PrepareData(IBINRecordSource* source);
 
     /// Turns one record of the host into a processed one, and keeps the largest codes and the usable positions up to
@@ -133,6 +136,7 @@ private:
     BINRecordBuffer fBuffer;
     int fBufferSize = 10000; ///< values held per position before a flush
     unsigned int fNumRecords = 0;
+    unsigned int fMaxNumRecords;
     int fHasWeight;
     int fHasTarget;
     Platform* fPlatform;

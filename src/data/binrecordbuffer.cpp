@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cstddef>
-#include <exception>
 
 namespace
 {
@@ -28,7 +27,7 @@ bool BINRecordBuffer::Init(int rows, int cols)
         fData.swap(data);
         fFill.swap(fill);
     }
-    catch (const std::exception&)
+    catch (...) // bad_alloc, length_error, or whatever the program's own operator new throws
     {
         return false; // the caller may try a smaller size
     }

@@ -16,6 +16,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstdint>
+#include <limits>
 
 using MCBinning::MCStatus;
 using MCCommon::Record;
@@ -53,11 +55,14 @@ public:
     {
     }
 
-    void CountTurn(unsigned int numReceived)
+    /// A number of records beyond an int is reported as the largest one.
+    void CountTurn(std::uint64_t numReceived)
     {
         if (fListener == nullptr || --fCountdown != 0)
             return;
-        fReporter.SetValues(numReceived, fPlatform->GetSecondsSince(fStart));
+        const std::uint64_t largest = std::numeric_limits<int>::max();
+        fReporter.SetValues(static_cast<unsigned int>(std::min(numReceived, largest)),
+                            fPlatform->GetSecondsSince(fStart));
         fListener->ReportProgress(fReporter);
         fCountdown = fInterval;
     }
@@ -97,7 +102,7 @@ MCStatus BINDataPreparator::ReadSource(IBINRecordSource* source)
 {
     PassReports reports(fProgressListener, fNSkippedCasesReports, fPlatform);
     Record processed(static_cast<int>(fProcRecSize));
-    unsigned int numReceived = 0;
+    std::uint64_t numReceived = 0;
     while (source->HasNext() && !fCancelMonitor->IsCancelled())
     {
         if (const Record* record = source->Next())
@@ -117,6 +122,8 @@ MCStatus BINDataPreparator::ReadSource(IBINRecordSource* source)
 
 MCStatus BINDataPreparator::SpoolRecord(const Record& processed)
 {
+    if (fNumRecords == fMaxNumRecords)
+        return MakeError(MCBinning::BINStatusOutOfMemory);
     for (int position = 0; position < static_cast<int>(fProcRecSize); ++position)
     {
         if (fUsable[static_cast<std::size_t>(position)])

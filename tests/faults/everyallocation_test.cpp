@@ -4,13 +4,20 @@
 #include <cstdlib>
 #include <new>
 #include <optional>
+#include <string>
 
 namespace
 {
 
 int numAllocations = 0;
-int failingAllocation = 0; ///< its number, counted from 1; 0 for none
-bool isFromThenOn = false; ///< all behind it fail, too
+std::size_t numBytes = 0;
+int failingAllocation = 0;     ///< its number, counted from 1; 0 for none
+bool isFromThenOn = false;     ///< all behind it fail, too
+bool throwsOwnFailure = false; ///< the failing one throws what no standard library knows
+
+struct OwnFailure
+{
+};
 
 bool Fails()
 {
@@ -24,7 +31,10 @@ bool Fails()
 // Not inlined: g++ would see through one of a pair and complain that it doesn't match the other.
 [[gnu::noinline]] void* operator new(std::size_t size)
 {
+    numBytes += size;
     void* memory = Fails() ? nullptr : std::malloc(size > 0 ? size : 1);
+    if (memory == nullptr && throwsOwnFailure)
+        throw OwnFailure();
     if (memory == nullptr)
         throw std::bad_alloc();
     return memory;
@@ -195,4 +205,64 @@ TEST(EveryAllocation, MayBeTheLastOneThatAHostGets)
 {
     FailFromEachAllocationOn<Supervised, BINFactory>(PreBinningSettings());
     FailFromEachAllocationOn<EqualFrequency, EFBINFactory>(EqualFrequencySettings(6));
+}
+
+TEST(EveryAllocation, OfTheBufferOrTheTuplesMayFailWithAnyException)
+{
+    throwsOwnFailure = true;
+    int numPassed = 0;
+    int numSecondTries = 0;
+    int numTold = 0;
+    for (int n = 1;; ++n)
+    {
+        const TempDir dir;
+        EFBINSettings settings = EqualFrequencySettings(4);
+        settings.SetTempDirName(dir.Path());
+        EqualFrequency host(AVarList().WithAttribute("x"), settings);
+        RecordTable records{{1}, {2}, {3}, {4}, {5}, {6}, {7}, {8}};
+        failingAllocation = numAllocations + n;
+        try
+        {
+            const MCBinning::MCStatus status = host.Run(records);
+            const bool hasFired = numAllocations >= failingAllocation;
+            failingAllocation = 0;
+            if (!hasFired)
+                break;
+            EXPECT_TRUE(status.IsOK() || status.GetErrorCode() == MCBinning::BINStatusOutOfMemory);
+            ++(status.IsOK() ? numSecondTries : numTold);
+        }
+        catch (const OwnFailure&)
+        {
+            failingAllocation = 0;
+            ++numPassed;
+        }
+    }
+    throwsOwnFailure = false;
+
+    EXPECT_GT(numPassed, 10);
+    EXPECT_EQ(2, numSecondTries) << "a buffer of half the size takes the place of the first";
+    EXPECT_EQ(2, numTold) << "the vector of tuples, and the tuples in it";
+}
+
+TEST(Allocations, OfWideListsAndTheirResultsGrowWithTheNumberOfVariablesOnly)
+{
+    constexpr int kNumVariables = 2000;
+    constexpr std::size_t kBytesForEach = 2000;
+    const std::string longName(40, 'n'); // a copy of it needs an allocation
+    BINOutput output;
+
+    const std::size_t beforeList = numBytes;
+    BINVarList list;
+    for (int i = 0; i < kNumVariables; ++i)
+        ASSERT_EQ(i, list.AddContVar(longName + std::to_string(i), "", IBINVariable::RoleAttribute));
+    const std::size_t ofList = numBytes - beforeList;
+    for (int i = 1; i < kNumVariables; ++i)
+        output.SetAttributeTargetResults(MCBinning::MCStatus(), {}, {}, i, 0, 0, 0.0, 0.0, 0.0, 0.0, 0.0);
+    const std::size_t beforeResults = numBytes;
+    std::vector<BINAttributeTargetResults> results;
+    for (int i = 1; i < kNumVariables; ++i) ASSERT_TRUE(output.GetAttributeCutPoints(i, results).IsOK());
+    const std::size_t ofResults = numBytes - beforeResults;
+
+    EXPECT_LT(ofList, kNumVariables * kBytesForEach);
+    EXPECT_LT(ofResults, kNumVariables * kBytesForEach);
 }

@@ -152,7 +152,7 @@ public:
 };
 
 using BothKinds = testing::Types<SupervisedKind, EqualFrequencyKind>;
-TYPED_TEST_SUITE(NestedRun, BothKinds);
+TYPED_TEST_SUITE(NestedRun, BothKinds, ); // the empty argument is for pedantic compilers
 
 } // namespace
 

@@ -10,6 +10,7 @@
 
 #include <gtest/gtest.h>
 
+#include <limits>
 #include <string>
 #include <vector>
 
@@ -18,9 +19,10 @@ class BINDataPreparatorPeer
 {
 public:
     explicit BINDataPreparatorPeer(const BINVarList& list, ProgressListener* listener = nullptr, int interval = 0,
-                                   MCQueryCancel* query = nullptr)
+                                   MCQueryCancel* query = nullptr,
+                                   unsigned int maxNumRecords = std::numeric_limits<unsigned int>::max())
         : fList(list), fMonitor(query),
-          fPreparator(&fList, &fMonitor, fDirectory.Path(), listener, interval, &fPlatform)
+          fPreparator(&fList, &fMonitor, fDirectory.Path(), listener, interval, &fPlatform, maxNumRecords)
     {
     }
 

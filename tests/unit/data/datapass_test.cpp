@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <limits>
+#include <tuple>
 
 using MCMV::gMissingValue;
 
@@ -152,6 +153,25 @@ TEST(DataPass, SourcesWithoutAnAcceptedRecord)
         BINDataPreparatorPeer preparator(FullList());
         EXPECT_EQ(kNoRecords, preparator->PrepareData(&source));
         EXPECT_EQ(kNoRecords, preparator->GetStatus());
+    }
+}
+
+TEST(DataPass, MoreRecordsThanCanBeCountedAreNoMemory)
+{
+    constexpr unsigned int kMaxNumRecords = 2;
+    for (const auto& [weights, code, numRead] : {std::tuple<std::vector<double>, int, int>{{1, 0, 2}, 0, 3},
+                                                 {{1, 0, 2, 1, 1}, MCBinning::BINStatusOutOfMemory, 4}})
+    {
+        BINDataPreparatorPeer preparator(AVarList().WithWeight().WithAttribute("x"), nullptr, 0, nullptr,
+                                         kMaxNumRecords);
+        RecordTable source;
+        for (const double weight : weights) source.Add({weight, 1}); // a weight of 0 counts nowhere
+
+        const MCBinning::MCStatus status = preparator->PrepareData(&source);
+
+        EXPECT_EQ(code, status.IsError() ? status.GetErrorCode() : 0);
+        EXPECT_EQ(numRead, source.fNumNext);
+        EXPECT_EQ(kMaxNumRecords, preparator->GetNumRecords());
     }
 }
 
