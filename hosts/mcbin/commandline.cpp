@@ -4,6 +4,8 @@
 #include "numbers.h"
 #include "text.h"
 
+#include "bins/tempdirectory.h"
+
 #include <mcobnqrt/binfactory.h>
 #include <mcobnqrt/binsettings.h>
 #include <mcobnqrt/binvarlist.h>
@@ -175,10 +177,23 @@ void AddSettings(CLI::App& command, SettingOptions& settings)
     command
         .add_option_function<std::string>(
             "--temp-dir", [&settings](const std::string& directory) { settings.tempDirectory = directory; },
-            "Where the temporary files go, which hold all records; the system's directory if not given")
+            "Where the temporary files go, which hold all records; the directory in TMPDIR, else /tmp, if not given")
         ->check(MakeNameCheck())
         ->option_text("DIR")
         ->group("Settings");
+}
+
+/// A temporary directory that can't be used ends the tool as any other wrong use of it does.
+void SettleTempDirectory(SettingOptions& settings)
+{
+    try
+    {
+        settings.tempDirectory = ChooseTempDirectory(settings.tempDirectory, "--temp-dir");
+    }
+    catch (const TempDirectoryUnusable& error)
+    {
+        throw CLI::ValidationError(error.what());
+    }
 }
 
 void AddOutput(CLI::App& command, OutputOptions& output)
@@ -259,6 +274,7 @@ void AddSupervised(CLI::App& app, Request& request)
                 throw CLI::RequiredError("--target, or --pairs,");
             request.command = Request::Command::kSupervised;
             request.bin.settings.method = Method::kSupervised;
+            SettleTempDirectory(request.bin.settings);
             if (request.bin.settings.bins == 0)
                 request.bin.settings.bins = kPreBins;
         });
@@ -283,6 +299,7 @@ void AddEqualFrequency(CLI::App& app, Request& request)
         {
             request.command = Request::Command::kEqualFrequency;
             request.bin.settings.method = Method::kEqualFrequency;
+            SettleTempDirectory(request.bin.settings);
             if (request.bin.settings.bins == 0)
                 request.bin.settings.bins = kUsualBins;
         });

@@ -3,10 +3,11 @@
 #include "failure.h"
 #include "interrupt.h"
 
+#include <mcobnqrt/binsettings.h>
+
 #include <array>
 #include <cerrno>
 #include <cstring>
-#include <filesystem>
 #include <utility>
 
 #include <stdlib.h>
@@ -29,10 +30,7 @@ std::FILE* Open(const std::string& path)
 
 std::FILE* OpenNameless(const std::string& directory)
 {
-    std::error_code error;
-    std::string folder = directory.empty() ? std::filesystem::temp_directory_path(error).string() : directory;
-    if (error)
-        folder = "/tmp";
+    const std::string folder = directory.empty() ? BINSettings().GetTempDirName() : directory;
     std::string path = folder + "/mcbin-XXXXXX";
     const int descriptor = mkstemp(path.data());
     if (descriptor < 0)

@@ -16,7 +16,7 @@ public:
 
     /// Makes sure that it can be rewound: what is no regular file, such as a pipe, is copied to a file in `directory`
     /// that no other process can open and that has no name, so that it can't stay behind. An empty `directory` stands
-    /// for the system's. Only to be called before anything is read.
+    /// for the library's default. Only to be called before anything is read.
     void MakeRewindable(const std::string& directory);
 
     /// Fills `buffer` unless the file ends before, and gives the number of bytes. \throw Interrupted if the file ends

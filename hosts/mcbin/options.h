@@ -40,7 +40,7 @@ struct SettingOptions
     int distinctThreshold = -1; ///< supervised only; below 0 for never
     bool isRightClosed = true;
     double smallBins = 0.0;    ///< supervised only; from 0 to 1
-    std::string tempDirectory; ///< empty for the system's
+    std::string tempDirectory; ///< empty for the library's default
 };
 
 enum class Format

@@ -15,7 +15,7 @@ struct TableOptions
     std::string file;           ///< "-" for standard input
     char delimiter = '\0';      ///< '\0' for finding it
     bool isReadTwice = false;   ///< or more often: Rewind() will be called
-    std::string spoolDirectory; ///< for a copy of what can't be read twice by itself; empty for the system's
+    std::string spoolDirectory; ///< for a copy of what can't be read twice by itself; empty for the library's default
 };
 
 /// Reads a table: a delimited file whose first row names the columns, and whose every other row has a field for each of

@@ -12,6 +12,8 @@ MISSING: float
 _Status = tuple[int, str, tuple[int, int, int], tuple[float, float, float]]
 _Outcome = tuple[_Status, list[dict[str, Any]], int, str]
 
+def temp_directory(named: str) -> str: ...
+
 class Table:
     @staticmethod
     def from_stream(stream: object, explain: Callable[[str], str] | None = None) -> Table: ...

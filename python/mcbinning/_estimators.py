@@ -20,7 +20,7 @@ from ._errors import BinningError, DataError
 from ._outcome import make_result
 from ._progress import Progress, reporting
 from ._result import BinningResult, Settings, Variable
-from ._settings import check_settings
+from ._settings import check_settings, directory_of
 from ._sources import Source
 from ._opening import is_table, open_source
 from ._types import Closed, Encode, Method, MissingOutput
@@ -106,9 +106,6 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
 
     def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> Any:
         raise NotImplementedError
-
-    def _temp_dir(self) -> str:
-        return "" if self.temp_dir is None else os.fspath(self.temp_dir)
 
     def _open(self, X: Any, reset: bool) -> tuple[_core.Feed, list[Variable], int | None]:
         """A feed of the columns of `X`, read where they lie; and how many rows there are, if that is known."""
@@ -218,7 +215,7 @@ class SupervisedBinner(_Binner):
         Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
         stays missing.
     temp_dir : path, default=None
-        The directory of the temporary files, 8 bytes for each row and feature. None: the system's.
+        The directory of the temporary files, 8 bytes for each row and feature. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
         Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
         number of records read or the index of the feature that is done.
@@ -296,7 +293,7 @@ class SupervisedBinner(_Binner):
             max_distinct=self.max_distinct or 0,
             small_bin_ratio=self.small_bin_ratio,
             right_closed=self.closed == "right",
-            temp_dir=self._temp_dir(),
+            temp_dir=directory_of(self.temp_dir),
             progress=report,
         )
 
@@ -316,7 +313,7 @@ class EqualFrequencyBinner(_Binner):
         Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
         stays missing.
     temp_dir : path, default=None
-        The directory of the temporary files, 8 bytes for each row and feature. None: the system's.
+        The directory of the temporary files, 8 bytes for each row and feature. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
         Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
         number of records read or the index of the feature that is done.
@@ -376,7 +373,7 @@ class EqualFrequencyBinner(_Binner):
             attributes,
             n_bins=self.n_bins,
             right_closed=self.closed == "right",
-            temp_dir=self._temp_dir(),
+            temp_dir=directory_of(self.temp_dir),
             progress=report,
         )
 

@@ -74,7 +74,7 @@ def supervised_bins(
         what the machine has. One batch of the columns that are read has to fit: of Parquet a page of each column, of
         CSV some 100 MB. The library itself takes 16 bytes for each row, twice while it sorts. Only with a path.
     temp_dir : path, default=None
-        The directory of the temporary files, 8 bytes for each row and column. None: the system's.
+        The directory of the temporary files, 8 bytes for each row and column. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
         Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
         number of records read or the index of the variable that is done.
@@ -184,7 +184,7 @@ def equal_frequency_bins(
         The most memory that the reading of a file may take, in bytes, or as a text such as "512MB" or "2GiB". None:
         what the machine has. Only with a path; see `supervised_bins`.
     temp_dir : path, default=None
-        The directory of the temporary files, 8 bytes for each row and column. None: the system's.
+        The directory of the temporary files, 8 bytes for each row and column. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
         Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
         number of records read or the index of the variable that is done.

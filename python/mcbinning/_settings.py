@@ -4,8 +4,11 @@ from __future__ import annotations
 
 import numbers
 import os
-import tempfile
 from typing import Any
+
+from . import _core
+from ._errors import BinningError
+from ._status import TEMP_DIR_NOT_FOUND, Status
 
 _LARGEST_INT = 2**31 - 1
 
@@ -28,4 +31,8 @@ def _check_whole(name: str, value: Any, least: int) -> None:
 
 
 def directory_of(temp_dir: str | os.PathLike[str] | None) -> str:
-    return os.fspath(temp_dir) if temp_dir is not None else tempfile.gettempdir()
+    """The directory for temporary files. Refuses a TMPDIR that is set and can't be used."""
+    try:
+        return _core.temp_directory("" if temp_dir is None else os.fspath(temp_dir))
+    except RuntimeError as error:
+        raise BinningError(Status(TEMP_DIR_NOT_FOUND, "error"), str(error)) from None

@@ -9,6 +9,7 @@ from typing import cast
 from ._types import Severity
 
 CANCELLED = 1
+TEMP_DIR_NOT_FOUND = 120001
 BAD_BIN_TABLE = 120002
 NO_RECORDS = 120004
 SINGLE_VALUE = 120014
@@ -20,7 +21,7 @@ NO_EF_CUT_POINTS = 120019
 _WORDS = {
     CANCELLED: "cancelled",
     3: "out of memory",
-    120001: "the directory for temporary files does not exist, or no file can be made in it",
+    TEMP_DIR_NOT_FOUND: "the directory for temporary files does not exist, or no file can be made in it",
     BAD_BIN_TABLE: "the values lie outside all bins",
     120003: "these variables cannot be analysed: there is no attribute, or one has fewer than 2 categories or no role",
     NO_RECORDS: "there is no record of positive weight",

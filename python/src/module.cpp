@@ -7,6 +7,8 @@
 #include "spool.h"
 #include "tableblocks.h"
 
+#include "bins/tempdirectory.h"
+
 #include <mcobnqrt/mcobnqrt.h>
 
 #include <nanobind/nanobind.h>
@@ -395,6 +397,8 @@ NB_MODULE(_core, module)
 {
     nb::register_exception_translator(TranslateFaults);
     module.attr("MISSING") = MCMV::gMissingValue;
+    // Raises a RuntimeError, with words for the user, where TMPDIR is set and can't be used.
+    module.def("temp_directory", [](const std::string& named) { return ChooseTempDirectory(named, "temp_dir="); });
 
     nb::class_<Table>(module, "Table")
         .def_static(

@@ -170,6 +170,30 @@ TEST_F(McbinFaults, ADirectoryThatTakesNoFilesIsAFailureInWords)
     }
 }
 
+TEST_F(McbinFaults, ATmpdirThatCannotBeUsedIsRefusedUnlessADirectoryIsNamed)
+{
+    Write("data.csv", "x,y\n1,a\n2,a\n3,b\n4,b\n");
+    Write("file", "");
+    for (const char* command : {"supervised data.csv --target y", "equal-frequency data.csv"})
+    {
+        for (const char* directory : {"nowhere", "file", "file/below"})
+        {
+            const std::string call = "export TMPDIR=" + std::string(directory) + "; mcbin " + command;
+            const Outcome refused = Shell(call);
+            EXPECT_EQ(2, refused.exitCode);
+            EXPECT_EQ("", refused.out);
+            EXPECT_EQ("mcbin: TMPDIR is " + std::string(directory) +
+                          ", which is no directory that files can be made in; set it to one, unset it, or give "
+                          "--temp-dir\nRun 'mcbin --help' for more information.\n",
+                      refused.err);
+            EXPECT_EQ(0, Shell(call + " --temp-dir .").exitCode);
+            EXPECT_EQ(0, Shell(call + " --help").exitCode);
+        }
+        EXPECT_EQ(0, Shell(std::string("export TMPDIR=$PWD//; mcbin ") + command).exitCode);
+    }
+    EXPECT_EQ(4u, fData.FileNames().size()) << "data.csv, file, out and err";
+}
+
 TEST_F(McbinFaults, ADirectoryThatMayOnlyBeReadIsAFailureInWords)
 {
     const std::string locked = fData.File("locked");

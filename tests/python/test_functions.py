@@ -279,6 +279,24 @@ def test_bad_data_are_refused_with_column_and_row(data, options, error, message)
             run(source, **options)
 
 
+def test_a_tmpdir_that_cannot_be_used_is_refused_unless_a_directory_is_named(monkeypatch, tmp_path):
+    monkeypatch.setenv("TMPDIR", str(tmp_path / "nowhere"))
+    x = [[1.0], [2.0], [3.0], [4.0]]
+    table = pa.table({"x": [1.0, 2.0, 3.0, 4.0], "y": ["a", "a", "b", "b"]})
+
+    for run in (
+        lambda **options: mb.equal_frequency_bins(table, **options),
+        lambda **options: mb.supervised_bins(table, "y", **options),
+        lambda **options: mb.EqualFrequencyBinner(n_bins=2, **options).fit(x),
+        lambda **options: mb.SupervisedBinner(**options).fit(x, [0, 0, 1, 1]),
+    ):
+        with pytest.raises(mb.BinningError, match="TMPDIR is .*nowhere.* or give temp_dir=") as refused:
+            run()
+        assert refused.value.status.code == 120001
+        run(temp_dir=tmp_path)
+    assert list(tmp_path.iterdir()) == []
+
+
 def test_a_path_or_a_frame_that_cannot_be_read_says_why(tmp_path):
     (tmp_path / "broken.parquet").write_text("no such thing")
     (tmp_path / "late.csv").write_text("x\n" + "1\n" * 30_000 + "oops\n")
