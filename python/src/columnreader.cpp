@@ -1,9 +1,12 @@
 #include "columnreader.h"
 
+#include "faults.h"
+
 #include <mcobnqrt/mccommon.h>
 
 #include <cmath>
 #include <cstring>
+#include <string>
 #include <utility>
 #include <vector>
 
@@ -143,7 +146,7 @@ public:
         for (std::size_t i = 0; i < count; ++i)
         {
             if (values[i] != gMissingValue)
-                values[i] = fValues.at(static_cast<std::size_t>(values[i]));
+                values[i] = fValues[CheckPlace(values[i], fValues.size())];
         }
     }
 
@@ -276,4 +279,11 @@ std::unique_ptr<ColumnReader> MakeReader(const ArrowArray& array, const ColumnTy
 std::unique_ptr<ColumnReader> MakePlaceReader(const ArrowArray& array, const ColumnType& type, std::int64_t offset)
 {
     return MakePlainReader(array, type.indexStorage, 1.0, 1.0, offset);
+}
+
+std::size_t CheckPlace(double place, std::size_t size)
+{
+    if (!(place >= 0.0 && place < static_cast<double>(size)))
+        throw DataFault("an index points outside of its dictionary of " + std::to_string(size) + " values");
+    return static_cast<std::size_t>(place);
 }

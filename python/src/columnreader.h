@@ -53,4 +53,8 @@ std::unique_ptr<ColumnReader> MakeReader(const ArrowArray& array, const ColumnTy
 /// Reads not the values of a dictionary's column but their places in the dictionary.
 std::unique_ptr<ColumnReader> MakePlaceReader(const ArrowArray& array, const ColumnType& type, std::int64_t offset);
 
+/// The place as an index of a dictionary of `size` values. \throw DataFault if it has none there: not every producer
+/// looks.
+std::size_t CheckPlace(double place, std::size_t size);
+
 #endif

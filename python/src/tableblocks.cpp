@@ -178,14 +178,14 @@ public:
         {
             values[i] = values[i] == gMissingValue
                             ? kMissingCode
-                            : Encode(static_cast<std::size_t>(values[i]), row + static_cast<std::int64_t>(i));
+                            : Encode(CheckPlace(values[i], fCodes.size()), row + static_cast<std::int64_t>(i));
         }
     }
 
 private:
     double Encode(std::size_t place, std::int64_t row)
     {
-        double& code = fCodes.at(place);
+        double& code = fCodes[place];
         if (code == gMissingValue)
             code = EncodeText(fVariable, fTexts.At(place), row);
         return code;
