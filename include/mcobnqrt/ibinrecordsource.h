@@ -20,10 +20,12 @@ class Record;
 ///     frequency weight                  the weight as it is in the data; rounding is done by the library
 ///
 /// In each of them MCMV::gMissingValue stands for no value, and so do a field that the record doesn't have and, in a
-/// continuous field, a NaN. Infinities are values. Of a code the whole part counts; one that is not from 0 to 255, or
-/// not below the declared number of categories, takes its variable out of the analysis, and the variable's results say
-/// so. User-missing values of a continuous variable and of the weight are given as they are: the library knows them
-/// from the list. A record whose weight is missing or not above 0 counts nowhere.
+/// continuous field, a NaN. Infinities are values. Of a code the whole part counts. One that is not from 0 to 255 takes
+/// its variable out of the analysis, and the variable's results say so; one that is not below the declared number of
+/// categories does that where the variable is the target of a result. The field of the list's target is read as a code
+/// even if that role was given to a continuous variable. User-missing values of a continuous variable and of the weight
+/// are given as they are: the library knows them from the list. A record whose weight is missing or not above 0 counts
+/// nowhere.
 class MCOBNQRT_EXPORT IBINRecordSource
 {
 public:
