@@ -2,6 +2,7 @@
 
 #include "batches.h"
 #include "calls.h"
+#include "capsules.h"
 #include "faults.h"
 #include "runs.h"
 #include "spool.h"

@@ -1,4 +1,4 @@
-#include "batches.h"
+#include "capsules.h"
 
 #include "faults.h"
 
