@@ -1,9 +1,9 @@
 #ifndef MCOBNQRT_BINCATVAR_H
 #define MCOBNQRT_BINCATVAR_H
 
+#include <mcobnqrt/binvariable.h>
 #include <mcobnqrt/export.h>
 #include <mcobnqrt/ibinencoder.h>
-#include <mcobnqrt/ibinvariable.h>
 
 #include <iosfwd>
 #include <memory>
@@ -11,7 +11,7 @@
 
 /// A categorical variable. Its categories live in its encoder, and with them its user-missing values; the number of
 /// categories that was declared lives beside it and need not agree.
-class MCOBNQRT_EXPORT BINCatVar : public IBINVariable
+class MCOBNQRT_EXPORT BINCatVar : public BINVariable
 {
 public:
     /// With MeasureNumericCategorical the variable has a BINCatNumEncoder, with every other level a BINStringEncoder;
@@ -26,12 +26,7 @@ public:
     ~BINCatVar() override;
 
     MeasureLevel GetMeasureLevel() const override;
-    std::string GetVariableName() const override;
-    std::string GetVariableLabel() const override;
-    void SetVariableLabel(const std::string& label) override;
     int GetNumberOfCategories() const override;
-    VariableRole GetVariableRole() const override;
-    void SetVariableRole(VariableRole role) override;
     int UpdateNumberOfCategories() override;
 
     /// Hands the object on to the encoder, whose kind decides which data type is the right one.
@@ -48,9 +43,6 @@ public:
     void SetNumberOfCategories(int numberOfCategories);
 
 private:
-    std::string fName;
-    std::string fLabel;
-    VariableRole fRole;
     int fNCategories;
     MeasureLevel fMeasureLevel;
     std::unique_ptr<IBINEncoder> fEncoder; ///< never null

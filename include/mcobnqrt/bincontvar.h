@@ -1,15 +1,15 @@
 #ifndef MCOBNQRT_BINCONTVAR_H
 #define MCOBNQRT_BINCONTVAR_H
 
+#include <mcobnqrt/binvariable.h>
 #include <mcobnqrt/export.h>
-#include <mcobnqrt/ibinvariable.h>
 
 #include <iosfwd>
 #include <memory>
 #include <string>
 
 /// A continuous variable. It has neither categories nor an encoder.
-class MCOBNQRT_EXPORT BINContVar : public IBINVariable
+class MCOBNQRT_EXPORT BINContVar : public BINVariable
 {
 public:
     BINContVar(const std::string& name, const std::string& label, VariableRole role);
@@ -18,11 +18,6 @@ public:
     ~BINContVar() override;
 
     MeasureLevel GetMeasureLevel() const override;
-    std::string GetVariableName() const override;
-    std::string GetVariableLabel() const override;
-    void SetVariableLabel(const std::string& label) override;
-    VariableRole GetVariableRole() const override;
-    void SetVariableRole(VariableRole role) override;
     int UpdateNumberOfCategories() override;
 
     /// Takes a BINNumericUserMissing.
@@ -38,9 +33,6 @@ private:
     IBINEncoder* GetEncoder() override;
     const IBINEncoder* GetEncoder() const override;
 
-    std::string fName;
-    std::string fLabel;
-    VariableRole fRole;
     std::unique_ptr<IBINUserMissing> fUserMissing; ///< null or a BINNumericUserMissing
 };
 

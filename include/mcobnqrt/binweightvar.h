@@ -2,15 +2,15 @@
 #define MCOBNQRT_BINWEIGHTVAR_H
 
 #include <mcobnqrt/binroundencoder.h>
+#include <mcobnqrt/binvariable.h>
 #include <mcobnqrt/export.h>
-#include <mcobnqrt/ibinvariable.h>
 
 #include <iosfwd>
 #include <memory>
 #include <string>
 
 /// The frequency weight: how many cases a record stands for. Its level and its role are fixed.
-class MCOBNQRT_EXPORT BINWeightVar : public IBINVariable
+class MCOBNQRT_EXPORT BINWeightVar : public BINVariable
 {
 public:
     BINWeightVar(const std::string& name, const std::string& label, BINWRoundingOption option);
@@ -21,12 +21,8 @@ public:
     ~BINWeightVar() override;
 
     MeasureLevel GetMeasureLevel() const override;
-    std::string GetVariableName() const override;
-    std::string GetVariableLabel() const override;
-    void SetVariableLabel(const std::string& label) override;
     int GetNumberOfCategories() const override;
-    VariableRole GetVariableRole() const override;
-    void SetVariableRole(VariableRole role) override;
+    void SetVariableRole(VariableRole role) override; ///< Changes nothing: the role stays RoleFrequencyWeight.
     int UpdateNumberOfCategories() override;
 
     /// Takes a BINNumericUserMissing, which the encoder then borrows.
@@ -40,8 +36,6 @@ public:
     void Display(std::ostream& os) const override;
 
 private:
-    std::string fName;
-    std::string fLabel;
     std::unique_ptr<BINRoundEncoder> fEncoder;     ///< never null
     std::unique_ptr<IBINUserMissing> fUserMissing; ///< null or a BINNumericUserMissing; fEncoder borrows it
 };

@@ -18,6 +18,7 @@
 #include <mcobnqrt/binstringencoder.h>
 #include <mcobnqrt/binstringinterval.h>
 #include <mcobnqrt/binstringusermissing.h>
+#include <mcobnqrt/binvariable.h>
 #include <mcobnqrt/binvarlist.h>
 #include <mcobnqrt/binweightvar.h>
 #include <mcobnqrt/efbinfactory.h>

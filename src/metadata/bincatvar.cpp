@@ -4,7 +4,6 @@
 #include <mcobnqrt/binstringencoder.h>
 
 #include "metadata/metadataprinters.h"
-#include "metadata/nameindex.h"
 #include "metadata/ownership.h"
 
 #include <ostream>
@@ -23,14 +22,14 @@ std::unique_ptr<IBINEncoder> MakeEncoder(IBINVariable::MeasureLevel level, int e
 
 BINCatVar::BINCatVar(const std::string& name, const std::string& label, int numberOfCategories, MeasureLevel level,
                      VariableRole role)
-    : fName(name), fLabel(label), fRole(role), fNCategories(numberOfCategories), fMeasureLevel(level),
+    : BINVariable(name, label, role), fNCategories(numberOfCategories), fMeasureLevel(level),
       fEncoder(MakeEncoder(level, numberOfCategories))
 {
 }
 
 BINCatVar::BINCatVar(const BINCatVar& other)
-    : IBINVariable(other), fName(other.fName), fLabel(other.fLabel), fRole(other.fRole),
-      fNCategories(other.fNCategories), fMeasureLevel(other.fMeasureLevel), fEncoder(CloneOf(other.fEncoder))
+    : BINVariable(other), fNCategories(other.fNCategories), fMeasureLevel(other.fMeasureLevel),
+      fEncoder(CloneOf(other.fEncoder))
 {
 }
 
@@ -40,11 +39,7 @@ BINCatVar& BINCatVar::operator=(const BINCatVar& other)
         return *this;
     // Copied first: what can fail must not leave a mixture of two variables.
     BINCatVar copy(other);
-    if (fName != copy.fName)
-        NoteNameChange();
-    fName.swap(copy.fName);
-    fLabel.swap(copy.fLabel);
-    fRole = copy.fRole;
+    SwapVariable(copy);
     fNCategories = copy.fNCategories;
     fMeasureLevel = copy.fMeasureLevel;
     fEncoder.swap(copy.fEncoder);
@@ -58,34 +53,9 @@ IBINVariable::MeasureLevel BINCatVar::GetMeasureLevel() const
     return fMeasureLevel;
 }
 
-std::string BINCatVar::GetVariableName() const
-{
-    return fName;
-}
-
-std::string BINCatVar::GetVariableLabel() const
-{
-    return fLabel;
-}
-
-void BINCatVar::SetVariableLabel(const std::string& label)
-{
-    fLabel = label;
-}
-
 int BINCatVar::GetNumberOfCategories() const
 {
     return fNCategories;
-}
-
-IBINVariable::VariableRole BINCatVar::GetVariableRole() const
-{
-    return fRole;
-}
-
-void BINCatVar::SetVariableRole(VariableRole role)
-{
-    fRole = role;
 }
 
 int BINCatVar::UpdateNumberOfCategories()
@@ -130,8 +100,8 @@ IBINVariable::VarStatus BINCatVar::GetVarStatus()
 
 void BINCatVar::Display(std::ostream& os) const
 {
-    os << "Categorical variable: name = " << fName << ", label = " << fLabel << ", role = ";
-    DisplayVariableRole(os, fRole);
+    os << "Categorical variable: name = " << GetVariableName() << ", label = " << GetVariableLabel() << ", role = ";
+    DisplayVariableRole(os, GetVariableRole());
     os << "\tMeasurement Level = ";
     DisplayMeasureLevel(os, fMeasureLevel);
     os << "\tNumber of Categories = " << fNCategories << std::endl;

@@ -3,21 +3,16 @@
 #include <mcobnqrt/ibinusermissing.h>
 
 #include "metadata/metadataprinters.h"
-#include "metadata/nameindex.h"
 #include "metadata/ownership.h"
 
 #include <ostream>
 
 BINContVar::BINContVar(const std::string& name, const std::string& label, VariableRole role)
-    : fName(name), fLabel(label), fRole(role)
+    : BINVariable(name, label, role)
 {
 }
 
-BINContVar::BINContVar(const BINContVar& other)
-    : IBINVariable(other), fName(other.fName), fLabel(other.fLabel), fRole(other.fRole),
-      fUserMissing(CloneOf(other.fUserMissing))
-{
-}
+BINContVar::BINContVar(const BINContVar& other) : BINVariable(other), fUserMissing(CloneOf(other.fUserMissing)) {}
 
 BINContVar& BINContVar::operator=(const BINContVar& other)
 {
@@ -25,11 +20,7 @@ BINContVar& BINContVar::operator=(const BINContVar& other)
         return *this;
     // Copied first: what can fail must not leave a mixture of two variables.
     BINContVar copy(other);
-    if (fName != copy.fName)
-        NoteNameChange();
-    fName.swap(copy.fName);
-    fLabel.swap(copy.fLabel);
-    fRole = copy.fRole;
+    SwapVariable(copy);
     fUserMissing.swap(copy.fUserMissing);
     return *this;
 }
@@ -39,31 +30,6 @@ BINContVar::~BINContVar() = default;
 IBINVariable::MeasureLevel BINContVar::GetMeasureLevel() const
 {
     return MeasureContinuous;
-}
-
-std::string BINContVar::GetVariableName() const
-{
-    return fName;
-}
-
-std::string BINContVar::GetVariableLabel() const
-{
-    return fLabel;
-}
-
-void BINContVar::SetVariableLabel(const std::string& label)
-{
-    fLabel = label;
-}
-
-IBINVariable::VariableRole BINContVar::GetVariableRole() const
-{
-    return fRole;
-}
-
-void BINContVar::SetVariableRole(VariableRole role)
-{
-    fRole = role;
 }
 
 int BINContVar::UpdateNumberOfCategories()
@@ -93,8 +59,8 @@ IBINVariable::VarStatus BINContVar::GetVarStatus()
 
 void BINContVar::Display(std::ostream& os) const
 {
-    os << "Continuous variable: name = " << fName << ", label = " << fLabel << ", role = ";
-    DisplayVariableRole(os, fRole);
+    os << "Continuous variable: name = " << GetVariableName() << ", label = " << GetVariableLabel() << ", role = ";
+    DisplayVariableRole(os, GetVariableRole());
 }
 
 int BINContVar::GetNumberOfCategories() const

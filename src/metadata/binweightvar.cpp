@@ -2,19 +2,18 @@
 
 #include <mcobnqrt/ibinusermissing.h>
 
-#include "metadata/nameindex.h"
 #include "metadata/ownership.h"
 
 #include <ostream>
 
 BINWeightVar::BINWeightVar(const std::string& name, const std::string& label, BINWRoundingOption option)
-    : fName(name), fLabel(label), fEncoder(std::make_unique<BINRoundEncoder>(option))
+    : BINVariable(name, label, RoleFrequencyWeight), fEncoder(std::make_unique<BINRoundEncoder>(option))
 {
 }
 
 BINWeightVar::BINWeightVar(const BINWeightVar& other)
-    : IBINVariable(other), fName(other.fName), fLabel(other.fLabel),
-      fEncoder(std::make_unique<BINRoundEncoder>(*other.fEncoder)), fUserMissing(CloneOf(other.fUserMissing))
+    : BINVariable(other), fEncoder(std::make_unique<BINRoundEncoder>(*other.fEncoder)),
+      fUserMissing(CloneOf(other.fUserMissing))
 {
     // The copied encoder still borrows from the source.
     fEncoder->SetUserMissingInfo(fUserMissing.get());
@@ -26,10 +25,7 @@ BINWeightVar& BINWeightVar::operator=(const BINWeightVar& other)
         return *this;
     // Copied first: what can fail must not leave a mixture of two variables.
     BINWeightVar copy(other);
-    if (fName != copy.fName)
-        NoteNameChange();
-    fName.swap(copy.fName);
-    fLabel.swap(copy.fLabel);
+    SwapVariable(copy);
     fUserMissing.swap(copy.fUserMissing);
     *fEncoder = *copy.fEncoder; // borrows what is now this object's
     return *this;
@@ -42,29 +38,9 @@ IBINVariable::MeasureLevel BINWeightVar::GetMeasureLevel() const
     return MeasureFrequencyWeight;
 }
 
-std::string BINWeightVar::GetVariableName() const
-{
-    return fName;
-}
-
-std::string BINWeightVar::GetVariableLabel() const
-{
-    return fLabel;
-}
-
-void BINWeightVar::SetVariableLabel(const std::string& label)
-{
-    fLabel = label;
-}
-
 int BINWeightVar::GetNumberOfCategories() const
 {
     return 0;
-}
-
-IBINVariable::VariableRole BINWeightVar::GetVariableRole() const
-{
-    return RoleFrequencyWeight;
 }
 
 void BINWeightVar::SetVariableRole(VariableRole) {}
@@ -107,7 +83,7 @@ IBINVariable::VarStatus BINWeightVar::GetVarStatus()
 
 void BINWeightVar::Display(std::ostream& os) const
 {
-    os << "Frequency weight variable: name = " << fName << ", label = " << fLabel << std::endl;
+    os << "Frequency weight variable: name = " << GetVariableName() << ", label = " << GetVariableLabel() << std::endl;
     fEncoder->Display(os);
     if (fUserMissing)
         fUserMissing->Display(os);

@@ -18,6 +18,7 @@ set(exportedClasses
     BINStringInterval
     BINStringUserMissing
     BINVarList
+    BINVariable
     BINWeightVar
     EFBINFactory
     EFBINOutput
