@@ -4,19 +4,24 @@
 #include "workloads.h"
 
 #include "base/bincancelmonitor.h"
-#include "binning/binalgorithm.h"
 #include "binning/binefpreprocess.h"
+#include "binning/celltable.h"
 #include "binning/cutscan.h"
+#include "binning/entropysplit.h"
 #include "data/binattributereader.h"
 #include "data/bindatapreparator.h"
+#include "data/tally.h"
 #include "data/tuplesort.h"
 #include "support/tempdir.h"
+
+#include <mcobnqrt/binoutput.h>
 
 #include <benchmark/benchmark.h>
 
 #include <algorithm>
 #include <cmath>
 #include <map>
+#include <set>
 
 namespace
 {
@@ -25,75 +30,57 @@ constexpr std::size_t kMillion = 1000000;
 constexpr int kTarget = 0;
 constexpr int kAttribute = 1;
 
-} // namespace
-
-class BINAttributeReaderPeer
+/// One informative attribute from the records to its value table, in single steps that can be done again.
+class BinnedAttribute
 {
 public:
-    static void Load(BINAttributeReader& reader) { reader.LoadVariable(kAttribute); }
-};
-
-/// A supervised algorithm that has binned one informative attribute, and the single steps of that work, to be done
-/// again.
-class BINAlgorithmPeer
-{
-public:
-    BINAlgorithmPeer(std::size_t numRecords, int numCategories)
-        : fWorkload(MakeContinuous(numRecords, {1.0}, numCategories)), fAlgorithm(Settings(), ListOf(fWorkload))
+    BinnedAttribute(std::size_t numRecords, int numCategories)
+        : fWorkload(MakeContinuous(numRecords, {1.0}, numCategories)), fList(ListOf(fWorkload)), fSource(fWorkload),
+          fPreparator(&fList, &fMonitor, fDirectory.Path(), nullptr, 0),
+          fReader(&fSource, &fPreparator, TupleKind::kWithTarget)
     {
-        ColumnSource source(fWorkload);
-        fAlgorithm.Run(&source, nullptr, nullptr);
+        fReader.ReadRecords();
+        Load();
         Tally();
     }
 
-    /// Leaves the tuples unsorted: after it nothing else can be done again.
-    void Load() { BINAttributeReaderPeer::Load(*fAlgorithm.fAttributeReader); }
+    void Load() { fReader.GetAttributeTargetData(kAttribute, kTarget, &fTuples); }
 
     void Tally()
     {
         fValues.clear();
-        fAlgorithm.TallyDistinct(*fAlgorithm.fTuples, fValues, fTable);
+        TallyDistinct(*fTuples, fReader.GetNumTuples(), fReader.GetNumDistinct(), fReader.GetNumTargetCats(), fValues,
+                      fTable);
     }
 
     std::size_t Split() const
     {
         std::set<double> cutPoints;
-        fAlgorithm.FindCutPoints(&fValues, &fTable, 0, static_cast<int>(fValues.size()) - 1, cutPoints);
+        FindCutPoints(fValues, fTable, fReader.GetNumTargetCats(), true, 0, static_cast<int>(fValues.size()) - 1,
+                      cutPoints);
         return cutPoints.size();
-    }
-
-    void MergeSmallBins(std::vector<double>& cells, std::set<double>& cutPoints) const
-    {
-        fAlgorithm.MergeSmallBins(cells, cutPoints);
     }
 
     const std::vector<double>& Table() const { return fTable; }
     std::size_t NumRows() const { return fValues.size(); }
 
 private:
-    BINSettings Settings() const
-    {
-        BINSettings settings;
-        settings.SetNumberOfBins(10);
-        settings.SetSmallBinDetectionThreshold(0.5);
-        settings.SetTempDirName(fDirectory.Path());
-        return settings;
-    }
-
-    TempDir fDirectory; // first in, last out: the algorithm removes its files
+    TempDir fDirectory; // first in, last out: the preparator removes its files
     Workload fWorkload;
-    BINAlgorithm fAlgorithm;
+    BINVarList fList;
+    ColumnSource fSource;
+    BINCancelMonitor fMonitor{nullptr};
+    BINDataPreparator fPreparator;
+    BINAttributeReader fReader;
+    std::vector<BINSortTuple>* fTuples = nullptr; ///< the reader's
     std::vector<double> fValues;
     std::vector<double> fTable;
 };
 
-namespace
-{
-
 /// Made once for each shape: the library calls a benchmark several times, until it has run for long enough.
-BINAlgorithmPeer& Binned(std::size_t numRecords, int numCategories)
+BinnedAttribute& Binned(std::size_t numRecords, int numCategories)
 {
-    static std::map<std::pair<std::size_t, int>, BINAlgorithmPeer> made;
+    static std::map<std::pair<std::size_t, int>, BinnedAttribute> made;
     return made.try_emplace({numRecords, numCategories}, numRecords, numCategories).first->second;
 }
 
@@ -118,9 +105,10 @@ void Pass(benchmark::State& state)
 }
 BENCHMARK(Pass)->Unit(benchmark::kMillisecond);
 
+/// Joins the files and sorts.
 void Load(benchmark::State& state)
 {
-    BINAlgorithmPeer binned(kMillion, 3); // of its own: its tuples are not sorted any more
+    BinnedAttribute& binned = Binned(kMillion, 3);
     while (state.KeepRunning()) binned.Load();
     CountItems(state, kMillion);
 }
@@ -173,7 +161,7 @@ BENCHMARK_SORT(nearlySorted_complete, NearlySorted, TieOrder::kComplete);
 
 void Tally(benchmark::State& state)
 {
-    BINAlgorithmPeer& binned = Binned(kMillion, 3);
+    BinnedAttribute& binned = Binned(kMillion, 3);
     while (state.KeepRunning()) binned.Tally();
     CountItems(state, kMillion);
 }
@@ -182,7 +170,7 @@ BENCHMARK(Tally)->Unit(benchmark::kMillisecond);
 /// The first range of a split, with what a scan prepares once for a table.
 void Scan(benchmark::State& state, std::size_t numRecords, int numCategories, bool isWhole)
 {
-    const BINAlgorithmPeer& binned = Binned(numRecords, numCategories);
+    const BinnedAttribute& binned = Binned(numRecords, numCategories);
     std::vector<double> table = binned.Table();
     Numbers numbers(3);
     for (double& cell : table) cell *= isWhole ? 1.0 : 0.5 + numbers.Uniform();
@@ -204,7 +192,7 @@ BENCHMARK_CAPTURE(Scan, fractional_K20, kMillion / 5, 20, false)->Unit(benchmark
 
 void Split(benchmark::State& state, std::size_t numRecords, int numCategories)
 {
-    const BINAlgorithmPeer& binned = Binned(numRecords, numCategories);
+    const BinnedAttribute& binned = Binned(numRecords, numCategories);
     while (state.KeepRunning()) state.counters["cutPoints"] = static_cast<double>(binned.Split());
     CountItems(state, binned.NumRows());
 }
@@ -252,14 +240,13 @@ std::set<double> CutPointsOf(std::size_t numBins)
 void Merge(benchmark::State& state)
 {
     const auto numBins = static_cast<std::size_t>(state.range(0));
-    const BINAlgorithmPeer& binned = Binned(kMillion / 100, 3);
     while (state.KeepRunning())
     {
         state.PauseTiming();
         std::vector<double> cells = CellsOf(numBins);
         std::set<double> cutPoints = CutPointsOf(numBins);
         state.ResumeTiming();
-        binned.MergeSmallBins(cells, cutPoints);
+        MergeSmallBins(0.5, 3, cells, cutPoints);
     }
     CountItems(state, numBins);
 }

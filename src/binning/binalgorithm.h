@@ -16,9 +16,9 @@ class BINEFPreProcess;
 /// The driver of supervised runs: has the records read once, takes each pair of attribute and target in turn, has its
 /// cut points found, and stores what was found.
 ///
-/// The run is in binalgorithm.cpp, the bins of one attribute are in attributebinning.cpp, and the split that finds the
-/// cut points is in entropysplit.cpp, with the search of one range in CutScan. These shapes, all of doubles, go through
-/// the last two, K being the number of the target's categories:
+/// The run is in binalgorithm.cpp and the steps from the tuples of one pair to its bins are in attributebinning.cpp.
+/// What these steps work out is in functions: the tallies in tally.h, the cut points in entropysplit.h, the bins in
+/// celltable.h. These shapes, all of doubles, go through them, K being the number of the target's categories:
 ///
 ///     value table   R rows of K cells, one row for each interval of values in rising order: weight by target code
 ///     row values    R borders, one for each row: its right border if that is closed, else its left border
@@ -42,21 +42,17 @@ public:
     MCBinning::MCStatus BinAttributeDirect(const std::vector<BINSortTuple>* tuples, std::set<double>& cutPoints,
                                            std::vector<double>& cells, double& modelEntropy);
 
-    /// The same with the bins of an equal-frequency cut list as rows. The list is worked on in place.
+    /// As BinAttributeDirect, with the bins of an equal-frequency cut list as rows. The list is worked on in place.
     MCBinning::MCStatus BinAttributePreBinned(const std::vector<BINSortTuple>* tuples, std::vector<double>& cuts,
                                               std::set<double>& cutPoints, std::vector<double>& cells,
                                               double& modelEntropy);
 
-    /// Adds the cut points of the rows `first` to `last`, both inclusive, to `cutPoints`.
-    ///
-    /// \return OK, or the error BINStatusBadBinTable, with the set untouched, if there is no table, or it has not one
-    ///         row for each of the row values.
+    /// As the function of that name, with the closed side of the run and the categories of the current pair. Null for
+    /// values or table is the error BINStatusBadBinTable, too.
     MCBinning::MCStatus FindCutPoints(const std::vector<double>* values, const std::vector<double>* table, int first,
                                       int last, std::set<double>& cutPoints) const;
 
 private:
-    friend class BINAlgorithmPeer; // the unit tests' way in
-
     /// What a call of Run is to treat.
     struct Entry
     {
@@ -91,15 +87,8 @@ private:
     void BinTuples(const std::vector<BINSortTuple>* tuples, const BINEFPreProcess& preProcess, PairResult& result);
     void Store(const PairResult& result, int attribute, int target);
 
-    void TallyDistinct(const std::vector<BINSortTuple>& tuples, std::vector<double>& values,
-                       std::vector<double>& table) const;
     MCBinning::MCStatus BinRows(const std::vector<double>& values, const std::vector<double>& table,
                                 std::set<double>& cutPoints, std::vector<double>& cells, double& modelEntropy);
-    void FillCells(const std::vector<double>& values, const std::vector<double>& table,
-                   const std::set<double>& cutPoints, std::vector<double>& cells) const;
-    std::vector<int> FindSmallBins(const std::vector<double>& cells, std::size_t numCutPoints) const;
-    void MergeSmallBins(std::vector<double>& cells, std::set<double>& cutPoints) const;
-    void ComputeModelEntropy(const std::vector<double>& cells, double& modelEntropy) const;
 
     std::size_t NumCategories() const { return fNumTargetCategories; }
 

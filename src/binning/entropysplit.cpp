@@ -8,7 +8,9 @@
 // The order of the additions is part of the result. Logarithms of 0 and of negative numbers, and 0 / 0, are relied on:
 // a NaN compares false, so it never becomes better than what is there, and never passes the test.
 
-#include "binning/binalgorithm.h"
+#include "binning/entropysplit.h"
+
+#include "base/makestatus.h"
 #include "binning/cutscan.h"
 #include "platform/arithmetic.h"
 
@@ -48,15 +50,15 @@ int FindAcceptedCut(CutScan& scan, int first, int last, CountVector& left, Count
 
 } // namespace
 
-MCStatus BINAlgorithm::FindCutPoints(const std::vector<double>* values, const std::vector<double>* table, int first,
-                                     int last, std::set<double>& cutPoints) const
+MCStatus FindCutPoints(const std::vector<double>& values, const std::vector<double>& table, std::size_t numCategories,
+                       bool rightBorderClosed, int first, int last, std::set<double>& cutPoints)
 {
-    if (values == nullptr || table == nullptr || values->size() != table->size() / NumCategories())
+    if (values.size() != table.size() / numCategories)
         return MakeError(MCBinning::BINStatusBadBinTable);
 
-    CutScan scan(*table, NumCategories(), fRightBorderClosed);
-    CountVector left(NumCategories() + 1);
-    CountVector right(NumCategories() + 1);
+    CutScan scan(table, numCategories, rightBorderClosed);
+    CountVector left(numCategories + 1);
+    CountVector right(numCategories + 1);
     std::stack<std::pair<int, int>> ranges;
     ranges.emplace(first, last);
     while (!ranges.empty())
@@ -68,7 +70,7 @@ MCStatus BINAlgorithm::FindCutPoints(const std::vector<double>* values, const st
         const int cut = FindAcceptedCut(scan, rangeFirst, rangeLast, left, right);
         if (cut == CutScan::kNoRow)
             continue;
-        cutPoints.insert((*values)[static_cast<std::size_t>(cut)]);
+        cutPoints.insert(values[static_cast<std::size_t>(cut)]);
         ranges.emplace(scan.LastLeftRow(cut) + 1, rangeLast);
         ranges.emplace(rangeFirst, scan.LastLeftRow(cut)); // all of the left part comes before the right one
     }

@@ -14,22 +14,16 @@ constexpr std::size_t kBlockSize = 8192;
 } // namespace
 
 BinaryRecordIterator::BinaryRecordIterator(const std::string& path, Platform* platform, const FileIdentity* identity)
-    : fBlock(kBlockSize), fFileName(path), fPlatform(platform)
+    : fBlock(kBlockSize), fFile(platform->OpenForReading(path, identity), platform)
 {
-    fFile = fPlatform->OpenForReading(fFileName, identity);
     if (!HasFile())
     {
+        // This is all that the library prints on its own. The text and its missing line end are promised to hosts.
         std::cout << "Error: file handle is NULL in BinaryRecordIterator constructor";
         fRecordStatus = kFailed;
         return;
     }
     fRecordStatus = ReadBlock();
-}
-
-BinaryRecordIterator::~BinaryRecordIterator()
-{
-    if (HasFile())
-        fPlatform->CloseFile(fFile); // nothing was written, so nothing can be lost
 }
 
 bool BinaryRecordIterator::IsOK() const
@@ -62,7 +56,7 @@ int BinaryRecordIterator::Rewind()
 {
     if (!HasFile())
         return fRecordStatus;
-    fRecordStatus = fPlatform->RewindFile(fFile) ? ReadBlock() : kFailed;
+    fRecordStatus = fFile.Rewind() ? ReadBlock() : kFailed;
     return fRecordStatus;
 }
 
@@ -71,10 +65,10 @@ int BinaryRecordIterator::Rewind()
 int BinaryRecordIterator::ReadBlock()
 {
     fNextValue = 0;
-    fBlockSize = fPlatform->ReadDoubles(fBlock.data(), fBlock.size(), fFile);
+    fBlockSize = fFile.ReadDoubles(fBlock.data(), fBlock.size());
     if (fBlockSize > 0)
         return kMoreToCome;
-    return std::feof(fFile) != 0 ? kEndOfFile : kFailed;
+    return fFile.IsAtEnd() ? kEndOfFile : kFailed;
 }
 
 } // namespace MCBinning

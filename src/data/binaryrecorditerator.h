@@ -1,10 +1,9 @@
 #ifndef MCOBNQRT_BINARYRECORDITERATOR_H
 #define MCOBNQRT_BINARYRECORDITERATOR_H
 
-#include "platform/platform.h"
+#include "platform/file.h"
 
 #include <cstddef>
-#include <cstdio>
 #include <string>
 #include <vector>
 
@@ -30,8 +29,6 @@ public:
                                   const FileIdentity* identity = nullptr);
     BinaryRecordIterator(const BinaryRecordIterator&) = delete;
     BinaryRecordIterator& operator=(const BinaryRecordIterator&) = delete;
-    /// Closes the file and leaves it on disk.
-    ~BinaryRecordIterator();
 
     /// Whether Next() still has a value to give.
     bool IsOK() const;
@@ -53,7 +50,7 @@ public:
     int Rewind();
 
     /// Whether the file could be opened.
-    bool HasFile() const { return fFile != nullptr; }
+    bool HasFile() const { return fFile.IsOpen(); }
 
 private:
     int ReadBlock();
@@ -61,10 +58,8 @@ private:
     std::vector<double> fBlock;
     std::size_t fBlockSize = 0; ///< values that the block holds
     std::size_t fNextValue = 0; ///< place in the block of what Next() hands out
-    std::FILE* fFile = nullptr;
+    File fFile;
     int fRecordStatus = kMoreToCome;
-    std::string fFileName;
-    Platform* fPlatform;
 };
 
 } // namespace MCBinning

@@ -3,6 +3,7 @@
 #include "base/exactsums.h"
 #include "base/makestatus.h"
 #include "data/bindatapreparator.h"
+#include "data/tally.h"
 #include "data/tuplesort.h"
 
 #include <mcobnqrt/binvarlist.h>
@@ -68,7 +69,7 @@ MCStatus BINAttributeReader::ReadRecords()
     if (status.IsError())
         return status;
     const BINVarList& list = *fPreparator->GetVarList();
-    fWeightPosition = PositionOf(list.GetWeightIndex());
+    fWeightPosition = fPreparator->GetLayout().PositionOf(list.GetWeightIndex());
     fHasWeight = fWeightPosition >= 0;
     fHasTarget = fTupleKind == TupleKind::kWithTarget;
     fNumRecords = fPreparator->GetNumRecords();
@@ -92,7 +93,7 @@ MCStatus BINAttributeReader::IsVariableUsable(int variable, bool* usable) const
 {
     if (variable < 0)
         return MakeError(MCBinning::BINStatusTargetUnusable);
-    return fPreparator->IsVariableUsable(PositionOf(variable), usable);
+    return fPreparator->IsVariableUsable(fPreparator->GetLayout().PositionOf(variable), usable);
 }
 
 MCStatus BINAttributeReader::GetAttributeTargetData(int attribute, int target, std::vector<BINSortTuple>** tuples)
@@ -104,7 +105,7 @@ MCStatus BINAttributeReader::GetAttributeTargetData(int attribute, int target, s
     if (IsVariableUsable(target, &isUsable).IsError() || !isUsable)
         return MakeError(MCBinning::BINStatusTargetUnusable);
 
-    const int targetPosition = PositionOf(target);
+    const int targetPosition = fPreparator->GetLayout().PositionOf(target);
     fNumTargetCats =
         static_cast<unsigned int>(fPreparator->GetMaxCodes()[static_cast<std::size_t>(targetPosition)]) + 1;
     if (!PutOn(targetPosition, fTargetIterator, fTargetPosition))
@@ -134,32 +135,9 @@ MCStatus BINAttributeReader::GetAttributeData(int attribute, std::vector<BINValu
 MCStatus BINAttributeReader::TallyBins(const std::vector<double>* cuts, bool rightBorderClosed,
                                        std::vector<double>& table) const
 {
-    const MCStatus badTable = MakeWarning(MCBinning::BINStatusBadBinTable);
-    if (cuts == nullptr || cuts->empty())
-        return badTable;
-    const std::size_t numBins = cuts->size() - 1;
-    table.assign(numBins * fNumTargetCats, 0.0);
-    std::size_t bin = 0;
-    for (unsigned int i = 0; i < fNumTuples; ++i)
-    {
-        const BINSortTuple& tuple = (*fTargetTuples)[i];
-        // Asked this way round, so that a border that is not a number belongs to no bin.
-        while (bin < numBins &&
-               !(rightBorderClosed ? tuple.fValue <= (*cuts)[bin + 1] : tuple.fValue < (*cuts)[bin + 1]))
-            ++bin;
-        if (bin == numBins)
-            return badTable;
-        table[bin * fNumTargetCats + tuple.fTargetCode] += tuple.fWeight;
-    }
-    return bin + 1 == numBins ? MCStatus() : badTable;
-}
-
-/// -1 for a variable that there is not.
-int BINAttributeReader::PositionOf(int variable) const
-{
-    const std::vector<int>& positions = fPreparator->GetVariableIndex();
-    const auto index = static_cast<std::size_t>(variable);
-    return variable >= 0 && index < positions.size() ? positions[index] : -1;
+    if (cuts == nullptr)
+        return MakeWarning(MCBinning::BINStatusBadBinTable);
+    return ::TallyBins(*fTargetTuples, fNumTuples, fNumTargetCats, *cuts, rightBorderClosed, table);
 }
 
 std::unique_ptr<BinaryRecordIterator> BINAttributeReader::OpenPosition(int position) const
@@ -184,7 +162,7 @@ bool BINAttributeReader::PutOn(int position, std::unique_ptr<Iterator>& iterator
 
 MCStatus BINAttributeReader::LoadVariable(int attribute)
 {
-    const int position = PositionOf(attribute);
+    const int position = fPreparator->GetLayout().PositionOf(attribute);
     if (position < 0)
         return MakeError(MCBinning::BINStatusIndexOutOfRange);
     if (fPreparator->IsCutShort(position))

@@ -53,15 +53,10 @@ public:
     ///         BINStatusCannotOpenTempFile if a file can't be opened or doesn't hold all records any more.
     MCBinning::MCStatus GetAttributeTargetData(int attribute, int target, std::vector<BINSortTuple>** tuples);
 
-    /// The same for an attribute without a target.
+    /// As GetAttributeTargetData, for an attribute without a target.
     MCBinning::MCStatus GetAttributeData(int attribute, std::vector<BINValueTuple>** tuples);
 
-    /// Adds up the weights of the current tuples by bin and target code. `cuts` holds the borders of the bins in rising
-    /// order, from an outer left one, which is never compared, to the right border of the last bin. `table` gets one
-    /// row of GetNumTargetCats() cells for each bin.
-    ///
-    /// \return OK, or the warning BINStatusBadBinTable if there are no borders, or the tuples end before the last bin
-    ///         or go on past it; the table is worth nothing then.
+    /// As the function of that name, over the current tuples. Null for `cuts` is the warning BINStatusBadBinTable, too.
     MCBinning::MCStatus TallyBins(const std::vector<double>* cuts, bool rightBorderClosed,
                                   std::vector<double>& table) const;
 
@@ -75,11 +70,8 @@ public:
     bool IsPreBinningEngaged() const { return fUseEFAsPreprocess; }
 
 private:
-    friend class BINAttributeReaderPeer; // the unit tests' way in
-
     using Iterator = MCBinning::BinaryRecordIterator;
 
-    int PositionOf(int variable) const;
     std::unique_ptr<Iterator> OpenPosition(int position) const;
     bool PutOn(int position, std::unique_ptr<Iterator>& iterator, int& iteratorPosition) const;
     MCBinning::MCStatus LoadVariable(int attribute);

@@ -6,9 +6,6 @@
 namespace
 {
 
-constexpr int kHasRoom = 0;
-constexpr int kFull = 2;
-
 std::size_t IndexOf(int number)
 {
     return static_cast<std::size_t>(number);
@@ -31,7 +28,7 @@ bool BINRecordBuffer::Init(int rows, int cols)
     {
         return false; // the caller may try a smaller size
     }
-    fState = kHasRoom;
+    fIsFull = false;
     fRows = rows;
     fCols = cols;
     return true;
@@ -44,20 +41,14 @@ bool BINRecordBuffer::Append(int row, double value)
     int& fill = fFill[IndexOf(row)];
     fData[IndexOf(row) * IndexOf(fCols) + IndexOf(fill)] = value;
     ++fill;
-    if (fill == fCols)
-        fState = kFull;
+    fIsFull = fIsFull || fill == fCols;
     return true;
-}
-
-bool BINRecordBuffer::IsFull() const
-{
-    return fState == kFull;
 }
 
 void BINRecordBuffer::Reset()
 {
     std::fill(fFill.begin(), fFill.end(), 0);
-    fState = kHasRoom;
+    fIsFull = false;
 }
 
 const double* BINRecordBuffer::RowData(int row) const

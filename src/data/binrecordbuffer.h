@@ -16,7 +16,7 @@ public:
     bool Append(int row, double value);
 
     /// True from the moment when some row has no room left, up to Reset().
-    bool IsFull() const;
+    bool IsFull() const { return fIsFull; }
 
     /// Empties all rows; the memory stays.
     void Reset();
@@ -28,7 +28,7 @@ public:
 private:
     bool HasRow(int row) const;
 
-    int fState = 0; ///< kHasRoom or kFull
+    bool fIsFull = false; ///< some row has no room left
     int fRows = 0;
     int fCols = 0;             ///< capacity of each row, in values
     std::vector<double> fData; ///< row after row: (row, column) lies at row * fCols + column

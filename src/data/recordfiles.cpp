@@ -1,12 +1,8 @@
-// The temporary files of the data pass: their names, their coming into being, their growth and their end.
-//
-// A name is picked before the pass and becomes ours when its file is made, which fails if anything bears the name by
-// then. Until a file is made nothing is read, written or removed under its name; from then on only that very file is.
+#include "data/recordfiles.h"
 
 #include "base/bincancelmonitor.h"
 #include "base/makestatus.h"
-#include "data/bindatapreparator.h"
-#include "metadata/recordlayout.h"
+#include "platform/file.h"
 
 #include <array>
 #include <charconv>
@@ -35,35 +31,43 @@ std::string AsPathPrefix(const std::string& directory)
 
 } // namespace
 
-MCStatus BINDataPreparator::InitTempFiles()
+RecordFiles::RecordFiles(const std::string& directory, BINCancelMonitor* cancelMonitor, Platform* platform)
+    : fPathPrefix(AsPathPrefix(directory)), fCancelMonitor(cancelMonitor), fPlatform(platform)
 {
-    // Everything behind this point rests on one position for each variable, and so for each field of a host record.
-    if (FindVariableWithoutPosition(*fVarList) >= 0)
-        return MakeError(MCBinning::BINStatusInvalidVarList);
-    if (!InitBuffer())
+}
+
+RecordFiles::~RecordFiles()
+{
+    RemoveAll();
+}
+
+MCStatus RecordFiles::Init(int numPositions)
+{
+    if (!InitBuffer(numPositions))
         return MakeError(MCBinning::BINStatusOutOfMemory);
-    RemoveTempFiles();
-    fFileNames.assign(fProcRecSize, std::string());
-    fSpoolFiles.assign(fProcRecSize, SpoolFile());
+    RemoveAll();
+    fNames.assign(static_cast<std::size_t>(numPositions), std::string());
+    fSpoolFiles.assign(fNames.size(), SpoolFile());
     fNextTick = fPlatform->GetTickCount();
 
     MCStatus status;
-    for (std::size_t position = 0; position < fFileNames.size() && status.IsOK(); ++position)
-        status = PickFileName(position);
+    for (std::size_t position = 0; position < fNames.size() && status.IsOK(); ++position)
+    {
+        status = PickName(position);
+    }
     return status;
 }
 
-bool BINDataPreparator::InitBuffer()
+bool RecordFiles::InitBuffer(int numPositions)
 {
-    const int rows = static_cast<int>(fProcRecSize);
-    if (fBuffer.Init(rows, fBufferSize))
+    if (fBuffer.Init(numPositions, fBufferSize))
         return true;
     fBufferSize /= 2;
-    return fBuffer.Init(rows, fBufferSize);
+    return fBuffer.Init(numPositions, fBufferSize);
 }
 
 /// Gives the position the next free name. A cancel doesn't stop the search, but no name is taken after it.
-MCStatus BINDataPreparator::PickFileName(std::size_t position)
+MCStatus RecordFiles::PickName(std::size_t position)
 {
     MCStatus status;
     for (;;)
@@ -73,7 +77,7 @@ MCStatus BINDataPreparator::PickFileName(std::size_t position)
         {
         case NameState::kFree:
             if (status.IsOK())
-                fFileNames[position] = candidate;
+                fNames[position] = candidate;
             return status;
         case NameState::kTaken:
             if (fCancelMonitor->IsCancelled())
@@ -88,62 +92,62 @@ MCStatus BINDataPreparator::PickFileName(std::size_t position)
     }
 }
 
-NameState BINDataPreparator::ProbeNextName(std::string& candidate)
+NameState RecordFiles::ProbeNextName(std::string& candidate)
 {
-    candidate = AsPathPrefix(fTempDirName) + Hexadecimal(fNextTick);
+    candidate = fPathPrefix + Hexadecimal(fNextTick);
     ++fNextTick;
     return fPlatform->ProbeName(candidate);
 }
 
-MCStatus BINDataPreparator::FlushBuffer()
+MCStatus RecordFiles::Flush()
 {
     bool isWritten = true;
-    for (std::size_t position = 0; position < fFileNames.size() && isWritten; ++position)
-        isWritten = FlushRow(position);
+    for (std::size_t position = 0; position < fNames.size() && isWritten; ++position) isWritten = FlushRow(position);
     fBuffer.Reset();
     return isWritten ? MCStatus() : MakeError(MCBinning::BINStatusCannotOpenTempFile);
 }
 
 /// A full disk shows when large rows are written, and for small ones not before the file is closed.
-bool BINDataPreparator::FlushRow(std::size_t position)
+bool RecordFiles::FlushRow(std::size_t position)
 {
     SpoolFile& spool = fSpoolFiles[position];
-    std::FILE* file = spool.fIsMade ? fPlatform->OpenForAppending(fFileNames[position], spool.fIdentity,
-                                                                  spool.fNumValues * sizeof(double))
-                                    : MakeFile(position);
-    if (file == nullptr)
+    File file(spool.fIsMade
+                  ? fPlatform->OpenForAppending(fNames[position], spool.fIdentity, spool.fNumValues * sizeof(double))
+                  : Make(position),
+              fPlatform);
+    if (!file.IsOpen())
         return false;
     const int row = static_cast<int>(position);
     const auto count = static_cast<std::size_t>(fBuffer.RowFill(row));
-    const bool isWritten = fPlatform->WriteDoubles(fBuffer.RowData(row), count, file) == count;
-    const bool isClosed = fPlatform->CloseFile(file);
+    const bool isWritten = file.WriteDoubles(fBuffer.RowData(row), count) == count;
+    const bool isClosed = file.Close();
     spool.fNumValues += count;
     return isWritten && isClosed;
 }
 
 /// Makes the position's file, under the next free name where somebody else has taken the picked one in the meantime.
-std::FILE* BINDataPreparator::MakeFile(std::size_t position)
+std::FILE* RecordFiles::Make(std::size_t position)
 {
     SpoolFile& spool = fSpoolFiles[position];
     std::FILE* file = nullptr;
-    NameState state = fPlatform->CreateNewFile(fFileNames[position], file, spool.fIdentity);
+    NameState state = fPlatform->CreateNewFile(fNames[position], file, spool.fIdentity);
     while (state == NameState::kTaken)
     {
-        state = ProbeNextName(fFileNames[position]);
+        state = ProbeNextName(fNames[position]);
         if (state == NameState::kFree)
-            state = fPlatform->CreateNewFile(fFileNames[position], file, spool.fIdentity);
+            state = fPlatform->CreateNewFile(fNames[position], file, spool.fIdentity);
     }
     spool.fIsMade = file != nullptr;
     return file;
 }
 
-void BINDataPreparator::RemoveTempFiles()
+void RecordFiles::RemoveAll()
 {
     for (std::size_t position = 0; position < fSpoolFiles.size(); ++position)
     {
         if (fSpoolFiles[position].fIsMade)
-            fPlatform->RemoveFile(fFileNames[position], fSpoolFiles[position].fIdentity);
+            fPlatform->RemoveFile(fNames[position], fSpoolFiles[position].fIdentity);
     }
-    fFileNames.clear();
+    fNames.clear();
     fSpoolFiles.clear();
 }

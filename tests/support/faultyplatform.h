@@ -16,6 +16,8 @@ public:
     bool fFromThenOn = false;
     int fNumCalls = 0;
     bool fHasFired = false;
+    int fNumOpened = 0; ///< files, by CreateNewFile and the like
+    int fNumClosed = 0;
     std::int64_t fTick = 0; ///< of the clock, if it is not 0
 
     std::int64_t GetTickCount() override { return fTick != 0 ? fTick : fReal->GetTickCount(); }
@@ -27,17 +29,19 @@ public:
 
     NameState CreateNewFile(const std::string& path, std::FILE*& file, FileIdentity& identity) override
     {
-        return Fails() ? NameState::kFailed : fReal->CreateNewFile(path, file, identity);
+        const NameState state = Fails() ? NameState::kFailed : fReal->CreateNewFile(path, file, identity);
+        fNumOpened += state == NameState::kFree ? 1 : 0;
+        return state;
     }
 
     std::FILE* OpenForAppending(const std::string& path, const FileIdentity& identity, std::uint64_t size) override
     {
-        return Fails() ? nullptr : fReal->OpenForAppending(path, identity, size);
+        return Opened(Fails() ? nullptr : fReal->OpenForAppending(path, identity, size));
     }
 
     std::FILE* OpenForReading(const std::string& path, const FileIdentity* identity) override
     {
-        return Fails() ? nullptr : fReal->OpenForReading(path, identity);
+        return Opened(Fails() ? nullptr : fReal->OpenForReading(path, identity));
     }
 
     std::size_t ReadDoubles(double* values, std::size_t count, std::FILE* file) override
@@ -57,6 +61,7 @@ public:
     bool CloseFile(std::FILE* file) override
     {
         const bool isClosed = fReal->CloseFile(file);
+        ++fNumClosed;
         return !Fails() && isClosed && !(fIsToldAtClose && fNumWrites > 0 && fNumWrites == fFullAtWrite);
     }
 
@@ -74,6 +79,12 @@ private:
         const bool fails = fNumCalls == fFailingCall || (fFromThenOn && fFailingCall > 0 && fNumCalls > fFailingCall);
         fHasFired = fHasFired || fails;
         return fails;
+    }
+
+    std::FILE* Opened(std::FILE* file)
+    {
+        fNumOpened += file != nullptr ? 1 : 0;
+        return file;
     }
 
     Platform* fReal = SystemPlatform();

@@ -1,4 +1,4 @@
-#include "support/algorithmpeer.h"
+#include "binning/celltable.h"
 #include "support/runs.h"
 
 #include <gtest/gtest.h>
@@ -120,18 +120,31 @@ TEST(SmallBins, JoinTheNeighbourThatLeavesTheLowerEntropy)
     for (const Case& c : cases)
     {
         SCOPED_TRACE(c.fWhat);
-        BINSettings settings;
-        settings.SetSmallBinDetectionThreshold(c.fThreshold);
-        const BINAlgorithmPeer peer(2, true, settings);
         std::vector<double> cells = c.fCells;
         std::set<double> cutPoints;
         for (std::size_t cut = 1; cut < cells.size() / 3; ++cut) cutPoints.insert(static_cast<double>(cut));
 
-        peer.MergeSmallBins(cells, cutPoints);
+        MergeSmallBins(c.fThreshold, 2, cells, cutPoints);
 
         std::vector<double> totals;
         for (std::size_t bin = 0; bin < cells.size() / 3; ++bin) totals.push_back(cells[3 * bin]);
         EXPECT_EQ(c.fCutPoints, cutPoints);
         EXPECT_EQ(c.fTotals, totals);
     }
+}
+
+TEST(CellTable, SumsTheRowsBetweenTheCutPoints)
+{
+    const std::vector<double> values{1, 2, 3};
+    const std::vector<double> table{4, 0, 0, 2, 1, 1}; // two categories
+
+    EXPECT_EQ((std::vector<double>{6, 4, 2, 2, 1, 1}), FillCells(values, table, 2, true, {2}));
+    EXPECT_EQ((std::vector<double>{4, 4, 0, 4, 1, 3}), FillCells(values, table, 2, false, {2}));
+    EXPECT_EQ((std::vector<double>{8, 5, 3}), FillCells(values, table, 2, true, {}));
+}
+
+TEST(CellTable, ModelEntropyIsTheMeanOverTheTotalWeight)
+{
+    EXPECT_EQ(0.5, ComputeModelEntropy({2, 1, 1, 2, 2, 0}, 2, 4.0));
+    EXPECT_EQ(0.25, ComputeModelEntropy({2, 1, 1, 2, 2, 0}, 2, 8.0)) << "the total given, not that of the cells";
 }

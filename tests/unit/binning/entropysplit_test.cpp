@@ -1,6 +1,7 @@
+#include "binning/binalgorithm.h"
 #include "binning/entropy.h"
+#include "binning/entropysplit.h"
 #include "oracle/plainsplit.h"
-#include "support/algorithmpeer.h"
 #include "support/hostdata.h"
 
 #include <gtest/gtest.h>
@@ -24,7 +25,11 @@ std::set<double> CutPoints(const Rows& rows, bool rightBorderClosed)
 {
     std::vector<double> table;
     for (const auto& row : rows) table.insert(table.end(), row.begin(), row.end());
-    return BINAlgorithmPeer(static_cast<int>(rows.front().size()), rightBorderClosed).CutPoints(ValuesFor(rows), table);
+    std::set<double> cutPoints;
+    EXPECT_TRUE(FindCutPoints(ValuesFor(rows), table, rows.front().size(), rightBorderClosed, 0,
+                              static_cast<int>(rows.size()) - 1, cutPoints)
+                    .IsOK());
+    return cutPoints;
 }
 
 std::set<double> PlainCutPoints(const Rows& rows, bool rightBorderClosed)
@@ -158,18 +163,16 @@ TEST(EntropySplit, LowestOfEqualRowsIsCut)
 
 TEST(EntropySplit, MisfittingTablesAreErrors)
 {
-    const BINAlgorithmPeer peer(2, true);
+    const MCBinning::MCStatus badTable(MCBinning::BINStatusBadBinTable, false);
     const std::vector<double> values{1, 2};
     const std::vector<double> table{1, 0, 0, 1, 5, 5};
     std::set<double> cutPoints{42.0};
-    for (const auto& [v, t] :
-         {std::pair(&values, &table), std::pair<decltype(&values), decltype(&table)>(nullptr, &table),
-          std::pair<decltype(&values), decltype(&table)>(&values, nullptr)})
-    {
-        const MCBinning::MCStatus status = peer.Algorithm().FindCutPoints(v, t, 0, 1, cutPoints);
-        EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusBadBinTable, false), status);
-        EXPECT_EQ(std::set<double>{42.0}, cutPoints);
-    }
+
+    EXPECT_EQ(badTable, FindCutPoints(values, table, 2, true, 0, 1, cutPoints));
+    const BINAlgorithm algorithm{BINSettings(), BINVarList()};
+    EXPECT_EQ(badTable, algorithm.FindCutPoints(nullptr, &table, 0, 1, cutPoints));
+    EXPECT_EQ(badTable, algorithm.FindCutPoints(&values, nullptr, 0, 1, cutPoints));
+    EXPECT_EQ(std::set<double>{42.0}, cutPoints);
 }
 
 namespace

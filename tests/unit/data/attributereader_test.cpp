@@ -1,5 +1,6 @@
 #include "data/binattributereader.h"
-#include "support/preparatorpeer.h"
+#include "data/tally.h"
+#include "support/testpreparator.h"
 
 #include <gtest/gtest.h>
 
@@ -42,7 +43,7 @@ public:
 
 private:
     RecordTable fRecords;
-    BINDataPreparatorPeer fPreparator;
+    TestPreparator fPreparator;
     BINAttributeReader fReader; // before the preparator in destruction: its files are closed when they go
 };
 
@@ -217,28 +218,46 @@ TEST(AttributeReader, AttributeCutShortIsAnErrorThatNamesIt)
     EXPECT_EQ(nullptr, tuples);
 }
 
+namespace
+{
+
+const std::vector<BINSortTuple> kTuples{{1, 0, 1.0}, {2, 1, 1.0}, {2, 0, 1.0}, {4, 1, 0.5}, {9, 9, 9.0}};
+constexpr unsigned int kNumTuples = 4; // the last one is another attribute's
+
+} // namespace
+
 TEST(Tally, PutsValuesOnTheClosedSideOfABorder)
 {
-    LoadedReader reader(AVarList().WithAttribute("x").WithTarget("t", 2), {{1, 0}, {2, 1}, {2, 0}, {4, 1}});
-    reader.Pair(0, 1);
     const std::vector<double> borders{-100, 1, 2, 3, 5};
     std::vector<double> table;
 
-    EXPECT_TRUE(reader->TallyBins(&borders, true, table).IsOK());
-    EXPECT_EQ((std::vector<double>{1, 0, 1, 1, 0, 0, 0, 1}), table);
-    EXPECT_TRUE(reader->TallyBins(&borders, false, table).IsOK());
-    EXPECT_EQ((std::vector<double>{0, 0, 1, 0, 1, 1, 0, 1}), table);
+    EXPECT_TRUE(TallyBins(kTuples, kNumTuples, 2, borders, true, table).IsOK());
+    EXPECT_EQ((std::vector<double>{1, 0, 1, 1, 0, 0, 0, 0.5}), table);
+    EXPECT_TRUE(TallyBins(kTuples, kNumTuples, 2, borders, false, table).IsOK());
+    EXPECT_EQ((std::vector<double>{0, 0, 1, 0, 1, 1, 0, 0.5}), table);
+}
+
+TEST(Tally, MakesARowOfEachDistinctValue)
+{
+    std::vector<double> values;
+    std::vector<double> table;
+
+    TallyDistinct(kTuples, kNumTuples, 3, 2, values, table);
+
+    EXPECT_EQ((std::vector<double>{1, 2, 4}), values);
+    EXPECT_EQ((std::vector<double>{1, 0, 1, 1, 0, 0.5}), table);
 }
 
 TEST(Tally, BordersThatDontFitTheTuplesAreAWarning)
 {
+    const MCBinning::MCStatus badTable(MCBinning::BINStatusBadBinTable, true);
+    std::vector<double> table;
+    for (const std::vector<double>& borders : {std::vector<double>{}, {-100, 2}, {-100, 2, 4, 5}})
+    {
+        SCOPED_TRACE(testing::PrintToString(borders));
+        EXPECT_EQ(badTable, TallyBins(kTuples, kNumTuples, 2, borders, true, table));
+    }
     LoadedReader reader(AVarList().WithAttribute("x").WithTarget("t", 2), {{1, 0}, {2, 1}});
     reader.Pair(0, 1);
-    const std::vector<double> none;
-    const std::vector<double> tooLow{-100, 1};
-    const std::vector<double> emptyLast{-100, 2, 3};
-    std::vector<double> table;
-    for (const std::vector<double>* borders :
-         {static_cast<const std::vector<double>*>(nullptr), &none, &tooLow, &emptyLast})
-        EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusBadBinTable, true), reader->TallyBins(borders, true, table));
+    EXPECT_EQ(badTable, reader->TallyBins(nullptr, true, table));
 }

@@ -1,4 +1,4 @@
-#include "support/preparatorpeer.h"
+#include "support/testpreparator.h"
 
 #include <gtest/gtest.h>
 
@@ -19,13 +19,20 @@ BINVarList FullList(IBINVariable::BINWRoundingOption option = IBINVariable::Roun
     return AVarList().WithTarget("t", 256).WithWeight(option).WithAttribute("x").WithCategorical("c", 256);
 }
 
+MCCommon::Record RecordOf(const std::vector<double>& fields)
+{
+    MCCommon::Record record(static_cast<int>(fields.size()));
+    for (std::size_t i = 0; i < fields.size(); ++i) record[static_cast<int>(i)] = fields[i];
+    return record;
+}
+
 const MCBinning::MCStatus kNoRecords(MCBinning::BINStatusNoRecords, false);
 
 } // namespace
 
 TEST(DataPass, RecordsBecomeColumns)
 {
-    BINDataPreparatorPeer preparator(FullList());
+    TestPreparator preparator(FullList());
     RecordTable source{{1, 2, 3.5, 0}, {-1, 1, gMissingValue, -1}, {gMissingValue, 1, -7, gMissingValue}, {}};
 
     EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
@@ -40,11 +47,29 @@ TEST(DataPass, RecordsBecomeColumns)
     EXPECT_EQ(5, source.fNumHasNext);
 }
 
+TEST(DataPass, TurnsOneRecordIntoPositions)
+{
+    const BINVarList list = FullList();
+    const RecordLayout layout(list);
+    DataPass pass(list, layout, 1);
+    MCCommon::Record processed(4);
+
+    EXPECT_TRUE(pass.ProcessRecord(RecordOf({3, 2, 7.5, 1}), processed).IsOK());
+    EXPECT_FALSE(pass.IsRecordDropped());
+    EXPECT_EQ(7.5, processed[2]);
+    EXPECT_EQ((std::vector<int>{3, 0, 0, 1}), pass.GetMaxCodes());
+    EXPECT_TRUE(pass.ProcessRecord(RecordOf({3, 0, 7.5, 1}), processed).IsOK());
+    EXPECT_TRUE(pass.IsRecordDropped());
+    EXPECT_TRUE(pass.ProcessRecord(RecordOf({3, 1, 7.5, 300}), processed).IsWarning());
+    EXPECT_FALSE(pass.GetUsable()[3]);
+    EXPECT_EQ(0U, pass.GetNumRecords()) << "nothing was spooled";
+}
+
 TEST(DataPass, OnlyTheWeightDropsARecord)
 {
     BINVarList list = FullList(IBINVariable::RoundTruncate);
     list.AddDiscreteUserMissing(1, 9.0, "");
-    BINDataPreparatorPeer preparator(list);
+    TestPreparator preparator(list);
     RecordTable source;
     for (const double weight : {0.0, -1.0, 0.9, gMissingValue, kNaN, 9.0, 2.7}) source.Add({0, weight, 1, 0});
 
@@ -59,7 +84,7 @@ TEST(DataPass, UserMissingAndNaNAreMissingInContinuousAttributes)
     BINVarList list = AVarList().WithAttribute("x");
     list.AddDiscreteUserMissing(0, 5.0, "");
     list.SetMissingInterval(0, 90.0, 99.0);
-    BINDataPreparatorPeer preparator(list);
+    TestPreparator preparator(list);
     RecordTable source{{5}, {90}, {99}, {kNaN}, {kInfinity}, {6}};
 
     EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
@@ -86,7 +111,7 @@ TEST(DataPass, WhatCountsAsACode)
          })
     {
         SCOPED_TRACE(c.fCode);
-        BINDataPreparatorPeer preparator(FullList());
+        TestPreparator preparator(FullList());
         RecordTable source{{c.fCode, 1, 1, c.fCode}, {0, 1, 1, 0}};
 
         EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
@@ -104,7 +129,7 @@ TEST(DataPass, WhatCountsAsACode)
 
 TEST(DataPass, BadCodeInTheOnlyCategoricalVariableStopsIt)
 {
-    BINDataPreparatorPeer preparator(AVarList().WithAttribute("x").WithTarget("t", 2));
+    TestPreparator preparator(AVarList().WithAttribute("x").WithTarget("t", 2));
     RecordTable source{{1, 0}, {2, 300}, {3, 1}};
 
     const MCBinning::MCStatus status = preparator->PrepareData(&source);
@@ -118,7 +143,7 @@ TEST(DataPass, BadCodeInTheOnlyCategoricalVariableStopsIt)
 
 TEST(DataPass, CodeBeyondTheDeclaredCategoriesExcludesTheVariableAtTheEnd)
 {
-    BINDataPreparatorPeer preparator(AVarList().WithTarget("t", 2).WithCategorical("c", 3));
+    TestPreparator preparator(AVarList().WithTarget("t", 2).WithCategorical("c", 3));
     RecordTable source{{1, 3}, {0, 2}};
 
     EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
@@ -133,7 +158,7 @@ TEST(DataPass, FlushesWheneverTheBufferIsFull)
 {
     for (const int numRecords : {9999, 10000, 20001})
     {
-        BINDataPreparatorPeer preparator(AVarList().WithAttribute("x"));
+        TestPreparator preparator(AVarList().WithAttribute("x"));
         RecordTable source;
         std::vector<double> expected;
         for (int i = 0; i < numRecords; ++i)
@@ -150,7 +175,7 @@ TEST(DataPass, SourcesWithoutAnAcceptedRecord)
 {
     for (RecordTable source : {RecordTable{}, RecordTable{{}, {}}, RecordTable{{0, 0, 1, 0}}})
     {
-        BINDataPreparatorPeer preparator(FullList());
+        TestPreparator preparator(FullList());
         EXPECT_EQ(kNoRecords, preparator->PrepareData(&source));
         EXPECT_EQ(kNoRecords, preparator->GetStatus());
     }
@@ -162,8 +187,7 @@ TEST(DataPass, MoreRecordsThanCanBeCountedAreNoMemory)
     for (const auto& [weights, code, numRead] : {std::tuple<std::vector<double>, int, int>{{1, 0, 2}, 0, 3},
                                                  {{1, 0, 2, 1, 1}, MCBinning::BINStatusOutOfMemory, 4}})
     {
-        BINDataPreparatorPeer preparator(AVarList().WithWeight().WithAttribute("x"), nullptr, 0, nullptr,
-                                         kMaxNumRecords);
+        TestPreparator preparator(AVarList().WithWeight().WithAttribute("x"), nullptr, 0, nullptr, kMaxNumRecords);
         RecordTable source;
         for (const double weight : weights) source.Add({weight, 1}); // a weight of 0 counts nowhere
 
@@ -177,7 +201,7 @@ TEST(DataPass, MoreRecordsThanCanBeCountedAreNoMemory)
 
 TEST(DataPass, ShortRecordsAreMissingBehindTheirEnd)
 {
-    BINDataPreparatorPeer preparator(AVarList().WithAttribute("a").WithAttribute("b"));
+    TestPreparator preparator(AVarList().WithAttribute("a").WithAttribute("b"));
     RecordTable source{{1}, {2, 3, 4}};
 
     EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
@@ -191,7 +215,7 @@ TEST(DataPass, ReportsEveryNthTurn)
          {std::pair<int, std::vector<int>>{0, {}}, {1, {1, 2, 2, 3}}, {2, {2, 3}}, {3, {2}}})
     {
         ReportLog log;
-        BINDataPreparatorPeer preparator(AVarList().WithAttribute("x"), &log, interval);
+        TestPreparator preparator(AVarList().WithAttribute("x"), &log, interval);
         RecordTable source{{1}, {2}, {}, {3}}; // a turn without a record counts
         EXPECT_TRUE(preparator->PrepareData(&source).IsOK());
         EXPECT_EQ(expected, log.fIndices) << "interval " << interval;
@@ -201,14 +225,14 @@ TEST(DataPass, ReportsEveryNthTurn)
 TEST(DataPass, CancelKeepsWhatWasReadButGivesNoData)
 {
     CancelAfter query(3);
-    BINDataPreparatorPeer preparator(AVarList().WithAttribute("x"), nullptr, 0, &query);
+    TestPreparator preparator(AVarList().WithAttribute("x"), nullptr, 0, &query);
     RecordTable source{{1}, {2}, {3}};
 
     EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusCancelled, false), preparator->PrepareData(&source));
     EXPECT_EQ((std::vector<double>{1, 2}), preparator.Values(0));
 
     CancelAfter atOnce(1);
-    BINDataPreparatorPeer other(AVarList().WithAttribute("x"), nullptr, 0, &atOnce);
+    TestPreparator other(AVarList().WithAttribute("x"), nullptr, 0, &atOnce);
     EXPECT_EQ(kNoRecords, other->PrepareData(&source));
 }
 
@@ -216,7 +240,7 @@ TEST(DataPass, ListsWithoutAPlaceForEachVariableAreRefused)
 {
     BINVarList list = AVarList().WithAttribute("x").WithAttribute("y");
     list.SetVariableRole(1, IBINVariable::RoleUndefined);
-    BINDataPreparatorPeer preparator(list);
+    TestPreparator preparator(list);
     RecordTable source{{1, 2}};
 
     EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusInvalidVarList, false), preparator->PrepareData(&source));

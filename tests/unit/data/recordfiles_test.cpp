@@ -1,7 +1,8 @@
 #include "data/binaryrecorditerator.h"
 #include "data/binrecordbuffer.h"
+#include "data/recordfiles.h"
 #include "support/groupeddigits.h"
-#include "support/preparatorpeer.h"
+#include "support/testpreparator.h"
 
 #include <gtest/gtest.h>
 
@@ -29,10 +30,20 @@ std::vector<double> ReadAll(BinaryRecordIterator& iterator)
     return values;
 }
 
-BINVarList TwoAttributes()
+/// Temporary files in a directory of their own. The clock stands at 1, so that the first name is "1".
+struct TestFiles
 {
-    return AVarList().WithAttribute("a").WithAttribute("b");
-}
+    explicit TestFiles(MCQueryCancel* query = nullptr, const std::string& end = "")
+        : fMonitor(query), fFiles(fDirectory.Path() + end, &fMonitor, &fPlatform)
+    {
+        fPlatform.fTick = 1;
+    }
+
+    TempDir fDirectory;
+    FaultyPlatform fPlatform;
+    BINCancelMonitor fMonitor;
+    RecordFiles fFiles;
+};
 
 } // namespace
 
@@ -104,54 +115,83 @@ TEST(RecordBuffer, IsFullWithItsFirstFullRow)
     EXPECT_EQ(0, buffer.RowFill(1));
 }
 
-TEST(TempFiles, NamesAreConsecutiveTicksThatNothingBears)
+TEST(RecordFiles, NamesAreConsecutiveTicksThatNothingBears)
 {
-    BINDataPreparatorPeer preparator(TwoAttributes());
-    preparator.fPlatform.fTick = 0xabc;
-    WriteFile(preparator.fDirectory.File("abd"), {42.0});
+    TestFiles t;
+    t.fPlatform.fTick = 0xabc;
+    WriteFile(t.fDirectory.File("abd"), {42.0});
 
-    ASSERT_TRUE(preparator->InitTempFiles().IsOK());
+    ASSERT_TRUE(t.fFiles.Init(2).IsOK());
 
-    EXPECT_EQ((std::vector<std::string>{preparator.fDirectory.File("abc"), preparator.fDirectory.File("abe")}),
-              preparator->GetFileNames());
-    EXPECT_EQ(std::vector<std::string>{"abd"}, preparator.fDirectory.FileNames()) << "no file comes into being yet";
+    EXPECT_EQ((std::vector<std::string>{t.fDirectory.File("abc"), t.fDirectory.File("abe")}), t.fFiles.GetNames());
+    EXPECT_EQ(std::vector<std::string>{"abd"}, t.fDirectory.FileNames()) << "no file comes into being yet";
 }
 
-TEST(TempFiles, NamesDontFollowTheLocaleOfTheProgram)
+TEST(RecordFiles, NamesDontFollowTheLocaleOfTheProgram)
 {
     const GroupedDigitsEverywhere german;
-    BINDataPreparatorPeer preparator(AVarList().WithAttribute("a"));
-    preparator.fPlatform.fTick = 0x1234567890;
+    TestFiles t;
+    t.fPlatform.fTick = 0x1234567890;
 
-    ASSERT_TRUE(preparator->InitTempFiles().IsOK());
+    ASSERT_TRUE(t.fFiles.Init(1).IsOK());
 
-    EXPECT_EQ(preparator.fDirectory.File("1234567890"), preparator->GetFileNames().front());
+    EXPECT_EQ(t.fDirectory.File("1234567890"), t.fFiles.GetNames().front());
 }
 
-TEST(TempFiles, DirectoryIsJoinedWithASlashUnlessItEndsInASeparator)
+TEST(RecordFiles, DirectoryIsJoinedWithASlashUnlessItEndsInASeparator)
 {
-    const TempDir directory;
     for (const std::string& end : {std::string(), std::string("/"), std::string("/x\\")})
     {
-        BINVarList list = AVarList().WithAttribute("a");
-        BINCancelMonitor monitor(nullptr);
-        FaultyPlatform platform;
-        platform.fTick = 1;
-        BINDataPreparator preparator(&list, &monitor, directory.Path() + end, nullptr, 0, &platform);
-        ASSERT_TRUE(preparator.InitTempFiles().IsOK());
-        EXPECT_EQ(directory.Path() + (end.empty() ? "/" : end) + "1", preparator.GetFileNames().front());
+        TestFiles t(nullptr, end);
+        ASSERT_TRUE(t.fFiles.Init(1).IsOK());
+        EXPECT_EQ(t.fDirectory.Path() + (end.empty() ? "/" : end) + "1", t.fFiles.GetNames().front());
     }
 }
 
-TEST(TempFiles, CancelEndsTheNamingButNotTheSearchForAName)
+TEST(RecordFiles, CancelEndsTheNamingButNotTheSearchForAName)
 {
     CancelAfter query(1);
-    BINDataPreparatorPeer preparator(TwoAttributes(), nullptr, 0, &query);
-    preparator.fPlatform.fTick = 1;
-    for (const char* taken : {"1", "2"}) WriteFile(preparator.fDirectory.File(taken), {});
+    TestFiles t(&query);
+    for (const char* taken : {"1", "2"}) WriteFile(t.fDirectory.File(taken), {});
 
-    EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusCancelled, false), preparator->InitTempFiles());
+    EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusCancelled, false), t.fFiles.Init(2));
 
-    EXPECT_EQ(std::vector<std::string>(2), preparator->GetFileNames());
+    EXPECT_EQ(std::vector<std::string>(2), t.fFiles.GetNames());
     EXPECT_EQ(1, query.fNumAsked) << "the flag is up: the host is not asked again";
+}
+
+TEST(RecordFiles, EachFlushAppendsAndTheFilesGoWithTheObject)
+{
+    TempDir directory;
+    {
+        BINCancelMonitor monitor(nullptr);
+        RecordFiles files(directory.Path(), &monitor, SystemPlatform());
+        ASSERT_TRUE(files.Init(2).IsOK());
+        files.Append(0, 1.5);
+        ASSERT_TRUE(files.Flush().IsOK());
+        files.Append(0, 2.5);
+        ASSERT_TRUE(files.Flush().IsOK());
+
+        EXPECT_EQ((std::vector<double>{1.5, 2.5}), ValuesOf(files.GetNames()[0]));
+        EXPECT_EQ(std::vector<double>{}, ValuesOf(files.GetNames()[1])) << "a file without a value";
+        EXPECT_EQ(2U, files.GetSpoolFiles()[0].fNumValues);
+        EXPECT_EQ(2U, directory.FileNames().size());
+    }
+    EXPECT_TRUE(directory.IsEmpty());
+}
+
+TEST(RecordFiles, FileThatDoesNotTakeAllIsAnErrorAndIsClosed)
+{
+    // Calls that can fail: two probes, then creation, write and close of each file.
+    for (const int failingCall : {3, 4, 5, 6, 7, 8})
+    {
+        TestFiles t;
+        t.fPlatform.fFailingCall = failingCall;
+        ASSERT_TRUE(t.fFiles.Init(2).IsOK());
+        for (const int position : {0, 0, 1, 1}) t.fFiles.Append(position, 1.0);
+
+        EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusCannotOpenTempFile, false), t.fFiles.Flush()) << failingCall;
+
+        EXPECT_EQ(t.fPlatform.fNumOpened, t.fPlatform.fNumClosed) << failingCall;
+    }
 }

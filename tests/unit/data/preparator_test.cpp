@@ -1,6 +1,7 @@
-#include <gtest/gtest.h>
+#include "metadata/recordlayout.h"
+#include "support/testpreparator.h"
 
-#include "support/preparatorpeer.h"
+#include <gtest/gtest.h>
 
 #include <sstream>
 
@@ -11,27 +12,30 @@ TEST(RecordLayout, PositionsAreTargetWeightAttributes)
         BINVarList fList;
         std::vector<int> fPositions;
         std::vector<int> fInputs;
-        int fWeightNewIndex;
+        int fFirstAttribute;
     };
     const std::vector<Case> cases{
-        {AVarList().WithAttribute("a").WithWeight().WithTarget("t", 2).WithAttribute("b"), {2, 1, 0, 3}, {0, 3}, 1},
+        {AVarList().WithAttribute("a").WithWeight().WithTarget("t", 2).WithAttribute("b"), {2, 1, 0, 3}, {0, 3}, 2},
         {AVarList().WithAttribute("a").WithWeight(), {1, 0}, {0}, 1},
-        {AVarList().WithAttribute("a").WithTarget("t", 2), {1, 0}, {0}, -1},
-        {AVarList().WithAttribute("a").WithCategorical("b", 2), {0, 1}, {0, 1}, -1},
+        {AVarList().WithAttribute("a").WithTarget("t", 2), {1, 0}, {0}, 1},
+        {AVarList().WithAttribute("a").WithCategorical("b", 2), {0, 1}, {0, 1}, 0},
     };
     for (const Case& c : cases)
     {
         SCOPED_TRACE(testing::PrintToString(c.fPositions));
-        BINDataPreparatorPeer preparator(c.fList);
-        EXPECT_EQ(c.fPositions, preparator->GetVariableIndex());
-        EXPECT_EQ(c.fInputs, preparator.InputIndices());
-        EXPECT_EQ(c.fWeightNewIndex, preparator.WeightNewIndex());
+        const RecordLayout layout(c.fList);
+        EXPECT_EQ(c.fPositions, layout.GetPositions());
+        EXPECT_EQ(c.fInputs, layout.GetAttributes());
+        EXPECT_EQ(c.fFirstAttribute, layout.GetFirstAttributePosition());
+        EXPECT_EQ(static_cast<int>(c.fPositions.size()), layout.GetNumPositions());
+        EXPECT_EQ(-1, layout.PositionOf(-1));
+        EXPECT_EQ(-1, layout.PositionOf(layout.GetNumVariables()));
     }
 }
 
-TEST(RecordLayout, PositionsThatThereAreNotAreRefused)
+TEST(Preparator, PositionsThatThereAreNotAreRefused)
 {
-    BINDataPreparatorPeer preparator(AVarList().WithAttribute("a").WithTarget("t", 2));
+    TestPreparator preparator(AVarList().WithAttribute("a").WithTarget("t", 2));
     for (const int position : {-1, 2})
     {
         bool isUsable = true;
@@ -42,10 +46,10 @@ TEST(RecordLayout, PositionsThatThereAreNotAreRefused)
     EXPECT_TRUE(preparator.IsUsable(1));
 }
 
-TEST(RecordLayout, DisplayIsToTheLetter)
+TEST(Preparator, DisplayIsToTheLetter)
 {
     BINVarList list = AVarList().WithAttribute("a").WithWeight().WithTarget("t", 2);
-    BINDataPreparatorPeer preparator(list);
+    TestPreparator preparator(list);
     std::ostringstream shown;
     std::ostringstream shownList;
 

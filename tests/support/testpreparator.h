@@ -1,5 +1,5 @@
-#ifndef MCOBNQRT_TESTS_PREPARATORPEER_H
-#define MCOBNQRT_TESTS_PREPARATORPEER_H
+#ifndef MCOBNQRT_TESTS_TESTPREPARATOR_H
+#define MCOBNQRT_TESTS_TESTPREPARATOR_H
 
 #include "base/bincancelmonitor.h"
 #include "data/binaryrecorditerator.h"
@@ -14,13 +14,22 @@
 #include <string>
 #include <vector>
 
-/// A data preparator in a directory of its own, and the way to what it keeps to itself.
-class BINDataPreparatorPeer
+/// What a file of doubles holds.
+inline std::vector<double> ValuesOf(const std::string& path)
+{
+    std::vector<double> values;
+    MCBinning::BinaryRecordIterator iterator(path);
+    while (iterator.IsOK()) values.push_back(iterator.Next());
+    return values;
+}
+
+/// A data preparator in a directory of its own.
+class TestPreparator
 {
 public:
-    explicit BINDataPreparatorPeer(const BINVarList& list, ProgressListener* listener = nullptr, int interval = 0,
-                                   MCQueryCancel* query = nullptr,
-                                   unsigned int maxNumRecords = std::numeric_limits<unsigned int>::max())
+    explicit TestPreparator(const BINVarList& list, ProgressListener* listener = nullptr, int interval = 0,
+                            MCQueryCancel* query = nullptr,
+                            unsigned int maxNumRecords = std::numeric_limits<unsigned int>::max())
         : fList(list), fMonitor(query),
           fPreparator(&fList, &fMonitor, fDirectory.Path(), listener, interval, &fPlatform, maxNumRecords)
     {
@@ -29,10 +38,7 @@ public:
     /// What the temporary file of a position holds.
     std::vector<double> Values(int position) const
     {
-        std::vector<double> values;
-        MCBinning::BinaryRecordIterator iterator(fPreparator.GetFileNames()[static_cast<std::size_t>(position)]);
-        while (iterator.IsOK()) values.push_back(iterator.Next());
-        return values;
+        return ValuesOf(fPreparator.GetFileNames()[static_cast<std::size_t>(position)]);
     }
 
     bool IsUsable(int position) const
@@ -41,9 +47,6 @@ public:
         EXPECT_TRUE(fPreparator.IsVariableUsable(position, &isUsable).IsOK());
         return isUsable;
     }
-
-    std::vector<int> InputIndices() const { return fPreparator.fInputIndices; }
-    int WeightNewIndex() const { return fPreparator.fWeightNewIndex; }
 
     BINDataPreparator* operator->() { return &fPreparator; }
     BINDataPreparator& operator*() { return fPreparator; }
