@@ -43,7 +43,7 @@ public:
     /// MCMV::gMissingValue, a NaN and a user-missing value.
     double Encode(double value);
 
-    /// The code of `value`, or -1.0 if it is missing as above or no category.
+    /// The code of `value`, or -1.0 if it is missing, as for Encode, or no category.
     double EncodeConst(double value) const;
 
     /// The value that has this code, or MCMV::gMissingValue if none has.

@@ -47,7 +47,8 @@ public:
     /// place among the distinct ones. The number of categories is that of `values`, repeated ones included. `labels`
     /// are in the order of the codes.
     ///
-    /// \return its index, or -1, and nothing is added, as above or if there are fewer than 2 values.
+    /// \return its index, or -1, and nothing is added, if the name is empty or taken, the role is RoleFrequencyWeight
+    ///         or there are fewer than 2 values.
     int AddCatVar(const std::string& name, const std::string& label, const std::vector<double>& values,
                   IBINVariable::VariableRole role);
     int AddCatVar(const std::string& name, const std::string& label, const std::vector<std::string>& values,

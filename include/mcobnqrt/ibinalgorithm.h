@@ -61,8 +61,8 @@ public:
     /// \return OK; the warning BINStatusSomeResultsFlagged if a pair that this or an earlier call has binned, or tried
     ///         to, carries a status of its own, to be read in its result; BINStatusCancelled, with the results found so
     ///         far kept; or the error that stopped the call before a result was made: BINStatusBadNumberOfBins,
-    ///         BINStatusNoValidPairs, BINStatusNoRecords (no record, none of positive weight, none ahead of a cancel, or
-    ///         no source), BINStatusTargetUnusable, BINStatusTooManyCategories, BINStatusTempDirNotFound,
+    ///         BINStatusNoValidPairs, BINStatusNoRecords (no record, none of positive weight, none ahead of a cancel,
+    ///         or no source), BINStatusTargetUnusable, BINStatusTooManyCategories, BINStatusTempDirNotFound,
     ///         BINStatusCannotOpenTempFile, BINStatusOutOfMemory. An entry that is refused for its indices or roles
     ///         raises no warning here. A call after a failed reading of the source gives that failure again.
     virtual MCBinning::MCStatus Run(IBINRecordSource* source, const std::vector<int>* attributes,

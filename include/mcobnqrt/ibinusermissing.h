@@ -7,7 +7,7 @@
 
 /// The values of one variable that count as missing although they are ordinary numbers or strings.
 ///
-/// Whether a value is one of them is asked of the concrete class, by its Contains: GetDataType tells which class it is.
+/// Contains of the concrete class tells whether a value is one of them, and GetDataType which class that is.
 /// The system-missing MCMV::gMissingValue is a thing apart, and no object of these classes knows it.
 class MCOBNQRT_EXPORT IBINUserMissing
 {

@@ -5,8 +5,8 @@
 
 #include <string>
 
-/// What a ProgressListener is handed: figures that are asked for by name. Which names there are, and what an unknown
-/// name gives, is told by the class behind it; the library's reports are of the class BINProgressReporter.
+/// The figures that a ProgressListener is handed, each under a name. The concrete class tells which names there are and
+/// what an unknown name gives; the library's reports are of the class BINProgressReporter.
 class MCOBNQRT_EXPORT ProgressReport
 {
 public:

@@ -6,7 +6,7 @@ class MCQueryCancel;
 /// Answers whether the work on an algorithm is to stop: the host's query, and the flag that it raises. There is one for
 /// each algorithm, which owns it; the data preparator works with a pointer to it, so a cancel is seen in both.
 ///
-/// Once up, the flag stays up, and the query is not asked any more.
+/// Once the flag is up it stays up, and the query is not called any more.
 class BINCancelMonitor
 {
 public:

@@ -15,9 +15,9 @@
 ///     if (sums.AreExact()) ...
 ///
 /// `total` is the sum of all weights as it was worked out, in whatever order. Let 2^e be the lowest power of two above
-/// it. Doubles below 2^e hold all multiples of the unit 2^(e - 53), so if every weight is one, every sum of some of them
-/// is exact, and so is every difference of such sums. That is so for whole numbers with a total below 2^53, and for all
-/// other weights that are multiples of one power of two with a total below 2^53 of them.
+/// it. Doubles below 2^e hold all multiples of the unit 2^(e - 53), so if every weight is one, every sum of some of
+/// them is exact, and so is every difference of such sums. That is so for whole numbers with a total below 2^53, and
+/// for all other weights that are multiples of one power of two with a total below 2^53 of them.
 ///
 /// A total of exactly 2^53 units doesn't count, since it may be a larger one that has lost what was added to it. As
 /// rounding keeps order, a total that comes out below 2^53 units has lost nothing.
@@ -35,7 +35,7 @@ public:
         std::uint64_t roundedBits = 0;
         std::memcpy(&bits, &weight, sizeof(bits));
         std::memcpy(&roundedBits, &rounded, sizeof(roundedBits));
-        fLostBits |= bits ^ roundedBits; // not compared, since a loop without a branch takes several at once
+        fLostBits |= bits ^ roundedBits; // collected, not compared: a loop without a branch is vectorised
     }
 
     bool AreExact() const { return fLostBits == 0; }

@@ -5,8 +5,8 @@
 #include <cstddef>
 #include <vector>
 
-/// Makes room for `count` more elements, so that adding them can't fail. An operation that changes several members makes
-/// all of them ready first, and then either all change or none.
+/// Makes room for `count` more elements, so that adding them can't fail. An operation that changes several members
+/// makes all of them ready first, and then either all change or none.
 ///
 /// Grows by doubling at least: to reserve just what is needed would copy the vector at every addition.
 template<class Element>

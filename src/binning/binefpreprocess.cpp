@@ -3,8 +3,8 @@
 // The walk takes whole groups of equal values. The target of a bin is either passed inside a group, and then the
 // group's value is the cut, or met exactly between two groups, and then the midpoint of their values is, or where that
 // doesn't part the two, the one of them that does. The total weight comes from a sum in another order than the walk's
-// and may differ from it in the last bit, so "all of it" is asked of the tuples, by the cursor, and never of the
-// weights.
+// and may differ from it in the last bit, so the walk is at its end when the cursor has passed all tuples, and not when
+// the weight is reached.
 
 #include "binning/binefpreprocess.h"
 
@@ -21,8 +21,8 @@ namespace
 constexpr double kEpsilon = std::numeric_limits<double>::epsilon();
 
 /// A cut between two values, `lower` < `upper`, that leaves the one on its left and the other on its right: the
-/// midpoint if possible. That of two neighbouring doubles is one of the two, and beside infinities it can be infinite or
-/// a NaN.
+/// midpoint if possible. That of two neighbouring doubles is one of the two, and beside infinities it can be infinite
+/// or a NaN.
 double CutBetween(double lower, double upper, bool rightBorderClosed)
 {
     const double sum = lower + upper;
@@ -145,9 +145,9 @@ private:
     double fCutPoint = 0.0;
 };
 
-/// Walks through all bins. With `counts` null the weights of the bins are not wanted. A cut that equals the one before it
-/// bounds a bin without a value, and so does one at the end of the data, where a single value holds the last share or,
-/// with the left border closed, the first.
+/// Walks through all bins. With `counts` null the weights of the bins are not wanted. A cut that equals the one before
+/// it bounds a bin without a value, and so does one at the end of the data, where a single value holds the last share
+/// or, with the left border closed, the first.
 template<class Tuple>
 void FindBins(EFWalk<Tuple> walk, std::vector<double>& cuts, std::vector<double>* counts)
 {

@@ -26,7 +26,9 @@ public:
 
     /// The bins themselves: cut points in strictly rising order, and the weight of each bin, none of them 0, one more
     /// than there are cuts. The weights are those of the values between the cuts, whatever the values are. Both lists
-    /// arrive empty. \return as above.
+    /// arrive empty.
+    ///
+    /// \return as PreBinEqualFrequency.
     bool BinEqualFrequency(const std::vector<BINValueTuple>* tuples, unsigned int numTuples, std::vector<double>& cuts,
                            std::vector<double>& counts, double totalWeight) const;
 

@@ -19,8 +19,8 @@
 #include <utility>
 #include <vector>
 
-/// What the two drivers share: the copies that they work on, the one preparation of the data, and how statuses travel
-/// from an attribute to the end of a run. `Interface` is the abstract class that the host knows.
+/// Holds what the two drivers share: the copies that they work on, the one preparation of the data, and how statuses
+/// travel from an attribute to the end of a run. `Interface` is the abstract class that the host knows.
 ///
 /// Wherever the host is called, it may call Run of the same object again. So what one call of Run works on is in its
 /// local variables, and a member that a call changes is not read by it behind a call into the host.
@@ -130,8 +130,8 @@ private:
     }
 
 protected:
-    unsigned int fRecordCount = 0; ///< tuples of the attribute or pair treated last
-    bool fRightBorderClosed = true;
+    unsigned int fRecordCount = 0;  ///< tuples of the attribute or pair treated last
+    bool fRightBorderClosed = true; ///< the setting when the records were read, so that all results have one side
     Settings fSettings;
     BINVarList fVarList;
     MCBinning::MCStatus fStatus; ///< the last of an attribute or pair that was not OK, or cancelled; never OK again

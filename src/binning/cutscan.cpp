@@ -17,7 +17,7 @@
 //
 // The margin. What is compared with bound and estimate is the partition entropy as it is worked out, times the weight
 // N. With u = 2^-53, an entropy is off by at most (40 + 8 K) u. Each term v log2 v of bound and estimate is at most
-// N (|log2 N| + 1) in size. Bounds are only used where N lies between 2^-60 and 2^60, so that is at most 61 N; the bound
+// N (|log2 N| + 1) in size. Bounds are only used where N is between 2^-60 and 2^60, so that is at most 61 N; the bound
 // has 4 (K + 1) terms, and the estimate is updated up to 64 K times in a segment, each time off by at most 6 x 61 u N:
 // 2^15 (K + 4) u N is enough for all of it. Beyond those weights the terms grow with |log2 N| and no such margin holds;
 // from a total of about 2^1014 they are infinite, and at the small end they lose their last bits.
@@ -25,8 +25,8 @@
 // That is all where sums are exact. Otherwise the sides are running sums of n rows, each off by up to e = 2 n K u N, a
 // residual of a category that is used up among them. No partial sum is finer than the last bit of the smallest cell, so
 // no count is below 2^-g N with g = log2(N / smallest cell) + 54, and no logarithm is above g + 60 in size. An error of
-// e in each count of both sides then moves their H, which has 2 (K + 1) terms v log2 v, by at most 2 (K + 1) (g + 62) e,
-// and that is at most 2 K (3 g + 16) e, as g is above 54 and K above 1: with one category H is 0.
+// e in each count of both sides then moves their H, of 2 (K + 1) terms v log2 v, by at most 2 (K + 1) (g + 62) e, and
+// that is at most 2 K (3 g + 16) e, as g is above 54 and K above 1: with one category H is 0.
 //
 // For a million rows of three categories this takes a scan from 60 ms to less than one where sums are exact, and to 5
 // where they are not and rows have to be summed one by one.
@@ -106,7 +106,7 @@ void CutScan::CountBlocks()
     if (fIsExact)
         return;
     fSmallestCell = std::numeric_limits<double>::infinity();
-    for (const double cell : fTable) // without a branch: which cells are 0 no processor foresees
+    for (const double cell : fTable) // without a branch, since no processor predicts which cells are 0
         fSmallestCell = std::min(fSmallestCell, cell > 0.0 ? cell : std::numeric_limits<double>::infinity());
 }
 
@@ -202,14 +202,14 @@ bool CutScan::IsSamePurePair(int row) const
     return numCommon == 1;
 }
 
-/// Both rows around each pair of neighbours that is not pure in one and the same category.
+/// Candidates are both rows of each pair of neighbours that is not pure in one and the same category.
 bool CutScan::IsCandidate(int row, Range range) const
 {
     return (row < range.fLast && !IsSamePurePair(row)) || (row > range.fFirst && !IsSamePurePair(row - 1));
 }
 
-/// Moves rows from the right side to the left, row by row. That is the order of additions which counts: between two
-/// candidates there is more than one row only where all of them are pure in one category.
+/// Moves rows from the right side to the left, row by row. Sums are defined by this order of additions.
+/// More than one row lies between two candidates only where all of these rows are pure in one category.
 void CutScan::MoveRows(int first, int last, CountVector& left, CountVector& right) const
 {
     double leftWeight = left[0]; // apart from the vectors, so that they stay in registers
@@ -402,7 +402,7 @@ void CutScan::TrySegment(std::size_t segment, Range range, double margin, Best& 
     for (int row = firstRow; row <= lastRow; ++row)
     {
         for (; nextRow <= LastLeftRow(row); ++nextRow) MoveRow(nextRow, left, right, estimate);
-        // Asked this way round, so that an estimate that is not a number leaves nothing out.
+        // The comparison is false for an estimate that is a NaN, so that it leaves nothing out.
         const bool isHopeless = best.fRow != kNoRow && estimate.Of(left[0], right[0]) > best.fEntropy * weight + margin;
         if (!isHopeless && IsCandidate(row, range))
             TryRow(row, left, right, best);

@@ -28,7 +28,7 @@ public:
     /// two sides of the row. The range holds two rows at least.
     int FindBestCut(int first, int last, CountVector& left, CountVector& right);
 
-    /// The same among the cuts that leave rows on both sides. Every one of them is worked out.
+    /// As FindBestCut, but only among the cuts that leave rows on both sides. Every one of them is worked out.
     int FindBestInnerCut(int first, int last, CountVector& left, CountVector& right) const;
 
     /// Whether a cut at `row` leaves rows of the range on both sides.

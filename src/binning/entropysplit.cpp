@@ -1,9 +1,9 @@
 // Recursive entropy minimisation under the minimum description length criterion, after U. M. Fayyad and K. B. Irani,
 // Multi-interval discretization of continuous-valued attributes for classification learning, IJCAI 1993.
 //
-// Our decisions: N is the weight of a range and need not be whole. A category present on both sides of a cut counts
-// twice in the Delta term. The rows tried are both rows around each pair of neighbours that is not pure in one and the
-// same category. A cut point is the border of a row, no midpoint. Of equal candidates the lowest row stays.
+// Our decisions are these. N is the weight of a range and need not be whole. A category present on both sides of a cut
+// counts twice in the Delta term. The rows tried are both rows around each pair of neighbours that is not pure in one
+// and the same category. A cut point is the border of a row, no midpoint. Of equal candidates the lowest row stays.
 //
 // The order of the additions is part of the result. Logarithms of 0 and of negative numbers, and 0 / 0, are relied on:
 // a NaN compares false, so it never becomes better than what is there, and never passes the test.

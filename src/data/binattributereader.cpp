@@ -17,7 +17,7 @@ using MCMV::gMissingValue;
 namespace
 {
 
-/// Null if there is not the memory.
+/// Null if the memory doesn't suffice.
 template<class Tuple>
 std::unique_ptr<std::vector<Tuple>> MakeTuples(unsigned int count)
 {
@@ -170,7 +170,7 @@ MCStatus BINAttributeReader::LoadVariable(int attribute)
     return LoadAttribute(position);
 }
 
-/// Makes the tuples of one position. The same turn of all files belongs to the same record.
+/// Makes the tuples of one position. The k-th values of all files belong to one record.
 MCStatus BINAttributeReader::LoadAttribute(int position)
 {
     fNumTuples = 0;
@@ -227,7 +227,7 @@ bool BINAttributeReader::AddTuples(std::vector<Tuple>& tuples, const double* val
 {
     const double* const targets = fHasTarget ? fTargetIterator->GetBlock() : nullptr;
     const double* const weights = fHasWeight ? fWeightIterator->GetBlock() : nullptr;
-    // Locals, since the compiler must take every tuple that is stored for a member of the same type.
+    // The sums are local variables: as members they would be reloaded after each tuple stored, which might alias them.
     unsigned int numTuples = fNumTuples;
     double total = fTotalWeight;
     double totalWithMissing = fTotalWeightWithMissing;

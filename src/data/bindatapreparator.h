@@ -22,8 +22,8 @@ class ProgressListener;
 /// Stands between the variable list and the temporary files: works out how the host's variables map onto the fields of
 /// a processed record, reads the host's records once, and spools them to one temporary file per field.
 ///
-/// It puts together the layout of a processed record (RecordLayout), the temporary files (RecordFiles) and the pass over
-/// the records (DataPass).
+/// It puts together the layout of a processed record (RecordLayout), the temporary files (RecordFiles) and the pass
+/// over the records (DataPass).
 class BINDataPreparator
 {
 public:
@@ -52,14 +52,15 @@ public:
     ///         is nothing else to bin against, else a warning.
     MCBinning::MCStatus ProcessRecord(const MCCommon::Record& input, MCCommon::Record& processed);
 
-    /// Picks a name for each position's file, as RecordFiles::Init. BINStatusInvalidVarList if a variable has no position.
+    /// Picks a name for each position's file, as RecordFiles::Init. BINStatusInvalidVarList if a variable has no
+    /// position.
     MCBinning::MCStatus InitTempFiles();
 
     /// As RecordFiles::Flush.
     MCBinning::MCStatus FlushBuffer() { return fFiles.Flush(); }
 
     /// Sets `*usable` to whether the position can be binned or binned against. BINStatusIndexOutOfRange for a position
-    /// that there is not; `*usable` stays as it was.
+    /// that doesn't exist; `*usable` stays as it was.
     MCBinning::MCStatus IsVariableUsable(int position, bool* usable) const;
 
     /// Whether the position dropped out in the pass, so that its file holds fewer elements than there are records.

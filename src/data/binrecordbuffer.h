@@ -8,10 +8,11 @@
 class BINRecordBuffer
 {
 public:
-    /// Makes all rows empty, with room for `cols` values each. False if a size is negative or there is not the memory.
+    /// Makes all rows empty, with room for `cols` values each. False if a size is negative or the memory
+    /// doesn't suffice.
     bool Init(int rows, int cols);
 
-    /// Stores the value behind the last one of the row. False, with nothing done, for a row that there is not or that
+    /// Stores the value behind the last one of the row. False, with nothing done, for a row that doesn't exist or
     /// is full.
     bool Append(int row, double value);
 
@@ -21,7 +22,7 @@ public:
     /// Empties all rows; the memory stays.
     void Reset();
 
-    /// The values of a row, RowFill(row) of them; null and 0 for a row that there is not.
+    /// The values of a row, RowFill(row) of them; null and 0 for a row that doesn't exist.
     const double* RowData(int row) const;
     int RowFill(int row) const;
 

@@ -174,7 +174,7 @@ bool DataPass::ProcessCategory(double code, int position, Record& processed)
 }
 
 /// Stores a code as it came, with its fraction. \return false if it doesn't fit, and then the position has dropped out.
-/// A position that is out already takes nothing, and nothing is said of it again.
+/// A position that has dropped out stores nothing more and is not reported again.
 bool DataPass::StoreCode(double code, int position, Record& processed)
 {
     const auto index = static_cast<std::size_t>(position);

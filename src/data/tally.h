@@ -7,8 +7,8 @@
 
 #include <vector>
 
-// A tally adds up the weights of a pair's tuples in a value table: one row of `numCategories` cells for each interval of
-// values, in rising order. Of the tuples the first `numTuples` count, which are sorted by value.
+// A tally adds up the weights of a pair's tuples in a value table: one row of `numCategories` cells for each interval
+// of values, in rising order. Of the tuples the first `numTuples` count, which are sorted by value.
 
 /// Makes one row for each distinct value. `numDistinct` says how many there are; `values` arrives empty and gets them.
 void TallyDistinct(const std::vector<BINSortTuple>& tuples, unsigned int numTuples, unsigned int numDistinct,

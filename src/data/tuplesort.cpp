@@ -170,8 +170,8 @@ private:
         }
     }
 
-    /// Puts each tuple into the part of its digit, and takes on with the one that lay there. The parts have their turns
-    /// in an order that no processor foresees: untold where each goes on, it waits for every new line of memory.
+    /// Puts each tuple into the part of its digit, and goes on with the one that lay there. The next part is as good as
+    /// random, so no processor predicts it: without a prefetch every part would miss the cache at its next line.
     static void DealInPlace(Tuple* tuples, Digit digit, std::vector<std::uint32_t>& next,
                             const std::vector<std::uint32_t>& ends)
     {
@@ -200,7 +200,7 @@ private:
         return differing;
     }
 
-    /// As many bits as give each part a tuple or two.
+    /// Takes so many bits that a part gets a tuple or two.
     static Digit ChooseDigit(std::uint64_t differing, std::size_t count, int maxBits)
     {
         const int highest = HighestBit(differing);

@@ -32,7 +32,7 @@ bool BINSettings::SetNumberOfBins(int value)
 
 bool BINSettings::SetSmallBinDetectionThreshold(double value)
 {
-    // Asked this way round, the test refuses a NaN.
+    // The condition is negated so that it refuses a NaN.
     if (!(value >= 0.0 && value <= 1.0))
         return false;
     fSmallBinDetectionThreshold = value;

@@ -31,8 +31,8 @@ inline MCBinning::MCStatus CheckVarList(const BINVarList& varList)
     return status;
 }
 
-/// What both factories do: makes an `Algorithm` on copies of the arguments and hands it to the caller, or gives null
-/// and says why in `status`. The algorithm stands in `underConstruction` meanwhile.
+/// Does the work of both factories: makes an `Algorithm` on copies of the arguments and hands it to the caller, or
+/// gives null and says why in `status`. The algorithm stands in `underConstruction` meanwhile.
 template<class Algorithm, class Interface, class Settings>
 Interface* CreateAlgorithm(const Settings& settings, const BINVarList& varList, MCBinning::MCStatus& status,
                            std::unique_ptr<Interface>& underConstruction)
@@ -45,7 +45,7 @@ Interface* CreateAlgorithm(const Settings& settings, const BINVarList& varList, 
     {
         underConstruction = std::make_unique<Algorithm>(settings, varList);
     }
-    catch (...)
+    catch (...) // bad_alloc, length_error, or whatever the program's own operator new throws: no host code runs above
     {
         status = MakeError(MCBinning::BINStatusOutOfMemory);
         return nullptr;

@@ -3,7 +3,7 @@
 
 #include <ostream>
 
-/// What holds for both BINSettings and EFBINSettings.
+// Rules that BINSettings and EFBINSettings share.
 
 /// By default the data pass reports after every hundred thousand records.
 constexpr int kDefaultNSkippedCasesReports = 100000;
@@ -30,7 +30,7 @@ bool EqualInCommon(const Settings& left, const Settings& right)
            left.GetNumberOfBins() == right.GetNumberOfBins();
 }
 
-/// The lines of a display in front of those that the classes word differently.
+/// Writes the lines of a display in front of those that the classes word differently.
 template<class Settings>
 void DisplayFirstLines(std::ostream& os, const char* className, const Settings& settings)
 {
@@ -42,7 +42,7 @@ void DisplayFirstLines(std::ostream& os, const char* className, const Settings& 
        << std::endl;
 }
 
-/// The lines of a display behind them.
+/// Writes the lines of a display behind those that the classes word differently.
 template<class Settings>
 void DisplayLastLines(std::ostream& os, const char* className, const Settings& settings)
 {

@@ -47,7 +47,7 @@ BINCatNumEncoder& BINCatNumEncoder::operator=(const BINCatNumEncoder& other)
 {
     if (this == &other)
         return *this;
-    // Copied first: what can fail must not leave the map and the table at odds.
+    // The copy is made first, so that a failure doesn't leave the map and the table at odds.
     BINCatNumEncoder copy(other);
     fCodes.swap(copy.fCodes);
     fValues.swap(copy.fValues);

@@ -37,7 +37,7 @@ BINCatVar& BINCatVar::operator=(const BINCatVar& other)
 {
     if (this == &other)
         return *this;
-    // Copied first: what can fail must not leave a mixture of two variables.
+    // The copy is made first, so that a failure doesn't leave a mixture of two variables.
     BINCatVar copy(other);
     SwapVariable(copy);
     fNCategories = copy.fNCategories;

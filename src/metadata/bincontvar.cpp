@@ -18,7 +18,7 @@ BINContVar& BINContVar::operator=(const BINContVar& other)
 {
     if (this == &other)
         return *this;
-    // Copied first: what can fail must not leave a mixture of two variables.
+    // The copy is made first, so that a failure doesn't leave a mixture of two variables.
     BINContVar copy(other);
     SwapVariable(copy);
     fUserMissing.swap(copy.fUserMissing);

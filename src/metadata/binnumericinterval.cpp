@@ -59,7 +59,7 @@ bool BINNumericInterval::IsRightEndInfinite() const
 
 void BINNumericInterval::Display(std::ostream& os) const
 {
-    // By order and not by equality: an IEEE infinity reads as infinity too.
+    // The comparison is by order and not by equality, so that an IEEE infinity counts as infinite, too.
     os << "BINNumericInterval: ";
     if (fLeftEnd > -kInfiniteEnd)
         os << "[ " << fLeftEnd << ", ";

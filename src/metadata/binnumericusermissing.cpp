@@ -12,7 +12,7 @@ BINNumericUserMissing::BINNumericUserMissing(const BINNumericUserMissing& other)
 
 BINNumericUserMissing& BINNumericUserMissing::operator=(const BINNumericUserMissing& other)
 {
-    // Copied first: what can fail must not leave values without their labels.
+    // The copy is made first, so that a failure doesn't leave values without their labels.
     BINNumericUserMissing copy(other);
     fValues.swap(copy.fValues);
     fLabels.swap(copy.fLabels);

@@ -29,8 +29,8 @@ BINStringEncoder& BINStringEncoder::operator=(const BINStringEncoder& other)
 {
     if (this == &other)
         return *this;
-    // Copied first: what can fail must not leave the map and the table at odds. The swap takes the map's nodes along,
-    // so the copy's links stay good.
+    // The copy is made first, so that a failure doesn't leave the map and the table at odds. The swap takes the map's
+    // nodes along, so the copy's links stay good.
     BINStringEncoder copy(other);
     fCodes.swap(copy.fCodes);
     fLinks.swap(copy.fLinks);

@@ -14,7 +14,7 @@ BINStringInterval::BINStringInterval(const BINStringInterval& other) = default;
 
 BINStringInterval& BINStringInterval::operator=(const BINStringInterval& other)
 {
-    // Copied first, so that no mixture of two intervals is left if the second string finds no memory.
+    // The copy is made first, so that no mixture of two intervals is left if the second string finds no memory.
     BINStringInterval copy(other);
     fLeftEnd.swap(copy.fLeftEnd);
     fLeftIncluded = copy.fLeftIncluded;

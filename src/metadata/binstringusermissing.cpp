@@ -12,7 +12,7 @@ BINStringUserMissing::BINStringUserMissing(const BINStringUserMissing& other) = 
 
 BINStringUserMissing& BINStringUserMissing::operator=(const BINStringUserMissing& other)
 {
-    // Copied first: what can fail must not leave values without their labels.
+    // The copy is made first, so that a failure doesn't leave values without their labels.
     BINStringUserMissing copy(other);
     fValues.swap(copy.fValues);
     fLabels.swap(copy.fLabels);

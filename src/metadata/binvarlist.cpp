@@ -22,7 +22,7 @@
 namespace
 {
 
-/// The index where there is none.
+/// Stands for no index.
 constexpr int kNone = -1;
 
 /// A categorical variable whose encoder knows the values and the labels.
@@ -48,7 +48,8 @@ bool DeclareUserMissing(IBINVariable& variable, IBINUserMissing::DataType type, 
     if (IBINUserMissing* held = variable.GetUserMissingInfo())
         return held->GetDataType() == type && declare(static_cast<UserMissing&>(*held));
 
-    // Filled before it is handed over, so that a failure on the way leaves the variable without an object.
+    // The object is filled before it is handed over, so that a failure on the way leaves the variable without an
+    // object.
     auto made = std::make_unique<UserMissing>();
     if (!declare(*made) || !variable.SetUserMissingInfo(made.get()))
         return false;
@@ -72,7 +73,7 @@ BINVarList& BINVarList::operator=(const BINVarList& other)
 {
     if (this == &other)
         return *this;
-    // Copied first: what can fail must not leave half a list.
+    // The copy is made first, so that a failure doesn't leave half a list.
     BINVarList copy(other);
     fVars.swap(copy.fVars);
     fNames.swap(copy.fNames);
@@ -209,7 +210,8 @@ bool BINVarList::SetVariableRole(int index, IBINVariable::VariableRole role)
     IBINVariable* variable = At(index);
     if (!variable)
         return false;
-    // Whoever has this role is asked for its rounding when the records are read; only the weight can do that.
+    // The encoder of this role's variable rounds when the records are read, and only a weight variable has one that
+    // can.
     if (role == IBINVariable::RoleFrequencyWeight && index != fWeightIndex)
         return false;
 
@@ -337,6 +339,7 @@ bool BINVarList::IsValidList(std::vector<int>& oneCategory, std::vector<int>& no
 
 void BINVarList::Display(std::ostream& os) const
 {
+    // The text is promised to the letter, with its odd beginning: a backspace, and then "INegin".
     os << "\bINegin display of BINVarList object.\n";
     os << "Total variables: " << Size() << std::endl;
     os << "Number of Continuous Variables = " << fNumContVars << std::endl;

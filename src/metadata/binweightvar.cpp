@@ -23,7 +23,7 @@ BINWeightVar& BINWeightVar::operator=(const BINWeightVar& other)
 {
     if (this == &other)
         return *this;
-    // Copied first: what can fail must not leave a mixture of two variables.
+    // The copy is made first, so that a failure doesn't leave a mixture of two variables.
     BINWeightVar copy(other);
     SwapVariable(copy);
     fUserMissing.swap(copy.fUserMissing);

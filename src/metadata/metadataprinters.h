@@ -5,8 +5,8 @@
 
 #include <iosfwd>
 
-/// Each writes the words for a number and ends the line. Of a level or role without a name the number is written, of
-/// such a rounding option nothing.
+/// Each writes the words for a number and ends the line. A level or role without a name is written as its number, a
+/// rounding option without a name not at all.
 void DisplayMeasureLevel(std::ostream& os, IBINVariable::MeasureLevel level);
 void DisplayVariableRole(std::ostream& os, IBINVariable::VariableRole role);
 void DisplayRoundingOption(std::ostream& os, IBINVariable::BINWRoundingOption option);

@@ -14,7 +14,7 @@
 /// another behind the back of the list that owns it. May be called by several threads at a time.
 void NoteNameChange();
 
-/// Finds the variables of a list by their names, without a look at each of them.
+/// Finds the variables of a list by their names without comparing each one.
 ///
 /// It holds copies of the names, by variable index. Find() can be trusted as long as the index is up to date.
 class BINVarList::NameIndex

@@ -13,7 +13,7 @@ class BINVarList;
 /// A record has one position for the list's target, one for its weight, and one for each attribute. A variable has
 /// none if its role is undefined, or that of a target or a weight without its being the list's; nor has one that the
 /// target index names although its role is another. No data can be prepared for a list with such a variable, nor for
-/// one whose target index names no variable at all, which is then what is given.
+/// one whose target index names no variable at all; that index is returned then.
 int FindVariableWithoutPosition(const BINVarList& list);
 
 /// Tells where the variables of a list stand in a processed record: target, weight, attributes in list order, target
@@ -39,7 +39,7 @@ public:
     /// By variable index; -1 for a variable without a position.
     const std::vector<int>& GetPositions() const { return fPositions; }
 
-    /// As GetPositions(), and -1 for an index that there is not.
+    /// As GetPositions(), and -1 for an index that doesn't exist.
     int PositionOf(int variable) const;
 
     IBINVariable::MeasureLevel GetMeasureLevel(int variable) const

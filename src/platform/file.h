@@ -17,7 +17,7 @@ public:
     ~File()
     {
         if (IsOpen())
-            Close(); // whoever has written asks Close() for its result before
+            Close(); // a writer has called Close() by then, for its result
     }
 
     bool IsOpen() const { return fStream != nullptr; }

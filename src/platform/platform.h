@@ -6,7 +6,7 @@
 #include <cstdio>
 #include <string>
 
-/// What a look at a candidate name for a new file, or the attempt to make it, found.
+/// Outcome of probing for, or creating, a file.
 enum class NameState
 {
     kFree,             ///< nothing bears the name; after a creation: the file is made
@@ -16,7 +16,7 @@ enum class NameState
     kFailed            ///< of a creation only: any other failure
 };
 
-/// What tells one file from every other while it exists, so that a file put under a name of ours isn't taken for ours.
+/// Identifies a file while it exists, so that a file that somebody puts under a name of ours isn't taken for ours.
 struct FileIdentity
 {
     std::uint64_t fDevice = 0;

@@ -91,7 +91,7 @@ MCStatus BINOutput::SetAttributeTargetResults(MCStatus status, const std::set<do
 
 MCStatus BINOutput::GetAttributeTargetCutPoints(int attribute, int target, BINAttributeTargetResults& results) const
 {
-    // Only pairs are ever stored, so what is none is not found.
+    // Indices that can't form a pair were never stored, so they are not found.
     const auto found = fResultIndex.find({attribute, target});
     if (found == fResultIndex.end())
         return MakeError(MCBinning::BINStatusIndexOutOfRange);

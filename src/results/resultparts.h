@@ -10,8 +10,8 @@
 #include <vector>
 
 /// What the results of both kinds of run, and the stores that hold them, have in common. `Results` is
-/// BINAttributeTargetResults or BINAttributeResults, whose displays differ only in the lines that one of them hasn't
-/// got.
+/// BINAttributeTargetResults or BINAttributeResults, whose displays differ only in the lines that one of them
+/// lacks.
 
 /// Replaces `results` by a copy of the entries of a store.
 template<class Results>
@@ -27,11 +27,11 @@ MCBinning::MCStatus CopyAllEntries(const std::vector<Results>& entries, std::vec
 template<class Results>
 MCBinning::MCStatus CopyEntry(const Results& entry, Results& results)
 {
-    results = Results(entry); // as above
+    results = Results(entry); // by way of a copy: a failing allocation leaves `results` whole
     return results.GetStatus();
 }
 
-/// The lines up to the attribute.
+/// Writes the lines up to the attribute.
 template<class Results>
 void DisplayHead(std::ostream& os, const char* className, const Results& results)
 {
@@ -40,7 +40,7 @@ void DisplayHead(std::ostream& os, const char* className, const Results& results
     os << "BINDataTuple   attribute = " << results.GetAttributeIndex() << std::endl;
 }
 
-/// The lines from the number of distinct values to the maximum.
+/// Writes the lines from the number of distinct values to the maximum.
 template<class Results>
 void DisplayFigures(std::ostream& os, const Results& results)
 {
@@ -51,7 +51,7 @@ void DisplayFigures(std::ostream& os, const Results& results)
     os << "Maximum = " << results.GetMaximum() << std::endl;
 }
 
-/// The lines from the status to the heading of the counts.
+/// Writes the lines from the status to the heading of the counts.
 template<class Results>
 void DisplayCutPoints(std::ostream& os, const Results& results)
 {
@@ -65,14 +65,14 @@ void DisplayCutPoints(std::ostream& os, const Results& results)
     os << "The CellCounts are" << std::endl;
 }
 
-/// One line of counts.
+/// Writes one line of counts.
 inline void DisplayCounts(std::ostream& os, const std::vector<double>& counts)
 {
     for (double count : counts) os << count << "  ";
     os << std::endl;
 }
 
-/// The whole display of a store.
+/// Writes the whole display of a store.
 template<class Results>
 void DisplayEntries(std::ostream& os, const char* className, const std::vector<Results>& entries)
 {

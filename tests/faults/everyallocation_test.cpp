@@ -66,7 +66,7 @@ auto OrElse(const Step& step, const OtherStep& otherStep)
     }
 }
 
-/// Takes the step once more if memory failed it: nothing half done may be in the way.
+/// Repeats a step whose allocation failed: nothing half done may be in the way.
 template<class Step>
 auto Again(const Step& step)
 {

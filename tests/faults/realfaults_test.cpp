@@ -178,7 +178,7 @@ void Strike(const Mishap& mishap, const std::string& path)
     utimensat(AT_FDCWD, path.c_str(), times, AT_SYMLINK_NOFOLLOW);
 }
 
-// When a mishap comes: ahead of this record of a run of two flushes.
+// The record of a run of two flushes ahead of which a mishap comes.
 constexpr int kAheadOfTheRun = -1;
 constexpr int kAtTheFirstRecord = 0; ///< the names are picked, but no file is made
 constexpr int kAtTheSecondFlush = kRowsPerFlush;
@@ -287,7 +287,7 @@ TEST(RealFault, AFullDiskEndsThePass)
         {"size=128k", 30000, 10000}, // at its second file
         {"size=160k", 30000, 20000}, // at the second flush
         {"size=160k", 10300, 10300}, // at the last flush, which is so small that only the closing fails
-        {"size=4k", 200, 200},       // at the only flush, in the same way
+        {"size=4k", 200, 200},       // at the only flush, where only the closing fails
         {"nr_inodes=2", 200, 200}};  // at the making of the second file
     for (const auto& [options, rows, rowsRead] : cases)
     {
@@ -451,7 +451,7 @@ TEST(RealFault, AFileWhoseTimeOfBirthIsNotToldAnyMoreIsStillOurs)
         GTEST_SKIP() << "no system call can be forbidden here";
     EXPECT_EQ(0, code);
 
-    // The other way round: not told at first.
+    // The reverse: the time of birth is unknown when the file is made, and known when it is removed.
     std::FILE* file = nullptr;
     FileIdentity identity;
     ASSERT_EQ(NameState::kFree, SystemPlatform()->CreateNewFile(dir.File("f"), file, identity));

@@ -7,9 +7,9 @@
 #include <set>
 #include <vector>
 
-/// The entropy split as it is told, without a thought for speed: recursive, every candidate's sides moved cell by cell
-/// in the order in which the sums are defined, every logarithm worked out. It is what faster forms are held to, bit by
-/// bit.
+/// The entropy split in its plain form, written for clarity and not for speed: recursive, every candidate's sides moved
+/// cell by cell in the order in which the sums are defined, every logarithm worked out. It is what faster forms are
+/// held to, bit by bit.
 class PlainSplit
 {
 public:

@@ -1,6 +1,6 @@
 // What must not change a result: the order of the records, the order of the variables in a call, a weight in place of
-// repeated records, and what the object did before. Exact to the last bit, so the weights here are whole numbers or
-// halves.
+// repeated records, and what the object did before. Results are compared to the last bit, so the weights here are whole
+// numbers or halves.
 
 #include "support/runs.h"
 

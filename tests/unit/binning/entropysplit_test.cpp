@@ -273,8 +273,8 @@ TEST(EntropySplit, EqualsThePlainFormOnTablesOfLongSegments)
 TEST(EntropySplit, EqualsThePlainFormWhereSumsCeaseToBeExact)
 {
     // 148 cells of one unit and a heavy one, which brings the total to below, to exactly, or to above 2^53 units. Where
-    // the heavy cell alone is 2^53, a sum loses the units behind it one by one, and comes out as 2^53 if no category but
-    // the heavy one has more than a unit.
+    // the heavy cell alone is 2^53, a sum loses the units behind it one by one, and comes out as 2^53 if no category
+    // but the heavy one has more than a unit.
     for (const int exponent : {0, -4, -40})
     {
         for (const int heavy : {-400, -149, -148, -147, 0})
@@ -287,7 +287,9 @@ TEST(EntropySplit, EqualsThePlainFormWhereSumsCeaseToBeExact)
                 rows.insert(rows.begin(), std::vector<double>(static_cast<std::size_t>(numCategories), 0.0));
                 rows[0][0] = 0x1p53 + heavy;
                 for (std::vector<double>& row : rows)
+                {
                     for (double& cell : row) cell = std::ldexp(cell, exponent);
+                }
                 EqualsThePlainForm(rows, "exponent " + std::to_string(exponent) + " heavy " + std::to_string(heavy) +
                                              " categories " + std::to_string(numCategories));
             }
@@ -308,7 +310,9 @@ TEST(EntropySplit, EqualsThePlainFormAtTheEndsOfTheRange)
                 Rows rows = RandomRows(dice, 200 + dice.Below(300), 2 + dice.Below(3), kind, 40);
                 UseUp(rows);
                 for (std::vector<double>& row : rows)
+                {
                     for (double& cell : row) cell = std::ldexp(cell, exponent);
+                }
                 const std::string what = CaseName(kind, seed) + " exponent " + std::to_string(exponent);
                 numWithCuts += EqualsThePlainForm(rows, what) ? 1 : 0;
             }

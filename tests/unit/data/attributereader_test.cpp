@@ -44,7 +44,7 @@ public:
 private:
     RecordTable fRecords;
     TestPreparator fPreparator;
-    BINAttributeReader fReader; // before the preparator in destruction: its files are closed when they go
+    BINAttributeReader fReader; // goes before the preparator, which removes the files that it has open
 };
 
 /// Fields of a record: attribute, target, weight, attribute.

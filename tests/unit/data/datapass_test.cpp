@@ -105,9 +105,9 @@ TEST(DataPass, WhatCountsAsACode)
     for (const Case& c : {
              Case{255.9, true, true, 255.9}, Case{256, false, false, 0}, Case{-0.5, true, true, -0.5},
              Case{-1, true, true, gMissingValue},
-             Case{-1.5, true, false, gMissingValue}, // of a target the whole part counts
+             Case{-1.5, true, false, gMissingValue}, // the whole part of a target's code counts
              Case{-2, false, false, 0}, Case{kNaN, false, false, 0}, Case{kInfinity, false, false, 0},
-             Case{4294967295.0, false, false, 0}, // -1, were it cast without a look
+             Case{4294967295.0, false, false, 0}, // would be -1 if it were cast to an int before the test
          })
     {
         SCOPED_TRACE(c.fCode);

@@ -50,7 +50,7 @@ struct TestFiles
 TEST(BinaryRecordIterator, GivesEachValueOnceAndAgainAfterRewind)
 {
     const TempDir directory;
-    // The third has half a value at its end, which is none.
+    // The third file ends in half a value, which doesn't count.
     for (const auto& [values, extraBytes] :
          {std::pair<std::vector<double>, std::size_t>{{}, 0}, {{1.5}, 0}, {{1, 2, 3}, 4}})
     {
