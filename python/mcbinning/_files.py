@@ -38,24 +38,28 @@ _ROWS_AT_ONCE = 2048
 def open_relation(relation: Any, name: str | None = None, explain: Callable[[str], str] | None = None) -> Source:
     """A query of DuckDB's."""
     return Source(
-        lambda names: _read(lambda: relation if names is None else relation.project(_quote_all(names)), explain),
+        lambda names: _guard(lambda: _read(relation, names, explain), explain),
         False,
         name=name,
-        describe=lambda: columns_of(_read(lambda: relation.limit(0), explain)),
+        describe=lambda: columns_of(_guard(lambda: open_stream(relation.limit(0)), explain)),
     )
 
 
-def _read(query: Callable[[], Any], explain: Callable[[str], str] | None) -> _core.Table:
+def _read(relation: Any, names: Sequence[str] | None, explain: Callable[[str], str] | None) -> _core.Table:
     """In small batches: DuckDB holds several, and those of wide tables are large."""
+    chosen = relation if names is None else relation.project(_quote_all(names))
+    begin = getattr(chosen, "to_arrow_reader", None) or chosen.fetch_record_batch
+    return open_stream(begin(_ROWS_AT_ONCE), explain)
+
+
+def _guard(start: Callable[[], _core.Table], explain: Callable[[str], str] | None) -> _core.Table:
+    """Starts a query, with its failures as those of a stream: some versions look far ahead for the first batch."""
     import duckdb
 
     try:
-        relation = query()
-        begin = getattr(relation, "to_arrow_reader", None) or relation.fetch_record_batch
-        reader = begin(_ROWS_AT_ONCE)
-    except duckdb.Error as error:  # some versions look far ahead for the first batch
+        return start()
+    except duckdb.Error as error:
         raise StreamError(explain(str(error)) if explain else str(error), 0) from error
-    return open_stream(reader, explain)
 
 
 def _quote(name: str) -> str:
