@@ -1,0 +1,99 @@
+#include "bins/weightgrid.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <limits>
+#include <utility>
+
+namespace
+{
+
+constexpr int kLeastExponent = std::numeric_limits<double>::min_exponent - std::numeric_limits<double>::digits;
+
+constexpr std::array<std::pair<WeightRounding, const char*>, 3> kNames{
+    {{WeightRounding::kNone, "none"}, {WeightRounding::kTruncate, "truncate"}, {WeightRounding::kClosest, "closest"}}};
+
+double RoundToWhole(double weight, WeightRounding rounding)
+{
+    switch (rounding)
+    {
+    case WeightRounding::kNone:
+        break;
+    case WeightRounding::kTruncate:
+        return std::floor(weight);
+    case WeightRounding::kClosest:
+        return std::floor(weight + 0.5);
+    }
+    return weight;
+}
+
+/// The least whole E with n w <= 2^E. Both are split into a fraction in [0.5, 1) and a power of two, so that nothing
+/// overflows; where the rounded product of the fractions is 0.5, the fused operation tells whether the true one is more.
+int CeilLog2OfProduct(double n, double w)
+{
+    int exponentOfN = 0;
+    int exponentOfW = 0;
+    const double fractionOfN = std::frexp(n, &exponentOfN);
+    const double fractionOfW = std::frexp(w, &exponentOfW);
+    const int exponent = exponentOfN + exponentOfW;
+    if (std::fma(fractionOfN, fractionOfW, -0.5) > 0.0)
+        return exponent;
+    return fractionOfN == 0.5 && fractionOfW == 0.5 ? exponent - 2 : exponent - 1;
+}
+
+/// The exponent of g. Every double is a multiple of the least denormal, so a finer grid is of no use.
+int ComputeExponent(const WeightTally& tally)
+{
+    constexpr int kBitsOfSum = 52;
+    if (tally.numPositive <= 0)
+        return kLeastExponent;
+    const int exponent = CeilLog2OfProduct(static_cast<double>(tally.numPositive), tally.largest) - kBitsOfSum;
+    return std::clamp(exponent, kLeastExponent, std::numeric_limits<double>::max_exponent - 1);
+}
+
+} // namespace
+
+const char* GetName(WeightRounding rounding)
+{
+    return kNames[static_cast<std::size_t>(rounding)].second;
+}
+
+std::optional<WeightRounding> FindWeightRounding(std::string_view name)
+{
+    for (const auto& [rounding, known] : kNames)
+        if (name == known)
+            return rounding;
+    return std::nullopt;
+}
+
+void WeightTally::Add(double weight)
+{
+    const double rounded = RoundToWhole(weight, rounding);
+    if (!(rounded > 0.0))
+        return;
+    ++numPositive;
+    largest = std::max(largest, rounded);
+}
+
+WeightGrid::WeightGrid(const WeightTally& tally) : fRounding(tally.rounding), fExponent(ComputeExponent(tally)) {}
+
+double WeightGrid::Round(double weight)
+{
+    const double rounded = RoundToWhole(weight, fRounding);
+    if (!(rounded > 0.0))
+        return 0.0;
+    // In units of g a weight is at most 2^52. One that is so small that its number of units is a denormal, and loses
+    // digits, is far below half a unit.
+    const double units = std::max(1.0, std::nearbyint(std::ldexp(rounded, -fExponent)));
+    double onGrid = std::ldexp(units, fExponent);
+    if (std::isinf(onGrid)) // the largest doubles lie nearest to 2^1024, which is none
+        onGrid = std::ldexp(units - 1.0, fExponent);
+    fHasMoved = fHasMoved || onGrid != rounded;
+    return onGrid;
+}
+
+std::optional<double> WeightGrid::GetStep() const
+{
+    return fHasMoved ? std::optional(std::ldexp(1.0, fExponent)) : std::nullopt;
+}
