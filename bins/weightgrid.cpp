@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <iterator>
 #include <limits>
 #include <utility>
 
@@ -76,24 +77,34 @@ void WeightTally::Add(double weight)
     largest = std::max(largest, rounded);
 }
 
-WeightGrid::WeightGrid(const WeightTally& tally) : fRounding(tally.rounding), fExponent(ComputeExponent(tally)) {}
+WeightGrid::WeightGrid(const WeightTally& tally) : fRounding(tally.rounding)
+{
+    const int exponent = ComputeExponent(tally);
+    const int exponents[] = {exponent / 2, exponent - exponent / 2};
+    for (std::size_t i = 0; i < std::size(exponents); ++i)
+    {
+        fFactors[i] = std::ldexp(1.0, exponents[i]);
+        fInverses[i] = std::ldexp(1.0, -exponents[i]);
+    }
+}
 
 double WeightGrid::Round(double weight)
 {
     const double rounded = RoundToWhole(weight, fRounding);
     if (!(rounded > 0.0))
         return 0.0;
-    // In units of g a weight is at most 2^52. One that is so small that its number of units is a denormal, and loses
-    // digits, is far below half a unit.
-    const double units = std::max(1.0, std::nearbyint(std::ldexp(rounded, -fExponent)));
-    double onGrid = std::ldexp(units, fExponent);
+    // In units of g a weight is at most 2^52, and from 2^52 on doubles are whole, so adding 2^52 rounds as nearbyint does,
+    // in a fraction of its time. Where a product is a denormal and loses digits, it is far below half a unit.
+    constexpr double kWholeFrom = 4503599627370496.0;
+    const double units = std::max(1.0, rounded * fInverses[0] * fInverses[1] + kWholeFrom - kWholeFrom);
+    double onGrid = units * fFactors[0] * fFactors[1];
     if (std::isinf(onGrid)) // the largest doubles lie nearest to 2^1024, which is none
-        onGrid = std::ldexp(units - 1.0, fExponent);
+        onGrid = (units - 1.0) * fFactors[0] * fFactors[1];
     fHasMoved = fHasMoved || onGrid != rounded;
     return onGrid;
 }
 
 std::optional<double> WeightGrid::GetStep() const
 {
-    return fHasMoved ? std::optional(std::ldexp(1.0, fExponent)) : std::nullopt;
+    return fHasMoved ? std::optional(fFactors[0] * fFactors[1]) : std::nullopt;
 }

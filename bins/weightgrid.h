@@ -59,7 +59,9 @@ public:
 
 private:
     WeightRounding fRounding;
-    int fExponent; ///< g is 2^fExponent
+    // g as the product of two powers of two, which are in the middle of the range of doubles, and so are their inverses.
+    double fFactors[2];
+    double fInverses[2];
     bool fHasMoved = false;
 };
 

@@ -97,18 +97,18 @@ void AppendCategories(std::vector<std::string>& row, const Bin& bin, const std::
     double others = bin.weight;
     for (const std::size_t code : codes)
     {
-        row.push_back(FormatNumber(bin.weights[code]));
+        row.push_back(FormatWeight(bin.weights[code]));
         others -= bin.weights[code];
     }
     if (!codes.empty() && codes.size() < bin.weights.size())
-        row.push_back(FormatDifference(others));
+        row.push_back(FormatWeight(others));
 }
 
 std::vector<std::string> MakeRow(const Findings& findings, const Result& result, const Bin& bin,
                                  const std::vector<double>& categoryWeights, const std::vector<std::size_t>& codes,
                                  const Extent& extent)
 {
-    std::vector<std::string> row{MakeLabel(findings, result, bin, extent.labelWidth), FormatNumber(bin.weight),
+    std::vector<std::string> row{MakeLabel(findings, result, bin, extent.labelWidth), FormatWeight(bin.weight),
                                  fmt::format("{:.1f}%", 100.0 * GetShare(bin.weight, result.weight))};
     AppendCategories(row, bin, codes);
     if (extent.nRates > 0)

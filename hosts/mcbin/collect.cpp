@@ -1,5 +1,7 @@
 #include "collect.h"
 
+#include "bins/infinitevalues.h"
+#include "bins/weightgrid.h"
 #include "columnplan.h"
 #include "figures.h"
 #include "findings.h"
@@ -40,7 +42,8 @@ void AddMissing(Variable& variable, const IBINUserMissing* missing)
 {
     if (const auto* const numeric = dynamic_cast<const BINNumericUserMissing*>(missing))
     {
-        variable.missingNumbers = numeric->GetDiscreteValues();
+        for (const double number : numeric->GetDiscreteValues())
+            variable.missingNumbers.push_back(DecodeInfinity(number));
         if (const BINNumericInterval* const interval = numeric->GetInterval())
             variable.missingInterval = {GetEnd(interval->GetLeftEnd()), GetEnd(interval->GetRightEnd())};
     }
@@ -61,11 +64,11 @@ void AddEncoder(Variable& variable, const IBINEncoder* encoder)
 
 std::optional<double> GetFigure(double figure)
 {
-    return figure == MCMV::gMissingValue ? std::nullopt : std::optional(figure);
+    return figure == MCMV::gMissingValue ? std::nullopt : std::optional(DecodeInfinity(figure));
 }
 
 template<class LibraryResult>
-Result MakeResult(const LibraryResult& result)
+Result MakeResult(const Findings& findings, const LibraryResult& result, const InfiniteValues& values)
 {
     Result made;
     made.status = result.GetStatus();
@@ -73,7 +76,8 @@ Result MakeResult(const LibraryResult& result)
     made.distinctValues = result.GetNDistinctValues();
     made.weight = result.GetTotalWeight();
     made.weightWithMissing = result.GetTotalWeightWithMissing();
-    made.cutPoints = result.GetCutPoints();
+    for (const double cutPoint : result.GetCutPoints())
+        made.cutPoints.push_back(values.DecodeCutPoint(cutPoint, findings.settings.isRightClosed));
     // With an error they are 0, which is no figure.
     if (!made.status.IsError())
     {
@@ -127,8 +131,7 @@ void AddPlan(Findings& findings, const ColumnPlan& plan)
     findings.leftOut = plan.DescribeLeftOut();
 }
 
-void AddVariables(Findings& findings, const ColumnPlan& plan, const Variables& variables,
-                  IBINVariable::BINWRoundingOption rounding)
+void AddVariables(Findings& findings, const ColumnPlan& plan, const Variables& variables)
 {
     const BINVarList& list = variables.list;
     for (int i = 0; i < static_cast<int>(list.Size()); ++i)
@@ -141,8 +144,12 @@ void AddVariables(Findings& findings, const ColumnPlan& plan, const Variables& v
         AddEncoder(variable, list.GetEncoderAt(i));
         if (variable.role == VariableRole::kWeight)
         {
+            const Column& column = plan.columns[variables.columns[static_cast<std::size_t>(i)]];
+            findings.recordsWithoutWeight = plan.nWithoutWeight;
             variable.kind = VariableKind::kWeight;
-            variable.rounding = rounding == IBINVariable::RoundTruncate ? "truncate" : "closest";
+            variable.rounding = GetName(plan.weights.rounding);
+            variable.missingNumbers = column.missingNumbers;
+            variable.missingInterval = column.missingInterval;
         }
         AddMissing(variable, source.GetUserMissingInfo());
         AddMissingTexts(variable, plan.columns[variables.columns[static_cast<std::size_t>(i)]]);
@@ -150,12 +157,19 @@ void AddVariables(Findings& findings, const ColumnPlan& plan, const Variables& v
     }
 }
 
-void AddResult(Findings& findings, const BINAttributeTargetResults& result)
+void AddWeightGrid(Findings& findings, const WeightGrid& grid)
 {
-    Result made = MakeResult(result);
-    made.target = result.GetTargetIndex();
-    if (!IsIn(findings, made.attribute) || !IsIn(findings, made.target))
+    for (Variable& variable : findings.variables)
+        if (variable.role == VariableRole::kWeight)
+            variable.weightGrid = grid.GetStep();
+}
+
+void AddResult(Findings& findings, const BINAttributeTargetResults& result, const std::vector<InfiniteValues>& values)
+{
+    if (!IsIn(findings, result.GetAttributeIndex()) || !IsIn(findings, result.GetTargetIndex()))
         return;
+    Result made = MakeResult(findings, result, values[static_cast<std::size_t>(result.GetAttributeIndex())]);
+    made.target = result.GetTargetIndex();
     // A row of a table that wasn't filled is empty.
     for (const std::vector<double>& row : result.GetCellCounts())
         if (!row.empty())
@@ -168,11 +182,11 @@ void AddResult(Findings& findings, const BINAttributeTargetResults& result)
     findings.results.push_back(made);
 }
 
-void AddResult(Findings& findings, const BINAttributeResults& result)
+void AddResult(Findings& findings, const BINAttributeResults& result, const std::vector<InfiniteValues>& values)
 {
-    Result made = MakeResult(result);
-    if (!IsIn(findings, made.attribute))
+    if (!IsIn(findings, result.GetAttributeIndex()))
         return;
+    Result made = MakeResult(findings, result, values[static_cast<std::size_t>(result.GetAttributeIndex())]);
     for (const double weight : result.GetCellCounts()) AddBin(made, weight, {});
     findings.results.push_back(made);
 }

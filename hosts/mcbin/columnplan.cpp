@@ -8,6 +8,7 @@
 #include "utf8.h"
 
 #include <algorithm>
+#include <cmath>
 #include <limits>
 
 namespace
@@ -197,7 +198,7 @@ void DeclareMissing(Column& column, const std::string& value, const std::string&
         const std::size_t colon = value.find(':');
         if (column.missingInterval)
             throw Failure("column " + Quote(column.name) + " has more than one interval of missing values");
-        constexpr double kInfinite = std::numeric_limits<double>::max();
+        constexpr double kInfinite = std::numeric_limits<double>::infinity();
         column.missingInterval = {ParseEnd(value.substr(0, colon), -kInfinite, declaration),
                                   ParseEnd(value.substr(colon + 1), kInfinite, declaration)};
         if (column.missingInterval->first > column.missingInterval->second)
@@ -241,6 +242,18 @@ void ThrowUnlessText(const ColumnPlan& plan)
 
 } // namespace
 
+bool Column::IsMissing(double number) const
+{
+    return (missingInterval && number >= missingInterval->first && number <= missingInterval->second) ||
+           (!missingNumbers.empty() &&
+            std::find(missingNumbers.begin(), missingNumbers.end(), number) != missingNumbers.end());
+}
+
+bool ColumnPlan::IsWeight(const Column& column, double number)
+{
+    return number >= 0.0 && std::isfinite(number) && !column.IsMissing(number);
+}
+
 std::vector<std::string> ColumnPlan::DescribeLeftOut() const
 {
     std::vector<std::string> described;
@@ -261,6 +274,7 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     ColumnPlan plan;
     plan.missingTexts = options.missingText;
     plan.isBadMissing = options.isBadMissing;
+    plan.weights.rounding = options.rounding;
     for (const std::string& name : table.GetColumnNames())
     {
         plan.columns.emplace_back();

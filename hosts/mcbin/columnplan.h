@@ -1,6 +1,8 @@
 #ifndef MCBIN_COLUMNPLAN_H
 #define MCBIN_COLUMNPLAN_H
 
+#include "bins/weightgrid.h"
+
 #include <cstddef>
 #include <optional>
 #include <set>
@@ -49,6 +51,9 @@ struct Column
 
     /// Whether its texts are numbers for the most part, written with signs that this tool doesn't read.
     bool IsOrnamented() const { return nOrnamented > nTexts / 2; }
+
+    /// Whether the number is declared missing.
+    bool IsMissing(double number) const;
 };
 
 /// All columns of a table in their order, and what is to be done with them.
@@ -59,6 +64,8 @@ struct ColumnPlan
     std::vector<std::string> missingTexts;                  ///< of all columns, beside the empty one
     bool isBadMissing = false;
     long nRows = 0;
+    WeightTally weights;     ///< of all rows, if a column holds weights
+    long nWithoutWeight = 0; ///< rows whose weight is missing
 
     /// Whether the field stands for a missing value as text, before it is looked at as a number.
     bool IsMissing(const Column& column, std::string_view field) const
@@ -68,6 +75,9 @@ struct ColumnPlan
         return (!missingTexts.empty() && IsIn(missingTexts, field)) ||
                (!column.missingTexts.empty() && IsIn(column.missingTexts, field));
     }
+
+    /// Whether the number can be a weight, or is missing or bad.
+    static bool IsWeight(const Column& column, double number);
 
     /// Columns of text that could have been attributes, each with an example of what it holds.
     std::vector<std::string> DescribeLeftOut() const;

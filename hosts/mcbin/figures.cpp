@@ -97,11 +97,12 @@ std::vector<const Result*> GetUncut(const Findings& findings)
 
 std::string FormatInterval(const Findings& findings, const Bin& bin)
 {
-    const bool isRightClosed = findings.settings.isRightClosed;
-    const bool isFirst = bin.left == -std::numeric_limits<double>::infinity();
-    const bool isLast = bin.right == std::numeric_limits<double>::infinity();
-    return (isFirst ? "(-inf" : (isRightClosed ? "(" : "[") + FormatNumber(bin.left)) + ", " +
-           (isLast ? "+inf)" : FormatNumber(bin.right) + (isRightClosed ? "]" : ")"));
+    constexpr double kInfinity = std::numeric_limits<double>::infinity();
+    const auto format = [](double end) { return (end == kInfinity ? "+" : "") + FormatNumber(end); };
+    const bool isInfinity = bin.left == bin.right;
+    const bool isLeftClosed = isInfinity || (!findings.settings.isRightClosed && bin.left != -kInfinity);
+    const bool isRightClosed = isInfinity || (findings.settings.isRightClosed && bin.right != kInfinity);
+    return (isLeftClosed ? "[" : "(") + format(bin.left) + ", " + format(bin.right) + (isRightClosed ? "]" : ")");
 }
 
 std::string DescribeValues(const Findings& findings, const Result& result)
@@ -114,6 +115,12 @@ std::string DescribeValues(const Findings& findings, const Result& result)
     };
     return std::to_string(result.distinctValues) + (attribute.IsCategorical() ? " categories" : " distinct values") +
            " from " + format(result.minimum) + " to " + format(result.maximum);
+}
+
+std::string DescribeWithoutWeight(const Findings& findings)
+{
+    const long number = findings.recordsWithoutWeight.value_or(0);
+    return number == 0 ? "" : std::to_string(number) + (number == 1 ? " record" : " records");
 }
 
 std::vector<std::string> GetBinCategories(const Findings& findings, const Result& result, const Bin& bin)

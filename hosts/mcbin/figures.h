@@ -43,11 +43,16 @@ std::vector<const Result*> SortByGain(const Findings& findings);
 /// Results without cut points, as they were found.
 std::vector<const Result*> GetUncut(const Findings& findings);
 
-/// "(1.5, 4]", with the bracket at the end that is closed; "(-inf, 1.5]" and "(4, +inf)" at the outside.
+/// "(1.5, 4]", with the bracket at the end that is closed; "(-inf, 1.5]" and "(4, +inf)" at the outside, which hold the
+/// infinities. An infinity that is a cut point has a bin for itself: "[-inf, -inf]" with the right end closed, and
+/// "[+inf, +inf]" with the left one.
 std::string FormatInterval(const Findings& findings, const Bin& bin);
 
 /// What values the attribute has, as in "22 distinct values from 0.1 to 2.5", or "3 categories from 'high' to 'low'".
 std::string DescribeValues(const Findings& findings, const Result& result);
+
+/// How many records were left out, as in "3 records"; empty if none was.
+std::string DescribeWithoutWeight(const Findings& findings);
 
 /// The categories of a categorical attribute that are in the bin, which must be one of the result's; of another
 /// attribute none.

@@ -36,6 +36,7 @@ struct Variable
     VariableRole role = VariableRole::kAttribute;
     std::vector<std::string> categories;   ///< by code; numbers as they are written
     std::string rounding;                  ///< of a weight: "truncate", "closest" or "none"
+    std::optional<double> weightGrid;      ///< of a weight: of what its values were made multiples, if one had to move
     std::vector<std::string> missingTexts; ///< of a categorical one, among them numbers; of others, only what is none
     std::vector<double> missingNumbers;
     std::optional<std::pair<double, double>> missingInterval; ///< infinite ends are IEEE infinities
@@ -76,7 +77,8 @@ struct Findings
     SettingOptions settings; ///< without the temporary directory
     std::string dataName;
     std::optional<long> records;
-    std::vector<std::string> missingText; ///< of all columns
+    std::optional<long> recordsWithoutWeight; ///< they count nowhere; nothing without a weight
+    std::vector<std::string> missingText;     ///< of all columns
     std::vector<Variable> variables;
     MCBinning::MCStatus status;
     std::vector<Result> results;

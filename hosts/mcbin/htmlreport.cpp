@@ -32,7 +32,7 @@ std::string GetHeading(const Findings& findings, const Result& result)
 
 std::string FormatMissing(const Result& result)
 {
-    return FormatDifference(result.weightWithMissing - result.weight);
+    return FormatWeight(result.weightWithMissing - result.weight);
 }
 
 /// Of a file: its name without the directories.
@@ -88,9 +88,9 @@ void PrintBinsHead(std::ostream& os, const Findings& findings, const Result& res
 void PrintBinRow(std::ostream& os, const Findings& findings, const Result& result, const Bin& bin,
                  const std::vector<double>& categoryWeights)
 {
-    os << "<tr><td>" << EscapeHtml(FormatBin(findings, result, bin)) << "</td><td>" << FormatNumber(bin.weight)
+    os << "<tr><td>" << EscapeHtml(FormatBin(findings, result, bin)) << "</td><td>" << FormatWeight(bin.weight)
        << fmt::format("</td><td>{:.1f}%</td>", 100.0 * GetShare(bin.weight, result.weight));
-    for (const double weight : bin.weights) os << "<td>" << FormatNumber(weight) << "</td>";
+    for (const double weight : bin.weights) os << "<td>" << FormatWeight(weight) << "</td>";
     if (HasTwoCategories(findings, result))
         os << fmt::format("<td>{:.1f}%</td><td>{:+.3f}</td><td>{:.4f}</td>",
                           100.0 * GetShare(bin.weights[1], bin.weight), GetWeightOfEvidence(bin, categoryWeights),
@@ -139,6 +139,8 @@ void PrintUncut(std::ostream& os, const Findings& findings)
                << "</li>\n";
         os << "</ul>\n";
     }
+    if (const std::string words = DescribeWithoutWeight(findings); !words.empty())
+        os << "<p>Left out, as they have no weight: " << words << "</p>\n";
     if (!findings.leftOut.empty())
         os << "<p>Left out, as they hold text: " << EscapeHtml(Join(findings.leftOut, ", ")) << "</p>\n";
 }

@@ -149,6 +149,8 @@ Variable GetVariable(const Json& json)
                                                            {"weight", VariableRole::kWeight}});
     if (!json.at("rounding").is_null())
         variable.rounding = json.at("rounding").get<std::string>();
+    // Not there in a file of an earlier release.
+    variable.weightGrid = GetFigure(json.value("grid", Json()));
     SetCategories(variable, json.at("categories"));
     SetMissing(variable, json.at("missing"));
     return variable;
@@ -265,6 +267,9 @@ Findings GetFindings(Json json)
     findings.dataName = data.at("name").is_null() ? "" : data.at("name").get<std::string>();
     if (!data.at("records").is_null())
         findings.records = GetInteger(data.at("records"));
+    const Json withoutWeight = data.value("records_without_weight", Json()); // as above
+    if (!withoutWeight.is_null())
+        findings.recordsWithoutWeight = GetInteger(withoutWeight);
     findings.missingText = data.at("missing_text").get<std::vector<std::string>>();
     for (const Json& variable : GetArray(json.at("variables"))) findings.variables.push_back(GetVariable(variable));
     findings.status = GetStatus(json.at("status"));

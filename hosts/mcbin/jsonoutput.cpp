@@ -120,6 +120,7 @@ Json MakeVariable(const Variable& variable)
     json["role"] = GetRole(variable.role);
     json["categories"] = MakeCategories(variable);
     json["rounding"] = variable.role == VariableRole::kWeight ? Json(variable.rounding) : Json(nullptr);
+    json["grid"] = MakeFigure(variable.weightGrid);
     json["missing"] = MakeMissing(variable);
     return json;
 }
@@ -164,6 +165,8 @@ Json MakeJson(const Findings& findings)
     json["settings"] = MakeSettings(findings.settings);
     json["data"]["name"] = findings.dataName;
     json["data"]["records"] = findings.records ? Json(*findings.records) : Json(nullptr);
+    json["data"]["records_without_weight"] =
+        findings.recordsWithoutWeight ? Json(*findings.recordsWithoutWeight) : Json(nullptr);
     json["data"]["missing_text"] = findings.missingText;
     json["variables"] = Json::array();
     for (const Variable& variable : findings.variables) json["variables"].push_back(MakeVariable(variable));

@@ -37,8 +37,8 @@ std::string DescribeWeights(double weight, long records)
     return fmt::format("note: {} records have weights that sum to {}, and the criterion takes a weight as a number of "
                        "records, so it cuts {} readily than {} records would justify; where the weights are no such "
                        "numbers, scale them to a sum of {}",
-                       records, FormatDifference(weight), weight > static_cast<double>(records) ? "more" : "less",
-                       records, records);
+                       records, FormatWeight(weight), weight > static_cast<double>(records) ? "more" : "less", records,
+                       records);
 }
 
 /// What is true of a column with texts that has no fault: either all of it or its texts don't count.

@@ -26,7 +26,8 @@ double ParseUnusualNumber(std::string_view text)
     // Too large a number and too small a one are the same to from_chars.
     if (result.ec == std::errc::result_out_of_range)
         value = std::strtod(std::string(text).c_str(), nullptr);
-    const bool isNumber = result.ec != std::errc::invalid_argument && result.ptr == end && std::isfinite(value);
+    const bool isTooLarge = result.ec == std::errc::result_out_of_range && std::isinf(value);
+    const bool isNumber = result.ec != std::errc::invalid_argument && result.ptr == end && !isTooLarge;
     return isNumber ? value : std::numeric_limits<double>::quiet_NaN();
 }
 
@@ -43,7 +44,7 @@ double ParseNumberOrNaN(std::string_view text)
     double value = 0.0;
     const char* const end = text.data() + text.size();
     const std::from_chars_result result = std::from_chars(text.data(), end, value);
-    const bool isNumber = result.ec == std::errc() && result.ptr == end && std::isfinite(value);
+    const bool isNumber = result.ec == std::errc() && result.ptr == end; // or a NaN, from "nan"
     return isNumber ? value : ParseUnusualNumber(text);
 }
 
@@ -79,7 +80,10 @@ std::string FormatFigure(const std::optional<double>& figure)
     return figure ? FormatNumber(*figure) : "none";
 }
 
-std::string FormatDifference(double value)
+std::string FormatWeight(double value)
 {
-    return fmt::format("{:.12g}", value);
+    constexpr double kSixDigits = 1e6;
+    if (value == std::floor(value))
+        return FormatNumber(value);
+    return std::fabs(value) < kSixDigits ? fmt::format("{:.6g}", value) : fmt::format("{:.0f}", value);
 }

@@ -6,8 +6,9 @@
 #include <string_view>
 
 /// The number that the whole of `text` spells with a decimal point, such as "-1", "+.5" or "2.5e-3", whatever the
-/// locale. Spaces around it don't count, and what is nearer to 0 than any double is 0. Nothing for all else: other
-/// text, even behind a number; a number that is too large for a double; "inf" and "nan".
+/// locale. Spaces around it don't count, and what is nearer to 0 than any double is 0. "inf" and "infinity" are one, in
+/// capital and small letters and with a sign. Nothing for all else: other text, even behind a number; a number that is
+/// too large for a double; "nan".
 std::optional<double> ParseNumber(std::string_view text);
 
 /// The same with a NaN for nothing. It is for millions of fields: an optional is stored in two parts and loaded as a
@@ -27,7 +28,8 @@ std::string FormatNumber(double value);
 /// The same of a figure that may be lacking: "none" then.
 std::string FormatFigure(const std::optional<double>& figure);
 
-/// A difference of such numbers, in 12 digits: 1 - 0.1 - 0.2 must not end in a row of digits that no one has weighed.
-std::string FormatDifference(double value);
+/// A sum of weights, for a person: in full if it is whole, and else in 6 digits, or as many as there are before the
+/// point.
+std::string FormatWeight(double value);
 
 #endif

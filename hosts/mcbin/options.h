@@ -1,9 +1,8 @@
 #ifndef MCBIN_OPTIONS_H
 #define MCBIN_OPTIONS_H
 
+#include "bins/weightgrid.h"
 #include "tablereader.h"
-
-#include <mcobnqrt/ibinvariable.h>
 
 #include <string>
 #include <vector>
@@ -16,7 +15,7 @@ struct ColumnOptions
 {
     std::string target; ///< a name, not a pattern; empty without one
     std::string weight; ///< a name, not a pattern; empty without one
-    IBINVariable::BINWRoundingOption rounding = IBINVariable::RoundClosest;
+    WeightRounding rounding = WeightRounding::kNone;
     std::vector<std::string> attributes; ///< empty: all that can be
     std::vector<std::string> exclude;
     std::vector<std::string> categorical;

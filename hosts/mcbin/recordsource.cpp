@@ -26,8 +26,8 @@ const BINStringEncoder* FindEncoder(const BINVarList& list, int index)
 
 TableRecordSource::TableRecordSource(TableReader& table, const ColumnPlan& plan, const Variables& variables,
                                      Progress& progress)
-    : fTable(table), fPlan(plan), fProgress(progress), fRowsLeft(plan.nRows),
-      fRecord(static_cast<int>(variables.columns.size()))
+    : fTable(table), fPlan(plan), fProgress(progress), fWeightGrid(plan.weights), fValues(variables.columns.size()),
+      fRowsLeft(plan.nRows), fRecord(static_cast<int>(variables.columns.size()))
 {
     for (std::size_t i = 0; i < variables.columns.size(); ++i)
         fFields.push_back({variables.columns[i], &plan.columns[variables.columns[i]],
@@ -52,13 +52,13 @@ const MCCommon::Record* TableRecordSource::Next()
     if (!HasNext())
         return nullptr;
     for (std::size_t i = 0; i < fFields.size(); ++i)
-        fRecord[static_cast<int>(i)] = Convert(fFields[i], (*fRow)[fFields[i].place]);
+        fRecord[static_cast<int>(i)] = Convert(fFields[i], (*fRow)[fFields[i].place], fValues[i]);
     --fRowsLeft;
     fRow = nullptr;
     return &fRecord;
 }
 
-double TableRecordSource::Convert(Field& field, std::string_view text)
+double TableRecordSource::Convert(Field& field, std::string_view text, InfiniteValues& values)
 {
     if (fPlan.IsMissing(*field.column, text))
         return MCMV::gMissingValue;
@@ -68,14 +68,26 @@ double TableRecordSource::Convert(Field& field, std::string_view text)
     if (!std::isnan(number))
     {
         field.merges.Look(text, number);
-        fNumWeighted += field.column->isWeight && number > 0.0 ? 1 : 0;
-        return number;
+        return ConvertNumber(field, number, values);
     }
     if (field.column->isBelieved)
         throw NotOnlyNumbers();
     if (!fPlan.isBadMissing)
         throw fTable.MakeFailure(fRow->GetLine(), kChanged);
     return MCMV::gMissingValue;
+}
+
+double TableRecordSource::ConvertNumber(const Field& field, double number, InfiniteValues& values)
+{
+    // Of what can't be a weight, the first pass has let through only what is missing.
+    const bool isMissing =
+        field.column->isWeight ? !ColumnPlan::IsWeight(*field.column, number) : field.column->IsMissing(number);
+    if (isMissing)
+        return MCMV::gMissingValue;
+    if (!field.column->isWeight)
+        return values.Encode(number);
+    fNumWeighted += number > 0.0 ? 1 : 0;
+    return fWeightGrid.Round(number);
 }
 
 double TableRecordSource::ConvertCategory(const Field& field, std::string_view text)

@@ -39,9 +39,10 @@ void ThrowIfFailed(const MCBinning::MCStatus& status)
         throw Failure(DescribeStatus(status));
 }
 
-/// Takes the results of a run that ended with `status`.
+/// Takes the results of a run over the records of `source` that ended with `status`.
 template<class Result, class Algorithm>
-void Collect(Findings& findings, const MCBinning::MCStatus& status, Algorithm& algorithm)
+void Collect(Findings& findings, const MCBinning::MCStatus& status, Algorithm& algorithm,
+             const TableRecordSource& source)
 {
     findings.status = status;
     findings.componentVersion = algorithm.GetVersionString();
@@ -49,7 +50,8 @@ void Collect(Findings& findings, const MCBinning::MCStatus& status, Algorithm& a
     algorithm.GetOutput()->GetAllCutPoints(results); // refuses if there are none, and none is what there is then
     if (results.empty() && status.IsError())
         throw Interrupted();
-    for (const Result& result : results) AddResult(findings, result);
+    AddWeightGrid(findings, source.GetWeightGrid());
+    for (const Result& result : results) AddResult(findings, result, source.GetValues());
 }
 
 void RunSupervised(Findings& findings, Variables& variables, TableRecordSource& source, const SettingOptions& options,
@@ -70,7 +72,7 @@ void RunSupervised(Findings& findings, Variables& variables, TableRecordSource& 
     const MCBinning::MCStatus status = algorithm->Run(&source, hasPairs ? &variables.pairAttributes : nullptr,
                                                       hasPairs ? &variables.pairTargets : nullptr);
     ThrowIfFailed(status);
-    Collect<BINAttributeTargetResults>(findings, status, *algorithm);
+    Collect<BINAttributeTargetResults>(findings, status, *algorithm, source);
 }
 
 void RunEqualFrequency(Findings& findings, Variables& variables, TableRecordSource& source,
@@ -86,7 +88,7 @@ void RunEqualFrequency(Findings& findings, Variables& variables, TableRecordSour
     ThrowIfFailed(factory.GetStatus());
     const MCBinning::MCStatus status = algorithm->Run(&source, nullptr);
     ThrowIfFailed(status);
-    Collect<BINAttributeResults>(findings, status, *algorithm);
+    Collect<BINAttributeResults>(findings, status, *algorithm, source);
 }
 
 void Announce(Progress& progress, const Variables& variables)
@@ -105,12 +107,12 @@ Findings FindBins(TableReader& table, const BinOptions& options, Progress& progr
 {
     ColumnPlan plan = PlanColumns(table, options.columns);
     ProfileTable(table, plan, progress, care);
-    Variables variables = MakeVariables(plan, options.columns.rounding);
+    Variables variables = MakeVariables(plan);
     Findings findings;
     findings.settings = options.settings;
     findings.dataName = table.GetName();
     AddPlan(findings, plan);
-    AddVariables(findings, plan, variables, options.columns.rounding);
+    AddVariables(findings, plan, variables);
 
     Announce(progress, variables);
     TableRecordSource source(table, plan, variables, progress);

@@ -6,6 +6,7 @@
 #include "text.h"
 
 #include <cmath>
+#include <limits>
 #include <ostream>
 #include <string>
 #include <vector>
@@ -31,15 +32,31 @@ std::string MakeList(const std::vector<std::string>& literals)
     return "(" + Join(literals, ", ") + ")";
 }
 
+/// Not every database has a literal for an infinity, but for all it lies beyond the largest finite number.
+constexpr double kLargest = std::numeric_limits<double>::max();
+
+/// The condition that the value is the infinity.
+std::string MakeInfinityCondition(const std::string& name, double infinity)
+{
+    return name + (infinity > 0.0 ? " > " : " < ") + FormatNumber(std::copysign(kLargest, infinity));
+}
+
 /// The condition that the value is declared missing; empty without such a declaration.
 std::string MakeMissingCondition(const std::string& name, const Variable& variable)
 {
     std::vector<std::string> values;
-    for (const double number : variable.missingNumbers) values.push_back(FormatNumber(number));
+    std::string condition;
+    for (const double number : variable.missingNumbers)
+    {
+        if (std::isinf(number))
+            condition += " OR " + MakeInfinityCondition(name, number);
+        else
+            values.push_back(FormatNumber(number));
+    }
     // A column of numbers can't hold the texts that stand for a missing value in a file.
     if (variable.kind == VariableKind::kStringCategorical)
         for (const std::string& text : variable.missingTexts) values.push_back(Enclose(text, '\''));
-    std::string condition = values.empty() ? "" : " OR " + name + " IN " + MakeList(values);
+    condition = (values.empty() ? "" : " OR " + name + " IN " + MakeList(values)) + condition;
     if (!variable.missingInterval)
         return condition;
     const auto [low, high] = *variable.missingInterval;
@@ -68,11 +85,20 @@ void PrintCategories(std::ostream& os, const Findings& findings, const Result& r
     os << "  ELSE NULL\n";
 }
 
+/// The condition that a value that isn't missing lies left of the cut point. A cut point that is infinite is the negative
+/// infinity with the right end of the bins closed, and the positive one with the left end closed.
+std::string MakeLeftOf(const std::string& name, double cutPoint, bool isRightClosed)
+{
+    if (std::isinf(cutPoint))
+        return name + (isRightClosed ? " < " : " <= ") + FormatNumber(std::copysign(kLargest, cutPoint));
+    return name + (isRightClosed ? " <= " : " < ") + FormatNumber(cutPoint);
+}
+
 void PrintNumbers(std::ostream& os, const Findings& findings, const Result& result, const std::string& name)
 {
-    const char* const comparison = findings.settings.isRightClosed ? " <= " : " < ";
+    const bool isRightClosed = findings.settings.isRightClosed;
     for (std::size_t place = 0; place < result.cutPoints.size(); ++place)
-        os << "  WHEN " << name << comparison << FormatNumber(result.cutPoints[place]) << " THEN " << place << '\n';
+        os << "  WHEN " << MakeLeftOf(name, result.cutPoints[place], isRightClosed) << " THEN " << place << '\n';
     os << "  ELSE " << result.cutPoints.size() << '\n';
 }
 

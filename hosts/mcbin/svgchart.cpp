@@ -115,7 +115,7 @@ void PrintStack(std::ostream& os, const Findings& findings, const Result& result
         bottom -= height;
         PrintRectangle(os, "c" + std::to_string(colours[i]), x, bottom, layout.binWidth - 1.0, height,
                        fmt::format("{}: {} {}, {:.1f}%", FormatBin(findings, result, bin), target.categories[i],
-                                   FormatNumber(bin.weights[i]), 100.0 * share));
+                                   FormatWeight(bin.weights[i]), 100.0 * share));
     }
 }
 
@@ -156,7 +156,7 @@ void PrintChart(std::ostream& os, const Findings& findings, const Result& result
             PrintStack(os, findings, result, bin, layout, x, colours);
         const double height = kWeightHeight * GetShare(bin.weight, heaviest);
         PrintRectangle(os, "weight", x, layout.weightTop + kWeightHeight - height, layout.binWidth - 1.0, height,
-                       fmt::format("{}: weight {}, {:.1f}%", FormatBin(findings, result, bin), FormatNumber(bin.weight),
+                       fmt::format("{}: weight {}, {:.1f}%", FormatBin(findings, result, bin), FormatWeight(bin.weight),
                                    100.0 * GetShare(bin.weight, result.weight)));
         x += layout.binWidth;
     }

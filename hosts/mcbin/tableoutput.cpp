@@ -37,7 +37,7 @@ void PrintHeading(std::ostream& os, const Findings& findings, const Result& resu
         os << "  entropy " << FormatNumber(*result.targetEntropy) << " before, " << FormatNumber(*result.modelEntropy)
            << " after\n";
     os << "  " << DescribeValues(findings, result) << ", missing weight "
-       << FormatDifference(result.weightWithMissing - result.weight) << '\n';
+       << FormatWeight(result.weightWithMissing - result.weight) << '\n';
 }
 
 /// With an error or a warning about an attribute that has cut points all the same.
@@ -72,6 +72,8 @@ void PrintTables(std::ostream& os, const Findings& findings, const Screen& scree
         os << '\n';
     }
     PrintUncut(os, findings);
+    if (const std::string words = DescribeWithoutWeight(findings); !words.empty())
+        os << "Left out, as they have no weight: " << words << '\n';
     if (!findings.leftOut.empty())
         os << "Left out, as they hold text: " << Join(findings.leftOut, ", ") << '\n';
 }

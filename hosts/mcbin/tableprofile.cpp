@@ -10,10 +10,22 @@
 
 #include <fmt/format.h>
 
+#include <cmath>
 #include <string_view>
 
 namespace
 {
+
+void NoteText(Column& column, std::string_view field, long line)
+{
+    if (column.nTexts++ == 0)
+    {
+        column.firstText = field;
+        column.firstTextLine = line;
+    }
+    if (!FindOrnaments(field).empty() && column.nOrnamented++ == 0)
+        column.firstOrnamented = field;
+}
 
 void ProfileNumber(Column& column, std::string_view field, long line, Care care)
 {
@@ -24,13 +36,27 @@ void ProfileNumber(Column& column, std::string_view field, long line, Care care)
         column.isBelieved = care == Care::kHasty && column.nTexts == 0 && column.nNumbers >= kManyNumbers;
         return;
     }
-    if (column.nTexts++ == 0)
+    NoteText(column, field, line);
+}
+
+/// A weight is looked at in every row: on all of them together depends what the library is given for each.
+void ProfileWeight(const TableReader& table, ColumnPlan& plan, std::size_t place, std::string_view field, long line)
+{
+    Column& column = plan.columns[place];
+    const double weight = ParseNumberOrNaN(field);
+    if (ColumnPlan::IsWeight(column, weight))
     {
-        column.firstText = field;
-        column.firstTextLine = line;
+        plan.weights.Add(weight);
+        return;
     }
-    if (!FindOrnaments(field).empty() && column.nOrnamented++ == 0)
-        column.firstOrnamented = field;
+    ++plan.nWithoutWeight;
+    if (std::isnan(weight))
+        NoteText(column, field, line);
+    if (plan.isBadMissing || std::isnan(weight) || column.IsMissing(weight))
+        return;
+    throw table.MakeFailure(line, place,
+                            "the weight " + Quote(Shorten(field)) + (weight < 0.0 ? " is negative" : " is infinite") +
+                                "; --bad missing leaves such rows out");
 }
 
 void ProfileCategory(const TableReader& table, Column& column, std::size_t place, std::string_view field, long line)
@@ -57,9 +83,16 @@ void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t place,
                   Care care)
 {
     Column& column = plan.columns[place];
-    if (column.isBelieved || !column.IsUsed() || plan.IsMissing(column, field))
+    if (column.isBelieved || !column.IsUsed())
         return;
-    if (column.kind == ColumnKind::kCategorical)
+    if (plan.IsMissing(column, field))
+    {
+        plan.nWithoutWeight += column.isWeight ? 1 : 0;
+        return;
+    }
+    if (column.isWeight)
+        ProfileWeight(table, plan, place, field, line);
+    else if (column.kind == ColumnKind::kCategorical)
         ProfileCategory(table, column, place, field, line);
     else
         ProfileNumber(column, field, line, care);

@@ -19,13 +19,13 @@ enum class Care
 };
 
 /// Reads the table to its end, and so finds out what the columns of the plan hold: their kinds, where these aren't
-/// given, their categories, and the number of rows. Memory doesn't grow with that number.
+/// given, their categories, the weights as a whole, and the number of rows. Memory doesn't grow with that number.
 ///
 /// A column without a kind is continuous if every field is a number or missing, or if at least most are, where the
 /// others are missing by the plan or else a failure. A column of text is no attribute any more.
 ///
 /// \throw Failure if a row is bad, if there is no row, if a column has more categories than the library takes, if a
-///        field should be a number and isn't, or if an attribute was asked for by name and is text.
+///        field should be a number and isn't, if a weight is negative or infinite, or if an attribute was asked for by name and is text.
 void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care care);
 
 #endif

@@ -1,11 +1,15 @@
 #include "variables.h"
 
+#include "bins/infinitevalues.h"
 #include "columnplan.h"
 #include "failure.h"
 #include "numbers.h"
 #include "text.h"
 
+#include <mcobnqrt/ibinvariable.h>
+
 #include <algorithm>
+#include <limits>
 #include <string>
 
 namespace
@@ -22,11 +26,14 @@ std::vector<std::string> GetCategories(const Column& column)
     return {column.categories.begin(), column.categories.end()};
 }
 
+/// Neither of the named options: the library counts a weight as the record source hands it on, rounded by then.
+constexpr auto kUnrounded = static_cast<IBINVariable::BINWRoundingOption>(2);
+
 /// With a list of pairs no variable is the target of the list.
-int AddVariable(BINVarList& list, const Column& column, bool hasPairs, IBINVariable::BINWRoundingOption rounding)
+int AddVariable(BINVarList& list, const Column& column, bool hasPairs)
 {
     if (column.isWeight)
-        return list.AddWeightVar(column.name, "", rounding);
+        return list.AddWeightVar(column.name, "", kUnrounded);
     if (column.kind == ColumnKind::kContinuous)
         return list.AddContVar(column.name, "", IBINVariable::RoleAttribute);
     const bool isTarget = column.isTarget && !hasPairs;
@@ -34,8 +41,19 @@ int AddVariable(BINVarList& list, const Column& column, bool hasPairs, IBINVaria
                           isTarget ? IBINVariable::RoleTarget : IBINVariable::RoleAttribute);
 }
 
+/// The library holds an infinite end as the largest finite number.
+double GetEnd(double end)
+{
+    constexpr double kLargest = std::numeric_limits<double>::max();
+    return std::clamp(end, -kLargest, kLargest);
+}
+
+/// The record source leaves out the missing values of a weight, as the library would look for them among the rounded
+/// ones.
 void DeclareMissing(BINVarList& list, int index, const Column& column)
 {
+    if (column.isWeight)
+        return;
     if (column.kind == ColumnKind::kCategorical)
     {
         for (const std::string& text : column.missingTexts) list.AddDiscreteUserMissing(index, text, "");
@@ -44,9 +62,9 @@ void DeclareMissing(BINVarList& list, int index, const Column& column)
                           " is categorical, and so its missing values can't be declared as an interval");
         return;
     }
-    for (const double number : column.missingNumbers) list.AddDiscreteUserMissing(index, number, "");
+    for (const double number : column.missingNumbers) list.AddDiscreteUserMissing(index, EncodeInfinity(number), "");
     if (column.missingInterval)
-        list.SetMissingInterval(index, column.missingInterval->first, column.missingInterval->second);
+        list.SetMissingInterval(index, GetEnd(column.missingInterval->first), GetEnd(column.missingInterval->second));
 }
 
 void AddPairs(Variables& variables, const ColumnPlan& plan, const std::vector<int>& variableOfColumn)
@@ -62,7 +80,7 @@ void AddPairs(Variables& variables, const ColumnPlan& plan, const std::vector<in
 
 } // namespace
 
-Variables MakeVariables(const ColumnPlan& plan, IBINVariable::BINWRoundingOption rounding)
+Variables MakeVariables(const ColumnPlan& plan)
 {
     Variables variables;
     std::vector<int> variableOfColumn(plan.columns.size(), -1);
@@ -73,7 +91,7 @@ Variables MakeVariables(const ColumnPlan& plan, IBINVariable::BINWRoundingOption
         if (!column.IsUsed())
             continue;
         hasAttribute = hasAttribute || column.isAttribute;
-        variableOfColumn[i] = AddVariable(variables.list, column, !plan.pairs.empty(), rounding);
+        variableOfColumn[i] = AddVariable(variables.list, column, !plan.pairs.empty());
         DeclareMissing(variables.list, variableOfColumn[i], column);
         variables.columns.push_back(i);
     }

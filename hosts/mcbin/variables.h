@@ -2,7 +2,6 @@
 #define MCBIN_VARIABLES_H
 
 #include <mcobnqrt/binvarlist.h>
-#include <mcobnqrt/ibinvariable.h>
 
 #include <cstddef>
 #include <vector>
@@ -21,6 +20,6 @@ struct Variables
 
 /// \throw Failure if there is no attribute, a categorical column has fewer than 2 categories, or missing values are
 ///        declared that a column can't have.
-Variables MakeVariables(const ColumnPlan& plan, IBINVariable::BINWRoundingOption rounding);
+Variables MakeVariables(const ColumnPlan& plan);
 
 #endif

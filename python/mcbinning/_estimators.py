@@ -23,7 +23,7 @@ from ._result import BinningResult, Settings, Variable
 from ._settings import check_settings, directory_of
 from ._sources import Source
 from ._opening import is_table, open_source
-from ._types import Closed, Encode, Method, MissingOutput
+from ._types import Closed, Encode, Method, MissingOutput, Rounding
 from ._values import Codes, Floats
 
 _ALL_ROWS = 2**62
@@ -37,6 +37,7 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
     closed: Closed
     encode: Encode
     missing: MissingOutput
+    rounding: Rounding
     temp_dir: str | os.PathLike[str] | None
     progress: Progress
 
@@ -88,8 +89,9 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
             feed.add_variable("y", "code", array=codes, num_codes=len(classes))
             variables.append(_target_variable(classes))
         if sample_weight is not None:
-            feed.add_variable("sample_weight", "weight", array=_check_weights(sample_weight, rows))
-            variables.append(Variable("sample_weight", "weight", rounding="none"))
+            array = _check_weights(sample_weight, rows)
+            feed.add_variable("sample_weight", "weight", array=array, rounding=self.rounding)
+            variables.append(Variable("sample_weight", "weight", rounding=self.rounding))
         names = [variable.name for variable in variables]
         with reporting(self.progress, names, self.n_features_in_, rows) as report:
             outcome = self._run(feed, list(range(self.n_features_in_)), report)
@@ -214,6 +216,9 @@ class SupervisedBinner(_Binner):
     missing : {"code", "keep"}, default="code"
         Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
         stays missing.
+    rounding : {"none", "truncate", "closest"}, default="none"
+        Whether sample weights become whole numbers, and how. "none": they count with their fractions, on a grid on
+        which every sum is exact.
     temp_dir : path, default=None
         The directory of the temporary files, 8 bytes for each row and feature. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
@@ -256,6 +261,7 @@ class SupervisedBinner(_Binner):
         small_bin_ratio: float = 0.0,
         encode: Encode = "ordinal",
         missing: MissingOutput = "code",
+        rounding: Rounding = "none",
         temp_dir: str | os.PathLike[str] | None = None,
         progress: Progress = False,
     ) -> None:
@@ -265,12 +271,13 @@ class SupervisedBinner(_Binner):
         self.small_bin_ratio = small_bin_ratio
         self.encode = encode
         self.missing = missing
+        self.rounding = rounding
         self.temp_dir = temp_dir
         self.progress = progress
 
     def fit(self, X: Any, y: Any, sample_weight: Any = None) -> SupervisedBinner:
         """Finds the cut points. `X` is an array, a frame, or any Arrow stream; weights may be fractional."""
-        check_settings(self.closed, self.n_bins, self.max_distinct, self.small_bin_ratio)
+        check_settings(self.closed, self.n_bins, self.max_distinct, self.small_bin_ratio, rounding=self.rounding)
         if y is None:
             raise ValueError(f"{type(self).__name__} requires y to be passed, but the target y is None")
         self.classes_, codes = _code_target(y)
@@ -312,6 +319,9 @@ class EqualFrequencyBinner(_Binner):
     missing : {"code", "keep"}, default="code"
         Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
         stays missing.
+    rounding : {"none", "truncate", "closest"}, default="none"
+        Whether sample weights become whole numbers, and how. "none": they count with their fractions, on a grid on
+        which every sum is exact.
     temp_dir : path, default=None
         The directory of the temporary files, 8 bytes for each row and feature. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
@@ -349,6 +359,7 @@ class EqualFrequencyBinner(_Binner):
         closed: Closed = "right",
         encode: Encode = "ordinal",
         missing: MissingOutput = "code",
+        rounding: Rounding = "none",
         temp_dir: str | os.PathLike[str] | None = None,
         progress: Progress = False,
     ) -> None:
@@ -356,12 +367,13 @@ class EqualFrequencyBinner(_Binner):
         self.closed = closed
         self.encode = encode
         self.missing = missing
+        self.rounding = rounding
         self.temp_dir = temp_dir
         self.progress = progress
 
     def fit(self, X: Any, y: Any = None, sample_weight: Any = None) -> EqualFrequencyBinner:
         """Finds the cut points. `X` is an array, a frame, or any Arrow stream; weights may be fractional."""
-        check_settings(self.closed, self.n_bins)
+        check_settings(self.closed, self.n_bins, rounding=self.rounding)
         self._fit(X, None, np.empty(0), sample_weight)
         return self
 

@@ -14,7 +14,7 @@ from ._progress import Progress, reporting
 from ._result import BinningResult, Settings
 from ._settings import check_settings, directory_of
 from ._sources import name_of
-from ._types import Closed, MemoryLimit, Missing
+from ._types import Closed, MemoryLimit, Missing, Rounding
 
 
 def supervised_bins(
@@ -29,6 +29,7 @@ def supervised_bins(
     n_bins: int = 1000,
     closed: Closed = "right",
     small_bin_ratio: float = 0.0,
+    rounding: Rounding = "none",
     memory_limit: MemoryLimit | None = None,
     temp_dir: str | os.PathLike[str] | None = None,
     progress: Progress = False,
@@ -53,7 +54,7 @@ def supervised_bins(
         result's `left_out` names them. A column of text that is named is cut between sets of its categories.
     weight : str, default=None
         The column with the weight of each record, a finite number from 0, which may be fractional. None: each record
-        weighs 1. A record without a weight is left out.
+        weighs 1. A record without a weight is left out, and counted in the result.
     missing : dict, default=None
         By column: a value that stands for a missing one, or a list of such values. A tuple of two numbers among them is
         an interval, both ends included; there is at most one. `{"age": [9, 99, (900, 999)]}`
@@ -69,6 +70,10 @@ def supervised_bins(
         The side of a bin that belongs to it: (a, b] or [a, b).
     small_bin_ratio : float, default=0.0
         An inner bin whose weight is below this share, 0 to 1, of its lighter neighbour's is merged away.
+    rounding : {"none", "truncate", "closest"}, default="none"
+        Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
+        two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
+        Among a million records a weight moves by less than one part in 10^9 of the largest.
     memory_limit : int or str, default=None
         The most memory that the reading of a file may take, in bytes, or as a text such as "512MB" or "2GiB". None:
         what the machine has. One batch of the columns that are read has to fit: of Parquet a page of each column, of
@@ -122,14 +127,14 @@ def supervised_bins(
         raise TypeError("either target or pairs must be given")
     if pairs is not None and attributes is not None:
         raise TypeError("pairs name the attributes, so attributes can't be given, too")
-    check_settings(closed, n_bins, max_distinct, small_bin_ratio)
+    check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding)
     source = open_source(data, Reading(memory_limit=memory_limit))
     target, weight = (None if label is None else name_of(label) for label in (target, weight))
     if pairs is not None:
         wanted = list(dict.fromkeys((name_of(attribute), name_of(category)) for attribute, category in pairs))
     else:
         wanted = [(name, target) for name in names_to_bin(source, attributes, [target, weight])]
-    plan = Plan(source, wanted, target, weight, name_missing(missing))
+    plan = Plan(source, wanted, target, weight, name_missing(missing), rounding)
     settings = Settings(closed, n_bins, max_distinct, small_bin_ratio)
     feed = plan.open_feed(directory_of(temp_dir))
     with reporting(progress, plan.names, len(wanted), source.rows) as report:
@@ -155,6 +160,7 @@ def equal_frequency_bins(
     *,
     n_bins: int = 10,
     closed: Closed = "right",
+    rounding: Rounding = "none",
     memory_limit: MemoryLimit | None = None,
     temp_dir: str | os.PathLike[str] | None = None,
     progress: Progress = False,
@@ -172,7 +178,7 @@ def equal_frequency_bins(
         result's `left_out` names them. A column of text that is named is cut between sets of its categories.
     weight : str, default=None
         The column with the weight of each record, a finite number from 0, which may be fractional. None: each record
-        weighs 1. A record without a weight is left out.
+        weighs 1. A record without a weight is left out, and counted in the result.
     missing : dict, default=None
         By column: a value that stands for a missing one, or a list of such values. A tuple of two numbers among them is
         an interval, both ends included; there is at most one. `{"age": [9, 99, (900, 999)]}`
@@ -180,6 +186,10 @@ def equal_frequency_bins(
         The number of bins, at least 2.
     closed : {"right", "left"}, default="right"
         The side of a bin that belongs to it: (a, b] or [a, b).
+    rounding : {"none", "truncate", "closest"}, default="none"
+        Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
+        two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
+        Among a million records a weight moves by less than one part in 10^9 of the largest.
     memory_limit : int or str, default=None
         The most memory that the reading of a file may take, in bytes, or as a text such as "512MB" or "2GiB". None:
         what the machine has. Only with a path; see `supervised_bins`.
@@ -214,11 +224,11 @@ def equal_frequency_bins(
     >>> bins["income"].weights.tolist()
     [25.0, 25.0, 25.0, 25.0]
     """
-    check_settings(closed, n_bins)
+    check_settings(closed, n_bins, rounding=rounding)
     source = open_source(data, Reading(memory_limit=memory_limit))
     weight = None if weight is None else name_of(weight)
     names = names_to_bin(source, attributes, [weight])
-    plan = Plan(source, [(name, None) for name in names], None, weight, name_missing(missing))
+    plan = Plan(source, [(name, None) for name in names], None, weight, name_missing(missing), rounding)
     feed = plan.open_feed(directory_of(temp_dir))
     with reporting(progress, plan.names, len(names), source.rows) as report:
         outcome = feed.bin_equal_frequency(

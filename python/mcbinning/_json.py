@@ -29,7 +29,12 @@ def dump(result: BinningResult) -> str:
             "distinct_threshold": _int_or_none(result.settings.max_distinct),
             "small_bins": _number_or_none(result.settings.small_bin_ratio),
         },
-        "data": {"name": result.data_name, "records": result.records, "missing_text": list(result.missing_text)},
+        "data": {
+            "name": result.data_name,
+            "records": result.records,
+            "records_without_weight": result.records_without_weight,
+            "missing_text": list(result.missing_text),
+        },
         "variables": [_dump_variable(variable) for variable in result.variables],
         "status": _dump_status(result.status),
         "results": [_dump_bins(found) for found in result.bins],
@@ -83,6 +88,7 @@ def load(text: str) -> BinningResult:
         records=document["data"]["records"],
         missing_text=tuple(document["data"]["missing_text"]),
         component_version=document["component_version"],
+        records_without_weight=document["data"].get("records_without_weight"),
     )
 
 
@@ -144,6 +150,7 @@ def _dump_variable(variable: Variable) -> dict[str, Any]:
         "role": variable.role,
         "categories": None if variable.categories is None else _dump_list(variable.categories),
         "rounding": variable.rounding,
+        "grid": _number_or_none(variable.grid),
         "missing": {
             "values": _dump_list(variable.missing_values),
             "texts": list(variable.missing_texts),
@@ -174,6 +181,7 @@ def _load_variable(member: dict[str, Any]) -> Variable:
         label=member["label"],
         rounding=member["rounding"],
         missing_texts=tuple(member["missing"]["texts"]),
+        grid=None if member.get("grid") is None else float(member["grid"]),
     )
 
 

@@ -4,6 +4,7 @@ from __future__ import annotations
 
 import warnings
 from collections.abc import Mapping, Sequence
+from dataclasses import replace
 from typing import Any
 
 import numpy as np
@@ -25,15 +26,25 @@ def make_result(
     stacklevel: int = 3,
 ) -> BinningResult:
     """The result of a run, whose warnings become Python's. \\raise BinningError if it failed as a whole."""
-    fields, entries, records, version = outcome
+    fields, entries, records, version, without_weight, grid = outcome
     status = Status.from_core(fields)
     if status.code == NO_RECORDS and records == 0:
         raise DataError("the data have no rows")
     if status.is_error:
         raise BinningError(status)
+    variables = [replace(variable, grid=grid) if variable.role == "weight" else variable for variable in variables]
     bins = tuple(_attribute_bins(entry, variables, settings.closed) for entry in entries)
     result = BinningResult(
-        method, settings, tuple(variables), status, bins, dict(left_out or {}), data_name, records, version
+        method,
+        settings,
+        tuple(variables),
+        status,
+        bins,
+        dict(left_out or {}),
+        data_name,
+        records,
+        version,
+        records_without_weight=without_weight,
     )
     for found in bins:
         if not found.status.ok:
@@ -63,7 +74,7 @@ def _attribute_bins(entry: dict[str, Any], variables: Sequence[Variable], closed
         n_distinct=entry["n_distinct"],
         weight=entry["weight"],
         weight_with_missing=entry["weight_with_missing"],
-        minimum=_values.figure(entry["minimum"]),
-        maximum=_values.figure(entry["maximum"]),
+        minimum=entry["minimum"],
+        maximum=entry["maximum"],
         model_entropy=_values.figure(entry["model_entropy"]) if target else float("nan"),
     )

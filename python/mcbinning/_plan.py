@@ -12,7 +12,7 @@ from . import _core, _values
 from ._errors import DataError
 from ._result import Variable
 from ._sources import Column, Source, check_names, name_of
-from ._types import Missing
+from ._types import Missing, Rounding
 
 
 def names_to_bin(source: Source, attributes: Any, others: Sequence[str | None]) -> list[str]:
@@ -72,6 +72,8 @@ class Plan:
     """That of all pairs, if they have one."""
     weight: str | None
     missing: Mapping[str, Any]
+    rounding: Rounding
+    """Of the weight."""
 
     def __post_init__(self) -> None:
         check_names(self.source, [*self.names, *self.missing])
@@ -95,9 +97,10 @@ class Plan:
         return in_order + sorted(name for name in taking_part if name is not None and name not in in_order)
 
     def open_feed(self, directory: str) -> _core.Feed:
-        """A feed that knows all categories."""
+        """A feed that knows all categories and what the weights are like."""
         categorical = [name for name in self.names if self._use(name) == "category"]
-        if not categorical:
+        to_learn = categorical if self.weight is None else [*categorical, self.weight]
+        if not to_learn:
             return self._make_feed(self.names)
         if self.source.is_once:
             feed = self._make_feed(self.names)
@@ -105,9 +108,10 @@ class Plan:
             known = feed
             indices = {name: self.names.index(name) for name in categorical}
         else:
-            known = self._make_feed(categorical)
-            known.learn_categories()
+            known = self._make_feed(to_learn)
+            known.learn()
             feed = self._make_feed(self.names)
+            feed.set_weights(known.weights())
             indices = {name: i for i, name in enumerate(categorical)}
         for name in categorical:
             categories = known.categories(indices[name])
@@ -140,7 +144,7 @@ class Plan:
         places = [fields[0] for fields in table.columns]
         feed = _core.Feed(table)
         for index, name in enumerate(names):
-            feed.add_variable(name, self._use(name), column=places.index(name))
+            feed.add_variable(name, self._use(name), column=places.index(name), rounding=self.rounding)
             values, interval = self._missing(name)
             is_text = self._column(name).kind == "text"
             feed.declare_missing(index, [] if is_text else list(values), interval, list(values) if is_text else [])
@@ -156,7 +160,7 @@ class Plan:
             column.time_zone,
             tuple(feed.categories(index)) if use == "category" else None,
             *self._missing(name),
-            rounding="none" if use == "weight" else None,
+            rounding=self.rounding if use == "weight" else None,
         )
 
     def _check_categories(self, name: str, categories: list[Any]) -> None:

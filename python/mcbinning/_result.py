@@ -40,8 +40,11 @@ class Variable:
     missing_interval: tuple[float, float] | None = None
     label: str = ""
     rounding: str | None = None
+    """Of a weight: `"none"`, `"truncate"` or `"closest"`."""
     missing_texts: tuple[str, ...] = ()
     """What stands for a missing value in a text file, where `missing_values` are numbers."""
+    grid: float | None = None
+    """Of a weight: of what its values were made multiples, so that all sums are exact; None if none had to move."""
 
     @property
     def is_categorical(self) -> bool:
@@ -191,6 +194,14 @@ class BinningResult(Mapping[Any, AttributeBins]):
     """How many were read, whatever their weight."""
     component_version: str = ""
     missing_text: tuple[str, ...] = ()
+    records_without_weight: int | None = None
+    """How many were left out since their weight is missing; None without a weight."""
+
+    @property
+    def weight_grid(self) -> float | None:
+        """Of what the weights were made multiples, so that every sum of them is exact; None where all weights were such
+        multiples, and without weights."""
+        return next((variable.grid for variable in self.variables if variable.role == "weight"), None)
 
     def __getitem__(self, key: Any) -> AttributeBins:
         for found in self.bins:

@@ -14,7 +14,7 @@ _LARGEST_INT = 2**31 - 1
 
 
 def check_settings(
-    closed: str, n_bins: int, max_distinct: int | None = None, small_bin_ratio: float = 0.0
+    closed: str, n_bins: int, max_distinct: int | None = None, small_bin_ratio: float = 0.0, *, rounding: str = "none"
 ) -> None:
     if closed not in ("right", "left"):
         raise ValueError(f"closed must be 'right' or 'left', not {closed!r}")
@@ -23,6 +23,8 @@ def check_settings(
         _check_whole("max_distinct", max_distinct, 1)
     if not 0.0 <= small_bin_ratio <= 1.0:
         raise ValueError(f"small_bin_ratio must be from 0 to 1, not {small_bin_ratio}")
+    if rounding not in ("none", "truncate", "closest"):
+        raise ValueError(f"rounding must be 'none', 'truncate' or 'closest', not {rounding!r}")
 
 
 def _check_whole(name: str, value: Any, least: int) -> None:

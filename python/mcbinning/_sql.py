@@ -60,9 +60,12 @@ def _case(found: AttributeBins, dialect: str, labels: bool) -> exp.Case:
         return case
     compare = exp.LTE if found.closed == "right" else exp.LT
     for cut, name in zip(found.borders.tolist(), names):
-        if math.isinf(cut) and cut > 0:
-            return case.else_(name)
-        case = case.when(compare(this=column.copy(), expression=_literal(cut, variable)), name)
+        if math.isinf(cut):
+            # The negative one is a cut point with the right side closed, and the positive one with the left side.
+            beyond = exp.LT if found.closed == "right" else exp.LTE
+            case = case.when(beyond(this=column.copy(), expression=_literal(cut, variable)), name)
+        else:
+            case = case.when(compare(this=column.copy(), expression=_literal(cut, variable)), name)
     return case.else_(names[-1])
 
 
@@ -70,12 +73,28 @@ def _missing_conditions(variable: Variable, column: exp.Column, dialect: str) ->
     conditions: list[exp.Expression] = [column.copy().is_(exp.null())]
     if variable.kind == "float":
         conditions += _nan_conditions(column, dialect)
-    if variable.missing_values:
-        conditions.append(column.copy().isin(*[_literal(value, variable) for value in variable.missing_values]))
+    infinities = [value for value in variable.missing_values if isinstance(value, float) and math.isinf(value)]
+    values = [value for value in variable.missing_values if value not in infinities]
+    if values:
+        conditions.append(column.copy().isin(*[_literal(value, variable) for value in values]))
+    for infinity in infinities:
+        beyond = exp.GT if infinity > 0 else exp.LT
+        conditions.append(beyond(this=column.copy(), expression=_literal(infinity, variable)))
     if variable.missing_interval is not None:
-        left, right = variable.missing_interval
-        conditions.append(column.copy().between(_literal(left, variable), _literal(right, variable)))
+        conditions.append(_interval_condition(variable.missing_interval, variable, column))
     return conditions
+
+
+def _interval_condition(interval: tuple[float, float], variable: Variable, column: exp.Column) -> exp.Expression:
+    """An infinite end takes in the infinity, too."""
+    left, right = interval
+    if math.isinf(left) and math.isinf(right):
+        return exp.true()
+    if math.isinf(left):
+        return exp.LTE(this=column.copy(), expression=_literal(right, variable))
+    if math.isinf(right):
+        return exp.GTE(this=column.copy(), expression=_literal(left, variable))
+    return column.copy().between(_literal(left, variable), _literal(right, variable))
 
 
 def _nan_conditions(column: exp.Column, dialect: str) -> list[exp.Expression]:
@@ -92,7 +111,8 @@ def _nan_conditions(column: exp.Column, dialect: str) -> list[exp.Expression]:
 
 
 def _literal(value: float | str, variable: Variable) -> exp.Expression:
-    """The value as the column has it. A number is written in as few digits as read back to the same double."""
+    """The value as the column has it. A number is written in as few digits as read back to the same double. Not every
+    database has a literal for an infinity: it is the largest finite number, beyond which it lies for all of them."""
     if isinstance(value, str):
         return exp.Literal.string(value)
     if variable.kind == "boolean":

@@ -8,6 +8,7 @@ from typing import Any, Literal
 Closed = Literal["right", "left"]
 Encode = Literal["ordinal", "onehot", "interval"]
 MissingOutput = Literal["code", "keep"]
+Rounding = Literal["none", "truncate", "closest"]
 Unseen = Literal["error", "missing"]
 Method = Literal["supervised", "equal-frequency"]
 Role = Literal["attribute", "target", "weight"]

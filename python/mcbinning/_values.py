@@ -90,14 +90,18 @@ def whole(value: float, kind: str) -> float | int:
 
 
 def intervals(cut_points: Floats, closed: str, write: Callable[[float], str]) -> list[str]:
-    """The bins in the usual notation, the bracket on the closed side. Infinite ends are open."""
+    """The bins in the usual notation, the bracket on the closed side. Infinite ends are open, and the outer bins hold
+    the infinities; but one that is a cut point has a bin for itself, as in "[-inf, -inf]"."""
     ends = ["-inf", *(write(float(cut)) for cut in cut_points), "+inf"]
     left, right = ("(", "]") if closed == "right" else ("[", ")")
-    pairs = list(zip(ends, ends[1:]))
-    last = len(pairs) - 1
-    return [
-        f"{'(' if i == 0 else left}{a}, {b}{')' if i == last else right}" for i, (a, b) in enumerate(pairs)
+    labels = [
+        f"{'(' if a == '-inf' else left}{a}, {b}{')' if b == '+inf' else right}" for a, b in zip(ends, ends[1:])
     ]
+    if ends[1] == "-inf":
+        labels[0] = "[-inf, -inf]"
+    if ends[-2] == "+inf":
+        labels[-1] = "[+inf, +inf]"
+    return labels
 
 
 def bin_numbers(values: Floats, cut_points: Floats, closed: str) -> Codes:

@@ -34,6 +34,12 @@ double ToDouble(Number number)
     return static_cast<double>(number);
 }
 
+double ToDouble(double number)
+{
+    constexpr double kNextToMissing = -1.7976931348623155e308;
+    return number == gMissingValue ? kNextToMissing : number;
+}
+
 double ToDouble(Half number)
 {
     const int exponent = number.bits >> 10 & 0x1F;

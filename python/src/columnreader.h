@@ -15,7 +15,8 @@ class ColumnReader
 public:
     virtual ~ColumnReader() = default;
 
-    /// Writes the values of the rows from `first` on to `values`, gMissingValue where there is none. A NaN stays one.
+    /// Writes the values of the rows from `first` on to `values`, gMissingValue where there is none. A NaN stays one. A
+    /// value that is gMissingValue itself, the most negative of all doubles, becomes the next one.
     virtual void Read(std::size_t first, std::size_t count, double* values) const = 0;
 };
 

@@ -4,6 +4,7 @@
 #include "calls.h"
 #include "capsules.h"
 #include "faults.h"
+#include "libraryblocks.h"
 #include "runs.h"
 #include "spool.h"
 #include "tableblocks.h"
@@ -143,8 +144,7 @@ void AppendWithNaN(const Variable& variable, Block& block, std::size_t field, st
 {
     const double* const source = block.GetField(field);
     const bool isCode = variable.use != Variable::Use::kAttribute;
-    const bool hasUserMissing =
-        variable.missingNumbers.GetNDiscreteValues() > 0 || variable.missingNumbers.HasInterval();
+    const bool hasUserMissing = variable.HasMissingNumbers();
     for (std::size_t i = 0; i < block.numRows; ++i)
     {
         const bool isMissing = isCode ? source[i] < 0.0
@@ -161,24 +161,32 @@ std::vector<double> Flatten(const std::vector<std::vector<double>>& rows)
     return flat;
 }
 
+/// A minimum or maximum, NaN where the library found none.
+double ToExtreme(double value)
+{
+    return value == MCMV::gMissingValue ? std::numeric_limits<double>::quiet_NaN() : DecodeInfinity(value);
+}
+
 template<class Result>
-nb::dict ToCommonDict(const Result& result)
+nb::dict ToCommonDict(const Result& result, const InfiniteValues& values, bool isRightClosed)
 {
     nb::dict dict;
+    std::vector<double> cutPoints = result.GetCutPoints();
+    for (double& cutPoint : cutPoints) cutPoint = values.DecodeCutPoint(cutPoint, isRightClosed);
     dict["status"] = ToTuple(result.GetStatus());
     dict["attribute"] = result.GetAttributeIndex();
-    dict["cut_points"] = ToArray(result.GetCutPoints(), 0);
+    dict["cut_points"] = ToArray(std::move(cutPoints), 0);
     dict["n_distinct"] = result.GetNDistinctValues();
     dict["weight"] = result.GetTotalWeight();
     dict["weight_with_missing"] = result.GetTotalWeightWithMissing();
-    dict["minimum"] = result.GetMinimum();
-    dict["maximum"] = result.GetMaximum();
+    dict["minimum"] = ToExtreme(result.GetMinimum());
+    dict["maximum"] = ToExtreme(result.GetMaximum());
     return dict;
 }
 
-nb::dict ToDict(const BINAttributeTargetResults& result)
+nb::dict ToDict(const BINAttributeTargetResults& result, const InfiniteValues& values, bool isRightClosed)
 {
-    nb::dict dict = ToCommonDict(result);
+    nb::dict dict = ToCommonDict(result, values, isRightClosed);
     const auto& rows = result.GetCellCounts();
     dict["target"] = result.GetTargetIndex();
     dict["counts"] = ToArray(Flatten(rows), rows.empty() || rows[0].empty() ? 1 : rows[0].size());
@@ -186,19 +194,24 @@ nb::dict ToDict(const BINAttributeTargetResults& result)
     return dict;
 }
 
-nb::dict ToDict(const BINAttributeResults& result)
+nb::dict ToDict(const BINAttributeResults& result, const InfiniteValues& values, bool isRightClosed)
 {
-    nb::dict dict = ToCommonDict(result);
+    nb::dict dict = ToCommonDict(result, values, isRightClosed);
     dict["counts"] = ToArray(result.GetCellCounts(), 1);
     return dict;
 }
 
 template<class Result>
-nb::tuple ToTuple(const Outcome<Result>& outcome)
+nb::tuple ToTuple(const Outcome<Result>& outcome, const LibraryBlocks& blocks, bool isRightClosed)
 {
     nb::list results;
-    for (const Result& result : outcome.results) results.append(ToDict(result));
-    return nb::make_tuple(ToTuple(outcome.status), results, outcome.numRecords, outcome.version);
+    for (const Result& result : outcome.results)
+    {
+        const auto attribute = static_cast<std::size_t>(result.GetAttributeIndex());
+        results.append(ToDict(result, blocks.GetValues().at(attribute), isRightClosed));
+    }
+    return nb::make_tuple(ToTuple(outcome.status), results, outcome.numRecords, outcome.version,
+                          blocks.GetNumWithoutWeight(), blocks.GetWeightGrid().GetStep());
 }
 
 /// The records of one analysis: a table, arrays, or both side by side. A table can be read once, by one of the
@@ -211,13 +224,14 @@ public:
 
     /// Its values are in a column of the table or in the array, which has one for each record.
     void AddVariable(const std::string& name, const std::string& use, int column, const std::optional<Array>& array,
-                     int numCodes)
+                     int numCodes, const std::string& rounding)
     {
         Variable variable;
         variable.name = name;
         variable.use = UseOf(use);
         variable.column = array ? -1 : column;
         variable.numCodes = numCodes;
+        variable.rounding = FindWeightRounding(rounding).value();
         if (array)
             variable.array = Borrow(*array, name);
         fVariables.push_back(std::move(variable));
@@ -264,23 +278,35 @@ public:
         return categories;
     }
 
-    /// Reads the records for their categories alone.
-    void LearnCategories()
+    /// How many weights are above 0, and the largest. Known once the records have been read for it, and where they
+    /// were read by another feed, from there.
+    std::pair<std::int64_t, double> GetWeights() const
+    {
+        return {fWeights.value().numPositive, fWeights.value().largest};
+    }
+
+    void SetWeights(const std::pair<std::int64_t, double>& weights)
+    {
+        fWeights = WeightTally{WeightRounding::kNone, weights.first, weights.second};
+    }
+
+    /// Reads the records for their categories and weights alone.
+    void Learn()
     {
         TableBlocks table(GetBatches(), fVariables);
         const nb::gil_scoped_release released;
-        PolledBlocks blocks(table);
-        Block block(fVariables.size());
-        while (blocks.Next(block)) continue;
+        fWeights = Tally(table, fVariables);
     }
 
-    /// Reads the records for their categories, and keeps them in a nameless file for the run.
+    /// Reads the records for their categories and weights, and keeps them in a nameless file for the run.
     void SpoolRecords(const std::string& directory)
     {
         TableBlocks table(GetBatches(), fVariables);
         const nb::gil_scoped_release released;
-        PolledBlocks blocks(table);
+        PolledBlocks polled(table);
+        TalliedBlocks blocks(polled, fVariables);
         fSpool = std::make_unique<Spool>(blocks, fVariables, directory);
+        fWeights = blocks.GetTally();
     }
 
     /// The next records, `maxRows` or a few more: for each variable an array with its numbers or codes, NaN for what is
@@ -308,7 +334,7 @@ public:
                             nb::object progress)
     {
         const RunOptions options{numBins, maxDistinct, smallBinRatio, isRightClosed, tempDir};
-        return Run([&](BlockSource& blocks, Interrupts& interrupts)
+        return Run(isRightClosed, [&](BlockSource& blocks, Interrupts& interrupts)
                    { return RunSupervised(blocks, fVariables, attributes, targets, options, progress, interrupts); });
     }
 
@@ -316,20 +342,49 @@ public:
                                 const std::string& tempDir, nb::object progress)
     {
         const RunOptions options{numBins, 0, 0.0, isRightClosed, tempDir};
-        return Run([&](BlockSource& blocks, Interrupts& interrupts)
+        return Run(isRightClosed, [&](BlockSource& blocks, Interrupts& interrupts)
                    { return RunEqualFrequency(blocks, fVariables, attributes, options, progress, interrupts); });
     }
 
 private:
     Batches* GetBatches() const { return fTable.is_none() ? nullptr : nb::cast<Table&>(fTable).batches.get(); }
 
+    static WeightTally Tally(BlockSource& source, const std::vector<Variable>& variables)
+    {
+        PolledBlocks polled(source);
+        TalliedBlocks blocks(polled, variables);
+        Block block(variables.size());
+        while (blocks.Next(block)) continue;
+        return blocks.GetTally();
+    }
+
+    /// An array of weights is at hand, and can be read at any time.
+    void TallyArray()
+    {
+        const std::optional<std::size_t> index = FindWeight(fVariables);
+        if (!index || fWeights)
+            return;
+        std::vector<Variable> weight(1);
+        weight[0].name = fVariables[*index].name;
+        weight[0].use = Variable::Use::kWeight;
+        weight[0].array = fVariables[*index].array;
+        weight[0].rounding = fVariables[*index].rounding;
+        TableBlocks blocks(nullptr, weight);
+        const nb::gil_scoped_release released;
+        fWeights = Tally(blocks, weight);
+    }
+
     template<class Function>
-    nb::tuple Run(Function function)
+    nb::tuple Run(bool isRightClosed, Function function)
     {
         std::optional<TableBlocks> table;
         if (!fSpool)
             table.emplace(GetBatches(), fVariables);
-        BlockSource& blocks = fSpool ? static_cast<BlockSource&>(*fSpool) : *table;
+        TallyArray();
+        WeightTally tally = fWeights.value_or(WeightTally());
+        if (const std::optional<std::size_t> index = FindWeight(fVariables))
+            tally.rounding = fVariables[*index].rounding;
+        LibraryBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table, fVariables, tally);
         Interrupts interrupts;
         const auto outcome = [&]
         {
@@ -337,12 +392,13 @@ private:
             return function(blocks, interrupts);
         }();
         interrupts.Rethrow();
-        return ToTuple(outcome);
+        return ToTuple(outcome, blocks, isRightClosed);
     }
 
     nb::object fTable;
     std::vector<Variable> fVariables;
     std::vector<std::optional<Array>> fArrays; ///< keep alive what the variables borrow
+    std::optional<WeightTally> fWeights;
     std::unique_ptr<Spool> fSpool;
     std::optional<TableBlocks> fReading; ///< where Read has got to
 };
@@ -417,11 +473,13 @@ NB_MODULE(_core, module)
     nb::class_<Feed>(module, "Feed")
         .def(nb::init<nb::object>(), "table"_a.none())
         .def("add_variable", &Feed::AddVariable, "name"_a, "use"_a, nb::kw_only(), "column"_a = -1,
-             "array"_a.none() = nb::none(), "num_codes"_a = 0)
+             "array"_a.none() = nb::none(), "num_codes"_a = 0, "rounding"_a = "none")
         .def("declare_missing", &Feed::DeclareMissing, "index"_a, "values"_a, "interval"_a.none(), "texts"_a)
         .def("set_categories", &Feed::SetCategories, "index"_a, "categories"_a, "unseen"_a = "changed")
         .def("categories", &Feed::GetCategories, "index"_a)
-        .def("learn_categories", &Feed::LearnCategories)
+        .def("weights", &Feed::GetWeights)
+        .def("set_weights", &Feed::SetWeights, "weights"_a)
+        .def("learn", &Feed::Learn)
         .def("read", &Feed::Read, "max_rows"_a)
         .def("spool", &Feed::SpoolRecords, "directory"_a)
         .def("bin_supervised", &Feed::BinSupervised, "attributes"_a, "targets"_a, nb::kw_only(), "n_bins"_a,

@@ -8,20 +8,11 @@
 namespace
 {
 
-/// Neither of the named options: a weight stays as it is.
+/// Neither of the named options: the library counts a weight as it comes, rounded by then.
 constexpr auto kUnrounded = static_cast<IBINVariable::BINWRoundingOption>(2);
 
-void DeclareMissing(IBINVariable& variable, const BINNumericUserMissing& missing)
-{
-    if (missing.GetNDiscreteValues() == 0 && !missing.HasInterval())
-        return;
-    std::unique_ptr<IBINUserMissing> copy(missing.Clone());
-    if (variable.SetUserMissingInfo(copy.get()))
-        copy.release(); // the variable's now
-}
-
-/// The list wants names that differ, and a table may have two alike or an empty one: here each is its number. Missing
-/// categories have the code that says so already.
+/// The list wants names that differ, and a table may have two alike or an empty one: here each is its number. What is
+/// missing comes as a number that says so already.
 BINVarList MakeList(const std::vector<Variable>& variables)
 {
     BINVarList list;
@@ -41,9 +32,8 @@ BINVarList MakeList(const std::vector<Variable>& variables)
         case Variable::Use::kCode:
             list.AddCatVar(name, variable.name, static_cast<int>(variable.GetNumCategories()),
                            IBINVariable::MeasureNumericCategorical, IBINVariable::RoleAttribute);
-            continue;
+            break;
         }
-        DeclareMissing(*list.GetVarAt(static_cast<int>(i)), variable.missingNumbers);
     }
     return list;
 }

@@ -33,8 +33,8 @@ struct Outcome
     std::string version;         ///< of the component, as the library tells it
 };
 
-/// Bins the pairs (attributes[i], targets[i]), which are indices of `variables`, as they are in `blocks`. No variable
-/// is declared as the target of the others. Takes no GIL but for `progress` and `interrupts`. \param progress may be
+/// Bins the pairs (attributes[i], targets[i]), which are indices of `variables`, as they are in `blocks`, and these are
+/// LibraryBlocks. No variable is declared as the target of the others. Takes no GIL but for `progress` and `interrupts`. \param progress may be
 /// None.
 Outcome<BINAttributeTargetResults> RunSupervised(BlockSource& blocks, const std::vector<Variable>& variables,
                                                  const std::vector<int>& attributes, const std::vector<int>& targets,

@@ -76,13 +76,13 @@ private:
     std::unique_ptr<ColumnReader> fReader;
 };
 
-/// A record without a weight is left out, as it is everywhere. The library leaves out one of a negative weight or NaN
+/// A weight that is declared missing is gMissingValue from here on. The library leaves out one of a negative weight or NaN
 /// as well and without a word, which nobody wants to find out later.
 class WeightField : public FieldReader
 {
 public:
     WeightField(std::unique_ptr<ColumnReader> reader, const Variable& variable)
-        : fReader(std::move(reader)), fVariable(variable)
+        : fReader(std::move(reader)), fVariable(variable), fHasMissing(variable.HasMissingNumbers())
     {
     }
 
@@ -91,9 +91,9 @@ public:
         fReader->Read(first, count, values);
         for (std::size_t i = 0; i < count; ++i)
         {
-            if ((values[i] >= 0.0 && values[i] < HUGE_VAL) || values[i] == gMissingValue)
-                continue;
-            if (!fVariable.missingNumbers.Contains(values[i]))
+            if (fHasMissing && fVariable.missingNumbers.Contains(values[i]))
+                values[i] = gMissingValue;
+            if (!(values[i] >= 0.0 && values[i] < HUGE_VAL) && values[i] != gMissingValue)
                 throw DataFault(Describe(values[i]), fVariable.name, row + static_cast<std::int64_t>(i));
         }
     }
@@ -108,6 +108,7 @@ private:
 
     std::unique_ptr<ColumnReader> fReader;
     const Variable& fVariable;
+    bool fHasMissing;
 };
 
 class NumberCategoryField : public FieldReader

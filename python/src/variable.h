@@ -1,6 +1,7 @@
 #ifndef MCBINNING_VARIABLE_H
 #define MCBINNING_VARIABLE_H
 
+#include "bins/weightgrid.h"
 #include "categorytable.h"
 #include "columnreader.h"
 
@@ -46,8 +47,13 @@ struct Variable
     bool isComplete = false;
     Unseen unseen = Unseen::kChanged;
 
+    /// Of a weight.
+    WeightRounding rounding = WeightRounding::kNone;
+
     BINNumericUserMissing missingNumbers;
     BINStringUserMissing missingTexts;
+
+    bool HasMissingNumbers() const { return missingNumbers.GetNDiscreteValues() > 0 || missingNumbers.HasInterval(); }
 
     std::size_t GetNumCategories() const
     {

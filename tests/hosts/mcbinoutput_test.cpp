@@ -96,7 +96,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
   "component_version": "Supervised Binning Component Ver. 1.0 (V)",
   "method": "supervised",
   "settings": {"closed": "right", "bins": 1000, "distinct_threshold": null, "small_bins": 0},
-  "data": {"name": "data.csv", "records": 4, "missing_text": ["NA", "-9"]},
+  "data": {"name": "data.csv", "records": 4, "records_without_weight": 0, "missing_text": ["NA", "-9"]},
   "variables": [
     {
       "name": "x",
@@ -105,6 +105,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "role": "attribute",
       "categories": null,
       "rounding": null,
+      "grid": null,
       "missing": {"values": [7, -9], "texts": ["unknown"], "interval": [90, "inf"]}
     },
     {
@@ -114,6 +115,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "role": "target",
       "categories": ["a", "b"],
       "rounding": null,
+      "grid": null,
       "missing": {"values": [], "texts": [], "interval": null}
     },
     {
@@ -122,7 +124,8 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "kind": "weight",
       "role": "weight",
       "categories": null,
-      "rounding": "closest",
+      "rounding": "none",
+      "grid": null,
       "missing": {"values": [-9], "texts": [], "interval": null}
     }
   ],

@@ -344,18 +344,6 @@ def test_a_stream_that_fails_midway_says_so_and_leaves_no_file(mixed, tmp_path):
     assert list(tmp_path.iterdir()) == []
 
 
-def test_infinities_are_ordered_and_the_library_s_verdict_is_said_in_words():
-    x = np.array([-np.inf] * 5 + [1.0] * 10)
-    frame = pd.DataFrame({"x": x, "y": np.where(x < 0, "a", "b")})
-
-    result = mb.supervised_bins(frame, "y")
-    assert result["x"].cut_points.tolist() == [-np.inf]
-    assert result.transform(frame)["x"].tolist() == [0] * 5 + [1] * 10
-    assert figures(mb.BinningResult.from_json(result.to_json())) == figures(result)
-    with pytest.warns(mb.BadBinTableWarning, match="'x': the values lie outside all bins"):
-        mb.supervised_bins(frame.assign(x=-x), "y")
-
-
 @pytest.mark.parametrize(
     ("x", "weights", "warning"),
     [

@@ -1,0 +1,62 @@
+#ifndef MCBINNING_LIBRARYBLOCKS_H
+#define MCBINNING_LIBRARYBLOCKS_H
+
+#include "bins/infinitevalues.h"
+#include "bins/weightgrid.h"
+#include "blocks.h"
+#include "variable.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+#include <vector>
+
+/// The index of the weight, if there is one.
+std::optional<std::size_t> FindWeight(const std::vector<Variable>& variables);
+
+/// Passes blocks on as they are, and tallies their weights.
+class TalliedBlocks : public BlockSource
+{
+public:
+    /// Both stay the caller's.
+    TalliedBlocks(BlockSource& source, const std::vector<Variable>& variables);
+
+    bool Next(Block& block) override;
+
+    const WeightTally& GetTally() const { return fTally; }
+
+private:
+    BlockSource& fSource;
+    std::optional<std::size_t> fWeight;
+    WeightTally fTally;
+};
+
+/// Passes blocks on in the form that the library takes: with weights on their grid, with stand-ins for infinite values,
+/// and with all that is declared missing as gMissingValue.
+class LibraryBlocks : public BlockSource
+{
+public:
+    /// `tally` is of all weights that will come. The others stay the caller's.
+    LibraryBlocks(BlockSource& source, const std::vector<Variable>& variables, const WeightTally& tally);
+
+    bool Next(Block& block) override;
+
+    const WeightGrid& GetWeightGrid() const { return fWeightGrid; }
+
+    /// How many records had no weight; nothing if no variable holds weights.
+    std::optional<std::int64_t> GetNumWithoutWeight() const;
+
+    /// The values that have passed, by variable.
+    const std::vector<InfiniteValues>& GetValues() const { return fValues; }
+
+private:
+    void ConvertWeights(double* weights, std::size_t count);
+
+    BlockSource& fSource;
+    const std::vector<Variable>& fVariables;
+    WeightGrid fWeightGrid;
+    std::int64_t fNumWithoutWeight = 0;
+    std::vector<InfiniteValues> fValues;
+};
+
+#endif
