@@ -48,7 +48,12 @@ std::vector<std::size_t> GetHeaviest(const std::vector<double>& weights, std::si
 
 double GetGain(const Result& result)
 {
-    return result.targetEntropy && result.modelEntropy ? *result.targetEntropy - *result.modelEntropy : 0.0;
+    if (!result.targetEntropy || !result.modelEntropy || result.cutPoints.empty())
+        return 0.0;
+    // No cut raises the entropy, so a difference below this is what rounding has left.
+    constexpr double kRounding = 1e-12;
+    const double gain = *result.targetEntropy - *result.modelEntropy;
+    return gain < kRounding * std::max(1.0, *result.targetEntropy) ? 0.0 : gain;
 }
 
 double GetShare(double part, double whole)
