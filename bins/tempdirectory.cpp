@@ -20,7 +20,7 @@ std::string ChooseTempDirectory(const std::string& named, const std::string& opt
 {
     if (!named.empty())
         return named;
-    const std::string standard = BINSettings().GetTempDirName(); // TMPDIR, if the library can use it
+    std::string standard = BINSettings().GetTempDirName(); // TMPDIR, if the library can use it
     const char* const fromEnvironment = std::getenv("TMPDIR");
     const std::string wanted = WithoutTrailingSeparators(fromEnvironment != nullptr ? fromEnvironment : "");
     if (!wanted.empty() && wanted != standard)

@@ -78,6 +78,7 @@ Failure MakeFailure(const TableReader& table, const ColumnPlan& plan, const std:
     const auto has = [&](Fault fault)
     { return std::any_of(faulty.begin(), faulty.end(), [=](const FaultyColumn& one) { return one.fault == fault; }); };
     std::vector<std::string> described;
+    described.reserve(faulty.size());
     for (const FaultyColumn& one : faulty) described.push_back(Describe(plan.columns[one.place], one.fault));
     std::vector<std::string> advice{"--exclude leaves a column out"};
     if (has(Fault::kMixed) || has(Fault::kText))

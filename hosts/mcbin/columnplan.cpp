@@ -37,7 +37,7 @@ Indices FindMatches(const TableReader& table, const std::string& pattern)
 /// matches others as a pattern, there is no telling which is meant.
 Indices FindColumns(const TableReader& table, const std::string& pattern)
 {
-    const Indices matches = FindMatches(table, pattern);
+    Indices matches = FindMatches(table, pattern);
     if (!matches.empty() && !HasColumn(table, pattern))
         return matches;
     const std::size_t own = table.FindColumn(pattern);
