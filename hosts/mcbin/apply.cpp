@@ -58,13 +58,21 @@ std::vector<BinColumn> MakeColumns(const TableReader& table, const Findings& fin
     return columns;
 }
 
+/// An output with two columns of one name would be no table to anybody, this tool included.
 void ThrowIfTaken(const TableReader& table, const std::vector<BinColumn>& columns)
 {
     const std::vector<std::string>& names = table.GetColumnNames();
-    for (const BinColumn& column : columns)
-        if (std::find(names.begin(), names.end(), column.name) != names.end())
-            throw table.MakeFailure("there is a column " + Quote(column.name) +
+    for (auto column = columns.begin(); column != columns.end(); ++column)
+    {
+        if (std::find(names.begin(), names.end(), column->name) != names.end())
+            throw table.MakeFailure("there is a column " + Quote(column->name) +
                                     " already; --in-place-columns makes no new ones");
+        const auto isSame = [column](const BinColumn& other) { return other.name == column->name; };
+        const auto same = std::find_if(columns.begin(), column, isSame);
+        if (same != column)
+            throw table.MakeFailure("the bins of " + Quote(names[same->place]) + " and those of " +
+                                    Quote(names[column->place]) + " would both be the column " + Quote(column->name));
+    }
 }
 
 std::string MakeHeader(const TableReader& table, const std::vector<BinColumn>& columns, bool isInPlace)

@@ -222,3 +222,17 @@ TEST_F(Mcbin, AppliesToOtherColumnsInAnotherOrderAndSaysWhatDoesNotFit)
     EXPECT_EQ("a,b,a_bin,b_by_p_bin,b_by_q_bin\n1,-1,0,1,1\n",
               Shell("mkfifo pipe; cat bins.json >pipe & cat data.csv | mcbin apply pipe -").out);
 }
+
+TEST_F(Mcbin, MakesNoTwoColumnsOfOneName)
+{
+    std::string data = "a,a_by_p,p,q\n";
+    for (int i = 0; i < 40; ++i)
+        data += std::to_string(i) + "," + std::to_string(-i) + (i < 20 ? ",no" : ",yes") + (i < 10 ? ",lo\n" : ",hi\n");
+    ASSERT_EQ(0, RunOn(data, "supervised", "--pairs a:p,a:q,a_by_p:q --format json >bins.json").exitCode);
+
+    const Outcome outcome = RunOn(data, "apply bins.json", "");
+
+    EXPECT_EQ("mcbin: data.csv: the bins of 'a' and those of 'a_by_p' would both be the column 'a_by_p_bin'\n",
+              outcome.err);
+    EXPECT_EQ("", outcome.out);
+}
