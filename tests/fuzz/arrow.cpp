@@ -215,8 +215,8 @@ public:
             return std::nullopt;
         if (fVariable.use == Variable::Use::kCategory)
             return TellCode(value);
-        if (fVariable.use == Variable::Use::kWeight && !value.isMissing && !IsWeight(value.number))
-            return std::nullopt;
+        if (fVariable.use == Variable::Use::kWeight && !value.isMissing)
+            return TellWeight(value.number);
         return value.isMissing ? gMissingValue : value.number;
     }
 
@@ -229,18 +229,18 @@ public:
     }
 
 private:
-    bool IsWeight(double number) const
+    std::optional<double> TellWeight(double number) const
     {
-        return (number >= 0.0 && std::isfinite(number)) || number == gMissingValue ||
-               fVariable.missingNumbers.Contains(number);
+        if (fVariable.missingNumbers.Contains(number))
+            return gMissingValue;
+        return number >= 0.0 && std::isfinite(number) ? std::optional(number) : std::nullopt;
     }
 
     std::optional<double> TellCode(const PlainValue& value)
     {
         const bool isMissing =
             value.isMissing || (fIsText ? fVariable.missingTexts.Contains(value.text)
-                                        : std::isnan(value.number) || value.number == gMissingValue ||
-                                              fVariable.missingNumbers.Contains(value.number));
+                                        : std::isnan(value.number) || fVariable.missingNumbers.Contains(value.number));
         if (isMissing)
             return kMissingCode;
         const auto isSame = [&](const PlainValue& other)

@@ -1,5 +1,7 @@
 #include "fuzz/arrowcolumn.h"
 
+#include <mcobnqrt/mccommon.h>
+
 #include <algorithm>
 #include <cmath>
 #include <cstdlib>
@@ -74,6 +76,8 @@ StoredValue MakeFloat(FuzzedDataProvider& input)
                                               : static_cast<Number>(input.ConsumeIntegralInRange(-20, 200)) / 4;
     PlainValue plain;
     plain.number = number;
+    if (plain.number == MCMV::gMissingValue) // a value all the same, and so told apart from a missing one
+        plain.number = std::nextafter(plain.number, 0.0);
     return {plain, BytesOf(number)};
 }
 

@@ -91,12 +91,17 @@ bool HasCuts(const Result& result)
     return !result.cutPoints.empty();
 }
 
-/// Whether the table has a column already that would be a new one.
-bool IsTaken(const Findings& findings, const std::vector<std::string>& names)
+/// Whether a new column would have the name of another one.
+bool IsTaken(const Findings& findings, std::vector<std::string> names)
 {
     for (const Result& result : findings.results)
-        if (HasCuts(result) && std::count(names.begin(), names.end(), GetBinColumn(findings, result)) > 0)
+    {
+        if (!HasCuts(result))
+            continue;
+        names.push_back(GetBinColumn(findings, result));
+        if (std::count(names.begin(), names.end(), names.back()) > 1)
             return true;
+    }
     return false;
 }
 
