@@ -36,8 +36,7 @@ double ToDouble(Number number)
 
 double ToDouble(double number)
 {
-    constexpr double kNextToMissing = -1.7976931348623155e308;
-    return number == gMissingValue ? kNextToMissing : number;
+    return TellFromMissing(number);
 }
 
 double ToDouble(Half number)

@@ -3,11 +3,20 @@
 
 #include "columntype.h"
 
+#include <mcobnqrt/mccommon.h>
+
 #include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <optional>
 #include <string_view>
+
+/// The number, or the next one if it is gMissingValue itself, the most negative of all doubles.
+inline double TellFromMissing(double number)
+{
+    constexpr double kNextToMissing = -1.7976931348623155e308;
+    return number == MCMV::gMissingValue ? kNextToMissing : number;
+}
 
 /// The numbers of one column of one batch, read where they lie. Borrows the memory of the batch.
 class ColumnReader
@@ -15,8 +24,8 @@ class ColumnReader
 public:
     virtual ~ColumnReader() = default;
 
-    /// Writes the values of the rows from `first` on to `values`, gMissingValue where there is none. A NaN stays one. A
-    /// value that is gMissingValue itself, the most negative of all doubles, becomes the next one.
+    /// Writes the values of the rows from `first` on to `values`, gMissingValue where there is none. A NaN stays one. All
+    /// others are told from gMissingValue.
     virtual void Read(std::size_t first, std::size_t count, double* values) const = 0;
 };
 

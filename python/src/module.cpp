@@ -242,7 +242,7 @@ public:
                         std::optional<std::pair<double, double>> interval, const std::vector<std::string>& texts)
     {
         Variable& variable = fVariables.at(index);
-        for (const double value : values) variable.missingNumbers.AddValue(value, "");
+        for (const double value : values) variable.missingNumbers.AddValue(TellFromMissing(value), "");
         if (interval)
             variable.missingNumbers.SetInterval(BINNumericInterval(interval->first, interval->second));
         for (const std::string& text : texts) variable.missingTexts.AddValue(text, "");

@@ -98,6 +98,7 @@ def test_the_most_negative_number_is_a_value_and_infinities_can_be_missing():
 
     assert mb.equal_frequency_bins(frame, n_bins=2)["x"].missing_weight == 1.0
     assert mb.equal_frequency_bins(frame, n_bins=2)["x"].minimum == -INF
+    assert mb.equal_frequency_bins(frame, n_bins=2, missing={"x": -LARGEST})["x"].missing_weight == 2.0
     for missing, weight in (([INF], 2.0), ([INF, -INF], 3.0), ([(2.0, INF)], 3.0), ([(-INF, 1.0)], 4.0)):
         result = mb.equal_frequency_bins(frame, n_bins=2, missing={"x": missing})
         placed = result.transform(frame)["x"]
