@@ -10,10 +10,10 @@ namespace
 {
 
 /// Sets the title of a terminal, changes its colour with the one-byte form of "ESC [", turns the direction of writing,
-/// and isolates a part of it.
+/// isolates a part of it, and ends both again, so that this file can be read.
 const std::string kEvil = "a\x1b]0;title\x07\xC2\x9B"
-                          "31m\u202E\u2066z";
-constexpr const char* kShown = R"(a\x1b]0;title\x07\u009b31m\u202e\u2066z)";
+                          "31m\u202E\u2066z\u2069\u202C";
+constexpr const char* kShown = R"(a\x1b]0;title\x07\u009b31m\u202e\u2066z\u2069\u202c)";
 
 using McbinMessages = Mcbin;
 using McbinMessagesOnTerminal = McbinOnTerminal;
@@ -22,14 +22,14 @@ using McbinMessagesOnTerminal = McbinOnTerminal;
 
 TEST_F(McbinMessagesOnTerminal, TextsOfOthersComeWithoutControlCharactersAndOverridesOfDirection)
 {
-    const std::string data = kEvil + ",y,\u202Dt\n1," + kEvil + ",\x1b[A\n2," + kEvil + ",\x1b[A\n3,b,\n4,b,\n";
+    const std::string data = kEvil + ",y,\u202Dt\u202C\n1," + kEvil + ",\x1b[A\n2," + kEvil + ",\x1b[A\n3,b,\n4,b,\n";
     Write(kEvil, data);
     Write("bins.json", "{}");
     const std::string quoted = "'" + kEvil + "'";
     const std::vector<std::string> arguments{"supervised " + quoted + " --target y",
                                              "supervised " + quoted + " --target y --categorical " + quoted,
                                              "supervised " + quoted + " --target " + quoted + "x",
-                                             "supervised " + quoted + " --target y --attributes '?t,'" + quoted +
+                                             "supervised " + quoted + " --target y --attributes '?t?,'" + quoted +
                                                  " --strict",
                                              "supervised " + quoted + " --target y --report " + quoted + "/page.html",
                                              "supervised " + quoted + " --target y --closed " + quoted,
@@ -44,7 +44,7 @@ TEST_F(McbinMessagesOnTerminal, TextsOfOthersComeWithoutControlCharactersAndOver
     {
         Terminal terminal(fData.Path(), fTemporary.Path(), one, "NO_COLOR=1", 500);
         EXPECT_NE(-1, terminal.GetExitCode()) << one;
-        for (const char* evil : {"\x1b]", "\x07", "\xC2\x9B", "\u202E", "\u2066", "\u202D", "\x1b[A"})
+        for (const char* evil : {"\x1b]", "\x07", "\xC2\x9B", "\xE2\x80", "\xE2\x81", "\x1b[A"})
             EXPECT_EQ(std::string::npos, terminal.GetText().find(evil)) << one << '\n' << terminal.GetText();
     }
     Terminal terminal(fData.Path(), fTemporary.Path(), "supervised " + quoted + " --target y", "", 500);

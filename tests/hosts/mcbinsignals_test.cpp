@@ -78,7 +78,7 @@ TEST_F(McbinSignals, TheEndOfTheInputBehindOneIsNoSuccess)
     // Rows of 16 bytes, so that a pipe of any size holds whole ones, and the data end with one.
     std::string rows;
     for (int i = 1000000; i < 1150000; ++i) rows += std::to_string(i) + (i % 10 < 5 ? ",a,-----\n" : ",b,-----\n");
-    ASSERT_EQ(0u, rows.size() % (150000 * 16));
+    ASSERT_EQ(0u, rows.size() % 2400000);
     const std::string header = "x,y,text\n";
     ASSERT_EQ(0, RunOn(header + rows.substr(0, 4096), "equal-frequency", "--format json >bins.json").exitCode);
     Write("result", "former");

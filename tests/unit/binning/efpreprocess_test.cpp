@@ -212,6 +212,29 @@ void ExpectCountsAreWhatTheCutsGive(const std::vector<double>& values, const std
     ExpectNear(rows, bins.fCounts, margin);
 }
 
+/// Values in rising order: neighbouring doubles, some far apart, and some with the outermost numbers among them.
+std::vector<double> RandomValues(Dice& dice, unsigned int seed, int numTuples)
+{
+    const std::vector<double> starts{-kInfinity,
+                                     -kLargest,
+                                     -1e308,
+                                     -1.0,
+                                     -10 * kSmallest,
+                                     0.0,
+                                     1.0 - 1e-15,
+                                     1e300,
+                                     9e307,
+                                     1e308,
+                                     std::nextafter(kLargest, 0.0)};
+    std::vector<double> values = Chain(dice, starts[seed % starts.size()], numTuples);
+    if (seed % 4 == 0) // far apart
+        std::generate(values.begin(), values.end(), [&] { return dice.Below(seed % 3 == 0 ? 5 : 1000); });
+    if (seed % 5 == 0)
+        values.insert(values.end(), {-kInfinity, -1e308, -0.0, 0.0, 1e308, 1.7e308, kInfinity});
+    std::sort(values.begin(), values.end());
+    return values;
+}
+
 } // namespace
 
 TEST(EqualFrequency, CutMetBetweenTwoValuesPartsThem)
@@ -244,27 +267,11 @@ TEST(EqualFrequency, CutMetBetweenTwoValuesPartsThem)
 
 TEST(EqualFrequency, CountsAreWhatTheCutsGive)
 {
-    const std::vector<double> starts{-kInfinity,
-                                     -kLargest,
-                                     -1e308,
-                                     -1.0,
-                                     -10 * kSmallest,
-                                     0.0,
-                                     1.0 - 1e-15,
-                                     1e300,
-                                     9e307,
-                                     1e308,
-                                     std::nextafter(kLargest, 0.0)};
     for (unsigned int seed = 1; seed <= 4000; ++seed)
     {
         Dice dice(seed);
         const int numTuples = 1 + dice.Below(60);
-        std::vector<double> values = Chain(dice, starts[seed % starts.size()], numTuples);
-        if (seed % 4 == 0) // far apart
-            std::generate(values.begin(), values.end(), [&] { return dice.Below(seed % 3 == 0 ? 5 : 1000); });
-        if (seed % 5 == 0)
-            values.insert(values.end(), {-kInfinity, -1e308, -0.0, 0.0, 1e308, 1.7e308, kInfinity});
-        std::sort(values.begin(), values.end());
+        const std::vector<double> values = RandomValues(dice, seed, numTuples);
         const bool isExact = seed % 2 == 0;
         std::vector<double> weights;
         for (std::size_t i = 0; i < values.size(); ++i)

@@ -90,6 +90,30 @@ Rows RandomRows(Dice& dice, int numRows, int numCategories, Cells kind, int numA
     return rows;
 }
 
+/// Multiplies all cells by 2^exponent.
+void Scale(Rows& rows, int exponent)
+{
+    for (std::vector<double>& row : rows)
+    {
+        for (double& cell : row) cell = std::ldexp(cell, exponent);
+    }
+}
+
+/// A row with a heavy cell of the first category, and 148 rows with one unit each: of two categories in turns of 37 rows,
+/// of more categories 100 of the first, and one of each other.
+Rows RowsOfUnits(int numCategories, double heavy)
+{
+    const auto numCells = static_cast<std::size_t>(numCategories);
+    Rows rows(149, std::vector<double>(numCells, 0.0));
+    rows[0][0] = heavy;
+    for (std::size_t i = 0; i < 148; ++i)
+    {
+        const std::size_t moreThanTwo = i < 100 ? 0 : i - 99;
+        rows[i + 1][numCategories == 2 ? i / 37 % 2 : moreThanTwo] = 1.0;
+    }
+    return rows;
+}
+
 } // namespace
 
 TEST(EntropySplit, WorkedFiguresOfTheCriterion)
@@ -281,15 +305,8 @@ TEST(EntropySplit, EqualsThePlainFormWhereSumsCeaseToBeExact)
         {
             for (const int numCategories : {2, 49})
             {
-                Rows rows(148, std::vector<double>(static_cast<std::size_t>(numCategories), 0.0));
-                for (std::size_t row = 0; row < rows.size(); ++row)
-                    rows[row][numCategories == 2 ? row / 37 % 2 : row < 100 ? 0 : row - 99] = 1.0;
-                rows.insert(rows.begin(), std::vector<double>(static_cast<std::size_t>(numCategories), 0.0));
-                rows[0][0] = 0x1p53 + heavy;
-                for (std::vector<double>& row : rows)
-                {
-                    for (double& cell : row) cell = std::ldexp(cell, exponent);
-                }
+                Rows rows = RowsOfUnits(numCategories, 0x1p53 + heavy);
+                Scale(rows, exponent);
                 EqualsThePlainForm(rows, "exponent " + std::to_string(exponent) + " heavy " + std::to_string(heavy) +
                                              " categories " + std::to_string(numCategories));
             }
@@ -309,10 +326,7 @@ TEST(EntropySplit, EqualsThePlainFormAtTheEndsOfTheRange)
                 Dice dice(seed);
                 Rows rows = RandomRows(dice, 200 + dice.Below(300), 2 + dice.Below(3), kind, 40);
                 UseUp(rows);
-                for (std::vector<double>& row : rows)
-                {
-                    for (double& cell : row) cell = std::ldexp(cell, exponent);
-                }
+                Scale(rows, exponent);
                 const std::string what = CaseName(kind, seed) + " exponent " + std::to_string(exponent);
                 numWithCuts += EqualsThePlainForm(rows, what) ? 1 : 0;
             }
