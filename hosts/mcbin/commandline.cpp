@@ -93,8 +93,8 @@ CLI::Option* AddRepeated(CLI::App& command, const std::string& name, std::vector
     return command.add_option(name, list, description)->allow_extra_args(false)->option_text(what);
 }
 
-/// The same that may be given with commas, too. Names of columns may hold some: their lists are split where the columns
-/// are known.
+/// A list that may be given by repeating the option, or with commas. A list of names of columns is not for this: names
+/// may hold commas, so these lists are split where the columns are known.
 CLI::Option* AddList(CLI::App& command, const std::string& name, std::vector<std::string>& list,
                      const std::string& description, const std::string& what)
 {

@@ -267,7 +267,7 @@ Findings GetFindings(Json json)
     findings.dataName = data.at("name").is_null() ? "" : data.at("name").get<std::string>();
     if (!data.at("records").is_null())
         findings.records = GetInteger(data.at("records"));
-    const Json withoutWeight = data.value("records_without_weight", Json()); // as above
+    const Json withoutWeight = data.value("records_without_weight", Json()); // absent in version 1
     if (!withoutWeight.is_null())
         findings.recordsWithoutWeight = GetInteger(withoutWeight);
     findings.missingText = data.at("missing_text").get<std::vector<std::string>>();

@@ -11,7 +11,7 @@
 /// too large for a double; "nan".
 std::optional<double> ParseNumber(std::string_view text);
 
-/// The same with a NaN for nothing. It is for millions of fields: an optional is stored in two parts and loaded as a
+/// As ParseNumber, but returns NaN where there is no number. It is for millions of fields: an optional is stored in two parts and loaded as a
 /// whole, for which the processor waits half as long as it takes to read the number.
 double ParseNumberOrNaN(std::string_view text);
 
@@ -25,7 +25,7 @@ constexpr const char* kPlainNumbers = "numbers are written as in 1234.5, without
 /// The number in as few digits as read back to the same double. Infinities are "inf" and "-inf".
 std::string FormatNumber(double value);
 
-/// The same of a figure that may be lacking: "none" then.
+/// As FormatNumber, but returns "none" for a figure that was not found.
 std::string FormatFigure(const std::optional<double>& figure);
 
 /// A sum of weights, for a person: in full if it is whole, and else in 6 digits, or as many as there are before the

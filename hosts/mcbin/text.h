@@ -10,10 +10,10 @@
 /// writing, and bytes that are no UTF-8 become escapes like "\x0a" and "\u202e".
 std::string Printable(std::string_view text);
 
-/// The same in single quotes, for a message.
+/// Printable text in single quotes, for a message.
 std::string Quote(std::string_view text);
 
-/// The same as text of a page, or of an attribute in double quotes.
+/// Printable text escaped for a page in HTML, also within an attribute in double quotes.
 std::string EscapeHtml(std::string_view text);
 
 /// The beginning of a text that is wider than `width` columns, with "..." behind it.

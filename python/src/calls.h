@@ -59,7 +59,7 @@ private:
     bool fIsAtEnd = false;
 };
 
-/// Is asked ahead of each record, and so looks for itself only when there are no more of them: the records look before.
+/// The library asks before each record. BlockRecords has polled by then, so this polls only after the last record.
 class CancelOnInterrupt : public MCQueryCancel
 {
 public:
