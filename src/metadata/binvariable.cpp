@@ -1,7 +1,5 @@
 #include <mcobnqrt/binvariable.h>
 
-#include "metadata/nameindex.h"
-
 #include <utility>
 
 BINVariable::BINVariable(const std::string& name, const std::string& label, VariableRole role)
@@ -9,7 +7,10 @@ BINVariable::BINVariable(const std::string& name, const std::string& label, Vari
 {
 }
 
-BINVariable::BINVariable(const BINVariable& other) = default;
+BINVariable::BINVariable(const BINVariable& other)
+    : IBINVariable(other), fName(other.fName), fLabel(other.fLabel), fRole(other.fRole)
+{
+}
 
 BINVariable::~BINVariable() = default;
 
@@ -40,9 +41,17 @@ void BINVariable::SetVariableRole(VariableRole role)
 
 void BINVariable::SwapVariable(BINVariable& other)
 {
-    if (fName != other.fName)
-        NoteNameChange();
+    for (const BINVariable* variable : {this, &other})
+    {
+        if (variable->fIsRenamed != nullptr && fName != other.fName)
+            *variable->fIsRenamed = true;
+    }
     fName.swap(other.fName);
     fLabel.swap(other.fLabel);
     std::swap(fRole, other.fRole);
+}
+
+void BINVariable::WatchName(std::shared_ptr<bool> isRenamed)
+{
+    fIsRenamed = std::move(isRenamed);
 }

@@ -372,7 +372,7 @@ int BINVarList::Append(std::unique_ptr<IBINVariable> variable)
     if (fNames == nullptr || !fNames->IsUpToDate())
         fNames = std::make_unique<NameIndex>(fVars);
     ReserveOneMore(fVars);
-    fNames->Append(variable->GetVariableName()); // the last step that can fail
+    fNames->Append(*variable); // the last step that can fail
     fVars.push_back(std::move(variable));
     return static_cast<int>(fVars.size()) - 1;
 }

@@ -2,34 +2,15 @@
 
 #include "base/growth.h"
 
-#include <mcobnqrt/ibinvariable.h>
+#include <mcobnqrt/binvariable.h>
 
 #include <algorithm>
-#include <atomic>
 #include <limits>
 #include <utility>
 
-namespace
-{
-
-std::atomic<std::uint64_t> numNameChanges{0};
-
-} // namespace
-
-void NoteNameChange()
-{
-    ++numNameChanges;
-}
-
 BINVarList::NameIndex::NameIndex(const std::vector<std::unique_ptr<IBINVariable>>& variables)
-    : fNumNameChanges(numNameChanges)
 {
-    for (const auto& variable : variables) Append(variable->GetVariableName());
-}
-
-bool BINVarList::NameIndex::IsUpToDate() const
-{
-    return fNumNameChanges == numNameChanges;
+    for (const auto& variable : variables) Append(*variable);
 }
 
 int BINVarList::NameIndex::Find(const std::string& name) const
@@ -45,13 +26,14 @@ int BINVarList::NameIndex::Find(const std::string& name) const
     return static_cast<int>(place - fNames.begin());
 }
 
-void BINVarList::NameIndex::Append(std::string name)
+void BINVarList::NameIndex::Append(IBINVariable& variable)
 {
-    auto made = std::make_unique<const Name>(Name{std::move(name), fNextNumber});
+    auto made = std::make_unique<const Name>(Name{variable.GetVariableName(), fNextNumber});
     ReserveOneMore(fNames);
     fNameOfText.emplace(made->fText, made.get()); // the last step that can fail
     fNames.push_back(std::move(made));
     ++fNextNumber;
+    static_cast<BINVariable&>(variable).WatchName(fIsRenamed); // a list makes no other variables
 }
 
 void BINVarList::NameIndex::Remove(int index)

@@ -10,10 +10,6 @@
 #include <unordered_map>
 #include <vector>
 
-/// Tells every NameIndex that some variable of the program has got another name: a host can assign one variable to
-/// another behind the back of the list that owns it. May be called by several threads at a time.
-void NoteNameChange();
-
 /// Finds the variables of a list by their names without comparing each one.
 ///
 /// It holds copies of the names, by variable index. Find() can be trusted as long as the index is up to date.
@@ -22,14 +18,14 @@ class BINVarList::NameIndex
 public:
     explicit NameIndex(const std::vector<std::unique_ptr<IBINVariable>>& variables);
 
-    /// False as soon as a variable, of whatever list, has got another name since the construction.
-    bool IsUpToDate() const;
+    /// False as soon as one of the variables has got another name.
+    bool IsUpToDate() const { return !*fIsRenamed; }
 
     /// The first index of the name, or -1.
     int Find(const std::string& name) const;
 
     /// An exception leaves the object as it was.
-    void Append(std::string name);
+    void Append(IBINVariable& variable);
 
     /// Every later index moves down by one.
     void Remove(int index);
@@ -44,7 +40,7 @@ private:
     std::vector<std::unique_ptr<const Name>> fNames;                    ///< by index
     std::unordered_multimap<std::string_view, const Name*> fNameOfText; ///< the keys lie in the names
     std::uint64_t fNextNumber = 0;
-    std::uint64_t fNumNameChanges; ///< of the program, at the construction
+    std::shared_ptr<bool> fIsRenamed = std::make_shared<bool>(false); ///< every variable of the index sets it
 };
 
 #endif
