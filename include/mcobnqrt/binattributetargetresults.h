@@ -31,7 +31,9 @@ public:
 
     /// One row per bin, in ascending order: first the weight of the bin, then its weight in each category of the
     /// target, by code from 0. There is a row more than there are cut points. The rows are empty where nothing was
-    /// binned.
+    /// binned. A bin can weigh 0 if the attribute was pre-binned: a pre-bin without a value is cut off where the
+    /// threshold of the criterion is negative, at a weight below 2, or so small beside a weight of some 1e16 and more
+    /// that a gain of rounding alone exceeds it.
     const std::vector<std::vector<double>>& GetCellCounts() const { return fCellCounts; }
 
     /// How many different values of the attribute there are among the records that GetTotalWeight() counts.

@@ -1,10 +1,10 @@
 // Sequences of calls of the library: a variable list, its encoders and missing values, settings, an algorithm of either
 // kind, several runs, and callbacks that interfere. What comes out is counted again from the records.
 
-#include "fuzz/check.h"
-#include "fuzz/recount.h"
-#include "support/hostdata.h"
-#include "support/tempdir.h"
+#include "tests/fuzz/check.h"
+#include "tests/fuzz/recount.h"
+#include "tests/support/hostdata.h"
+#include "tests/support/tempdir.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 
@@ -382,6 +382,7 @@ public:
     {
         auto settings = TakeSettings<BINSettings>(input, directory, callbacks, data);
         settings.SetNumDistinctValueThreshold(input.ConsumeIntegralInRange(-1, 20));
+        data.distinctThreshold = settings.GetNumDistinctValueThreshold();
         settings.SetSmallBinDetectionThreshold(input.ConsumeIntegralInRange(0, 8) / 8.0);
         BINFactory factory;
         fAlgorithm.reset(factory.CreateBINAlgorithm(settings, data.list));

@@ -12,6 +12,7 @@ struct HostData
     IBINVariable::BINWRoundingOption rounding = IBINVariable::RoundClosest;
     std::vector<std::vector<double>> records; ///< an empty one is a turn without a record
     bool isRightClosed = true;                ///< when the records were read
+    int distinctThreshold = 0;                ///< of a supervised run
 };
 
 /// Counts the records again, plainly, by the cut points of the result, and ends the process where the result says

@@ -1,8 +1,8 @@
 #include "binning/binalgorithm.h"
 #include "binning/entropy.h"
 #include "binning/entropysplit.h"
-#include "oracle/plainsplit.h"
-#include "support/hostdata.h"
+#include "tests/oracle/plainsplit.h"
+#include "tests/support/hostdata.h"
 
 #include <gtest/gtest.h>
 
@@ -176,6 +176,13 @@ TEST(EntropySplit, LightRangeIsCutBetweenRowsThoughACutBesideAllRowsIsAsGood)
     }
     // A gain of 0 pays for the cut beside all rows, with one entropy to tell, but not for one with two.
     EXPECT_TRUE(CutPoints({{0.275, 0.275}, {0.275, 0.275}}, false).empty());
+}
+
+TEST(EntropySplit, EmptyRowIsCutOffWhereTheGainOfRoundingExceedsTheThreshold)
+{
+    // The entropy times the weight, divided by the weight again, is an ulp below the entropy; the threshold is 1e-297.
+    EXPECT_EQ(std::set<double>{1.0}, CutPoints({{0, 0}, {1e300, 3e300}}, true));
+    EXPECT_EQ(std::set<double>{1.0}, PlainCutPoints({{0, 0}, {1e300, 3e300}}, true));
 }
 
 TEST(EntropySplit, LowestOfEqualRowsIsCut)
