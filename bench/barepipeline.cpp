@@ -1,4 +1,4 @@
-#include "barepipeline.h"
+#include "bench/barepipeline.h"
 
 #include "data/tuplesort.h"
 

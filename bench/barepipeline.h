@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_BENCH_BAREPIPELINE_H
 #define MCOBNQRT_BENCH_BAREPIPELINE_H
 
-#include "workloads.h"
+#include "bench/workloads.h"
 
 #include <string>
 

@@ -1,9 +1,9 @@
 // Whole runs against the bare pipeline, in one process, turn by turn: see README.md.
 
-#include "barepipeline.h"
-#include "measure.h"
-#include "support/tempdir.h"
-#include "workloads.h"
+#include "bench/barepipeline.h"
+#include "bench/measure.h"
+#include "bench/workloads.h"
+#include "tests/support/tempdir.h"
 
 #include <algorithm>
 #include <cstdio>

@@ -1,8 +1,8 @@
 // How the time of one attribute grows with the records: loading, sorting, tally, split and storing, without the pass.
 
-#include "measure.h"
-#include "support/tempdir.h"
-#include "workloads.h"
+#include "bench/measure.h"
+#include "bench/workloads.h"
+#include "tests/support/tempdir.h"
 
 #include <algorithm>
 #include <cmath>

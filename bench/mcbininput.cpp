@@ -1,10 +1,10 @@
-#include "columnplan.h"
-#include "options.h"
-#include "progress.h"
-#include "recordsource.h"
-#include "tableprofile.h"
-#include "tablereader.h"
-#include "variables.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/input/recordsource.h"
+#include "hosts/mcbin/input/tableprofile.h"
+#include "hosts/mcbin/input/tablereader.h"
+#include "hosts/mcbin/input/variables.h"
+#include "hosts/mcbin/options.h"
+#include "hosts/mcbin/progress.h"
 
 #include <chrono>
 #include <cstdio>

@@ -1,8 +1,8 @@
 // One whole run over a file of doubles, column by column: what the library takes for data that another program has,
 // too.
 
-#include "measure.h"
-#include "workloads.h"
+#include "bench/measure.h"
+#include "bench/workloads.h"
 
 #include <cstdio>
 #include <cstdlib>

@@ -1,7 +1,7 @@
 // What the stages of a run cost on their own. One "item" is a value in the pass, a tuple from loading to the
 // equal-frequency walk, a row of the value table in scan and split, a bin in merge and store.
 
-#include "workloads.h"
+#include "bench/workloads.h"
 
 #include "base/bincancelmonitor.h"
 #include "binning/binefpreprocess.h"
@@ -12,7 +12,7 @@
 #include "data/bindatapreparator.h"
 #include "data/tally.h"
 #include "data/tuplesort.h"
-#include "support/tempdir.h"
+#include "tests/support/tempdir.h"
 
 #include <mcobnqrt/binoutput.h>
 

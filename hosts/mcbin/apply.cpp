@@ -1,16 +1,16 @@
-#include "apply.h"
+#include "hosts/mcbin/apply.h"
 
-#include "binner.h"
-#include "csvoutput.h"
-#include "failure.h"
-#include "figures.h"
-#include "interrupt.h"
-#include "jsoninput.h"
-#include "options.h"
-#include "outputfile.h"
-#include "progress.h"
-#include "tablereader.h"
-#include "text.h"
+#include "hosts/mcbin/binner.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/input/jsoninput.h"
+#include "hosts/mcbin/input/tablereader.h"
+#include "hosts/mcbin/interrupt.h"
+#include "hosts/mcbin/options.h"
+#include "hosts/mcbin/output/csvoutput.h"
+#include "hosts/mcbin/output/outputfile.h"
+#include "hosts/mcbin/progress.h"
+#include "hosts/mcbin/text.h"
 
 #include <algorithm>
 #include <optional>

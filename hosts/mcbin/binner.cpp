@@ -1,8 +1,8 @@
-#include "binner.h"
+#include "hosts/mcbin/binner.h"
 
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
 
 #include <algorithm>
 

@@ -1,12 +1,12 @@
-#include "collect.h"
+#include "hosts/mcbin/collect.h"
 
 #include "bins/infinitevalues.h"
 #include "bins/weightgrid.h"
-#include "columnplan.h"
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
-#include "variables.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/input/variables.h"
+#include "hosts/mcbin/numbers.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 

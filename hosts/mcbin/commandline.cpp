@@ -1,8 +1,8 @@
-#include "commandline.h"
+#include "hosts/mcbin/commandline.h"
 
-#include "delimiter.h"
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/input/delimiter.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include "bins/tempdirectory.h"
 

@@ -1,7 +1,7 @@
 #ifndef MCBIN_COMMANDLINE_H
 #define MCBIN_COMMANDLINE_H
 
-#include "options.h"
+#include "hosts/mcbin/options.h"
 
 #include <CLI/CLI.hpp>
 

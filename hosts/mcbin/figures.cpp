@@ -1,8 +1,8 @@
-#include "figures.h"
+#include "hosts/mcbin/figures.h"
 
-#include "findings.h"
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <algorithm>
 #include <cmath>

@@ -1,7 +1,7 @@
 #ifndef MCBIN_FINDINGS_H
 #define MCBIN_FINDINGS_H
 
-#include "options.h"
+#include "hosts/mcbin/options.h"
 
 #include <mcobnqrt/mcstatus.h>
 

@@ -1,4 +1,4 @@
-#include "interrupt.h"
+#include "hosts/mcbin/interrupt.h"
 
 #include <csignal>
 #include <initializer_list>

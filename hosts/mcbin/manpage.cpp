@@ -1,6 +1,6 @@
-#include "manpage.h"
+#include "hosts/mcbin/manpage.h"
 
-#include "text.h"
+#include "hosts/mcbin/text.h"
 
 #include <CLI/CLI.hpp>
 

@@ -1,11 +1,11 @@
-#include "notes.h"
+#include "hosts/mcbin/notes.h"
 
-#include "columnplan.h"
-#include "findings.h"
-#include "numbers.h"
-#include "recordsource.h"
-#include "text.h"
-#include "variables.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/input/recordsource.h"
+#include "hosts/mcbin/input/variables.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
 

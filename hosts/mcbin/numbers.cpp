@@ -1,4 +1,4 @@
-#include "numbers.h"
+#include "hosts/mcbin/numbers.h"
 
 #include <fmt/format.h>
 

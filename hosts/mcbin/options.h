@@ -2,7 +2,7 @@
 #define MCBIN_OPTIONS_H
 
 #include "bins/weightgrid.h"
-#include "tablereader.h"
+#include "hosts/mcbin/input/tablereader.h"
 
 #include <string>
 #include <vector>

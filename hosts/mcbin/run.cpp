@@ -1,15 +1,15 @@
-#include "run.h"
+#include "hosts/mcbin/run.h"
 
-#include "collect.h"
-#include "columnplan.h"
-#include "failure.h"
-#include "interrupt.h"
-#include "notes.h"
-#include "progress.h"
-#include "recordsource.h"
-#include "statuswords.h"
-#include "tableprofile.h"
-#include "variables.h"
+#include "hosts/mcbin/collect.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/input/recordsource.h"
+#include "hosts/mcbin/input/tableprofile.h"
+#include "hosts/mcbin/input/variables.h"
+#include "hosts/mcbin/interrupt.h"
+#include "hosts/mcbin/notes.h"
+#include "hosts/mcbin/progress.h"
+#include "hosts/mcbin/statuswords.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 

@@ -1,7 +1,7 @@
 #ifndef MCBIN_RUN_H
 #define MCBIN_RUN_H
 
-#include "findings.h"
+#include "hosts/mcbin/findings.h"
 
 class Progress;
 class TableReader;

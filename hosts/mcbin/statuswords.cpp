@@ -1,4 +1,4 @@
-#include "statuswords.h"
+#include "hosts/mcbin/statuswords.h"
 
 #include <mcobnqrt/mcstatus.h>
 

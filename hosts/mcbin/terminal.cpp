@@ -1,4 +1,4 @@
-#include "terminal.h"
+#include "hosts/mcbin/terminal.h"
 
 #include <algorithm>
 #include <cstdlib>

@@ -1,6 +1,6 @@
-#include "text.h"
+#include "hosts/mcbin/text.h"
 
-#include "utf8.h"
+#include "hosts/mcbin/utf8.h"
 
 #include <fmt/format.h>
 

@@ -1,4 +1,4 @@
-#include "utf8.h"
+#include "hosts/mcbin/utf8.h"
 
 #include <array>
 

@@ -1,5 +1,5 @@
-#include "faults/tworuns.h"
-#include "support/tempdir.h"
+#include "tests/faults/tworuns.h"
+#include "tests/support/tempdir.h"
 
 #include <cstdlib>
 #include <new>

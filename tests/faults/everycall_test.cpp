@@ -1,8 +1,8 @@
 #include "binning/binalgorithm.h"
 #include "binning/efbinalgorithm.h"
-#include "faults/tworuns.h"
-#include "support/faultyplatform.h"
-#include "support/tempdir.h"
+#include "tests/faults/tworuns.h"
+#include "tests/support/faultyplatform.h"
+#include "tests/support/tempdir.h"
 
 namespace
 {

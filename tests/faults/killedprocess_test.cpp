@@ -1,7 +1,7 @@
 #include "binning/binalgorithm.h"
-#include "support/faultyplatform.h"
-#include "support/runs.h"
-#include "support/tempdir.h"
+#include "tests/support/faultyplatform.h"
+#include "tests/support/runs.h"
+#include "tests/support/tempdir.h"
 
 #include <gtest/gtest.h>
 

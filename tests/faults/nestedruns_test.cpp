@@ -1,4 +1,4 @@
-#include "support/runs.h"
+#include "tests/support/runs.h"
 
 #include <functional>
 #include <string>

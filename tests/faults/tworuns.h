@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_TESTS_TWORUNS_H
 #define MCOBNQRT_TESTS_TWORUNS_H
 
-#include "support/runs.h"
+#include "tests/support/runs.h"
 
 #include <algorithm>
 #include <utility>

@@ -1,12 +1,12 @@
 // What the Python package reads from Arrow batches and from arrays beside them, against values that were written down
 // when the batches were made.
 
-#include "fuzz/arrowcolumn.h"
-#include "fuzz/check.h"
+#include "tests/fuzz/arrowcolumn.h"
+#include "tests/fuzz/check.h"
 
-#include "batches.h"
-#include "faults.h"
-#include "tableblocks.h"
+#include "hosts/python/src/batches.h"
+#include "hosts/python/src/faults.h"
+#include "hosts/python/src/tableblocks.h"
 
 #include <mcobnqrt/mccommon.h>
 

@@ -1,4 +1,4 @@
-#include "fuzz/arrowcolumn.h"
+#include "tests/fuzz/arrowcolumn.h"
 
 #include <mcobnqrt/mccommon.h>
 

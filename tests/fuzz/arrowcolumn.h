@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_TESTS_FUZZ_ARROWCOLUMN_H
 #define MCOBNQRT_TESTS_FUZZ_ARROWCOLUMN_H
 
-#include "arrowabi.h"
+#include "hosts/python/src/arrowabi.h"
 
 #include <fuzzer/FuzzedDataProvider.h>
 

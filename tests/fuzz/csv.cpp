@@ -2,24 +2,24 @@
 // written in every form, read back from JSON, and applied to the same table, where it has to fit every row; and the bins
 // counted there have to weigh what the run has told.
 
-#include "fuzz/check.h"
-#include "fuzz/mcbin.h"
-#include "support/tempdir.h"
+#include "tests/fuzz/check.h"
+#include "tests/fuzz/mcbin.h"
+#include "tests/support/tempdir.h"
 
-#include "apply.h"
-#include "commandline.h"
-#include "csvoutput.h"
-#include "failure.h"
-#include "figures.h"
-#include "findings.h"
-#include "htmlreport.h"
-#include "jsoninput.h"
-#include "jsonoutput.h"
-#include "progress.h"
-#include "run.h"
-#include "sqloutput.h"
-#include "tableoutput.h"
-#include "tablereader.h"
+#include "hosts/mcbin/apply.h"
+#include "hosts/mcbin/commandline.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/input/jsoninput.h"
+#include "hosts/mcbin/input/tablereader.h"
+#include "hosts/mcbin/output/csvoutput.h"
+#include "hosts/mcbin/output/htmlreport.h"
+#include "hosts/mcbin/output/jsonoutput.h"
+#include "hosts/mcbin/output/sqloutput.h"
+#include "hosts/mcbin/output/tableoutput.h"
+#include "hosts/mcbin/progress.h"
+#include "hosts/mcbin/run.h"
 
 #include <nlohmann/json.hpp>
 

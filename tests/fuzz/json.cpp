@@ -1,16 +1,16 @@
 // `mcbin apply` with a file of bins that somebody has changed. It has to end in an output of which every row is whole, or
 // in words.
 
-#include "fuzz/check.h"
-#include "fuzz/mcbin.h"
-#include "support/tempdir.h"
+#include "tests/fuzz/check.h"
+#include "tests/fuzz/mcbin.h"
+#include "tests/support/tempdir.h"
 
-#include "apply.h"
-#include "failure.h"
-#include "jsoninput.h"
-#include "options.h"
-#include "progress.h"
-#include "tablereader.h"
+#include "hosts/mcbin/apply.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/jsoninput.h"
+#include "hosts/mcbin/input/tablereader.h"
+#include "hosts/mcbin/options.h"
+#include "hosts/mcbin/progress.h"
 
 #include <nlohmann/json.hpp>
 

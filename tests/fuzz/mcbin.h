@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_TESTS_FUZZ_MCBIN_H
 #define MCOBNQRT_TESTS_FUZZ_MCBIN_H
 
-#include "fuzz/check.h"
+#include "tests/fuzz/check.h"
 
 #include <fstream>
 #include <string>

@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_TESTS_MCBINRUN_H
 #define MCOBNQRT_TESTS_MCBINRUN_H
 
-#include "support/tempdir.h"
+#include "tests/support/tempdir.h"
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
-#include "hosts/mcbinrun.h"
-#include "hosts/mcbinterminal.h"
+#include "tests/hosts/mcbinrun.h"
+#include "tests/hosts/mcbinterminal.h"
 
 #include <algorithm>
 #include <array>

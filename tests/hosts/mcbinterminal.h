@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_TESTS_MCBINTERMINAL_H
 #define MCOBNQRT_TESTS_MCBINTERMINAL_H
 
-#include "hosts/mcbinrun.h"
+#include "tests/hosts/mcbinrun.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "hosts/mcbinrun.h"
+#include "tests/hosts/mcbinrun.h"
 
 #include <algorithm>
 #include <cmath>

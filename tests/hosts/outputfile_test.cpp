@@ -1,7 +1,7 @@
-#include "hosts/mcbinrun.h"
+#include "tests/hosts/mcbinrun.h"
 
-#include "failure.h"
-#include "outputfile.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/output/outputfile.h"
 
 #include <cerrno>
 #include <filesystem>

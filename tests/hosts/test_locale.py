@@ -96,7 +96,7 @@ PACKAGE = r"""
 
 #: Makes the locale of C++ streams German, as another module of the process may.
 STREAMS = """
-    #include "support/groupeddigits.h"
+    #include "tests/support/groupeddigits.h"
     namespace { const GroupedDigitsEverywhere kGerman; }
 """
 
@@ -111,7 +111,7 @@ def german_streams(tmp_path_factory) -> str:
     source.write_text(textwrap.dedent(STREAMS))
     library = directory / "libstreams.so"
     subprocess.run(
-        [compiler, "-std=c++17", "-shared", "-fPIC", f"-I{ROOT / 'tests'}", source, "-o", library], check=True
+        [compiler, "-std=c++17", "-shared", "-fPIC", f"-I{ROOT}", source, "-o", library], check=True
     )
     return str(library)
 

@@ -2,7 +2,7 @@
 // repeated records, and what the object did before. Results are compared to the last bit, so the weights here are whole
 // numbers or halves.
 
-#include "support/runs.h"
+#include "tests/support/runs.h"
 
 #include <gtest/gtest.h>
 

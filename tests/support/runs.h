@@ -1,7 +1,7 @@
 #ifndef MCOBNQRT_TESTS_RUNS_H
 #define MCOBNQRT_TESTS_RUNS_H
 
-#include "support/hostdata.h"
+#include "tests/support/hostdata.h"
 
 #include <gtest/gtest.h>
 

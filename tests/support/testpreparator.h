@@ -4,9 +4,9 @@
 #include "base/bincancelmonitor.h"
 #include "data/binaryrecorditerator.h"
 #include "data/bindatapreparator.h"
-#include "support/faultyplatform.h"
-#include "support/hostdata.h"
-#include "support/tempdir.h"
+#include "tests/support/faultyplatform.h"
+#include "tests/support/hostdata.h"
+#include "tests/support/tempdir.h"
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
-#include "support/runs.h"
-#include "support/tempdir.h"
+#include "tests/support/runs.h"
+#include "tests/support/tempdir.h"
 
 #include <gtest/gtest.h>
 

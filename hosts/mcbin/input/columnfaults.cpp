@@ -1,9 +1,9 @@
-#include "columnfaults.h"
+#include "hosts/mcbin/input/columnfaults.h"
 
-#include "columnplan.h"
-#include "numbers.h"
-#include "tablereader.h"
-#include "text.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/input/tablereader.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
 

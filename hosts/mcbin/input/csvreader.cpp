@@ -1,7 +1,7 @@
-#include "csvreader.h"
+#include "hosts/mcbin/input/csvreader.h"
 
-#include "delimiter.h"
-#include "failure.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/delimiter.h"
 
 #include <algorithm>
 #include <cstring>

@@ -1,8 +1,8 @@
 #ifndef MCBIN_CSVREADER_H
 #define MCBIN_CSVREADER_H
 
-#include "inputfile.h"
-#include "rowtext.h"
+#include "hosts/mcbin/input/inputfile.h"
+#include "hosts/mcbin/input/rowtext.h"
 
 #include <csv.h>
 

@@ -1,4 +1,4 @@
-#include "delimiter.h"
+#include "hosts/mcbin/input/delimiter.h"
 
 #include <algorithm>
 #include <array>

@@ -1,7 +1,7 @@
-#include "inputfile.h"
+#include "hosts/mcbin/input/inputfile.h"
 
-#include "failure.h"
-#include "interrupt.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/interrupt.h"
 
 #include <mcobnqrt/binsettings.h>
 

@@ -1,10 +1,10 @@
-#include "jsoninput.h"
+#include "hosts/mcbin/input/jsoninput.h"
 
-#include "failure.h"
-#include "inputfile.h"
-#include "jsonoutput.h"
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/inputfile.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/output/jsonoutput.h"
+#include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
 #include <nlohmann/json.hpp>

@@ -1,7 +1,7 @@
 #ifndef MCBIN_JSONINPUT_H
 #define MCBIN_JSONINPUT_H
 
-#include "findings.h"
+#include "hosts/mcbin/findings.h"
 
 #include <string>
 

@@ -1,4 +1,4 @@
-#include "mergewatch.h"
+#include "hosts/mcbin/input/mergewatch.h"
 
 #include <algorithm>
 

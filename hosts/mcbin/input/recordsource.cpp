@@ -1,11 +1,11 @@
-#include "recordsource.h"
+#include "hosts/mcbin/input/recordsource.h"
 
-#include "columnplan.h"
-#include "numbers.h"
-#include "progress.h"
-#include "tableprofile.h"
-#include "tablereader.h"
-#include "variables.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/input/tableprofile.h"
+#include "hosts/mcbin/input/tablereader.h"
+#include "hosts/mcbin/input/variables.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/progress.h"
 
 #include <mcobnqrt/binstringencoder.h>
 

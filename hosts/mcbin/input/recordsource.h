@@ -3,7 +3,7 @@
 
 #include "bins/infinitevalues.h"
 #include "bins/weightgrid.h"
-#include "mergewatch.h"
+#include "hosts/mcbin/input/mergewatch.h"
 
 #include <mcobnqrt/ibinrecordsource.h>
 #include <mcobnqrt/mccommon.h>

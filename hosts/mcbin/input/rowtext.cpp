@@ -1,4 +1,4 @@
-#include "rowtext.h"
+#include "hosts/mcbin/input/rowtext.h"
 
 namespace
 {

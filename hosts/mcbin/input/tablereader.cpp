@@ -1,7 +1,7 @@
-#include "tablereader.h"
+#include "hosts/mcbin/input/tablereader.h"
 
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <algorithm>
 #include <utility>

@@ -1,8 +1,8 @@
 #ifndef MCBIN_TABLEREADER_H
 #define MCBIN_TABLEREADER_H
 
-#include "csvreader.h"
-#include "failure.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/csvreader.h"
 
 #include <cstddef>
 #include <string>

@@ -1,10 +1,10 @@
-#include "variables.h"
+#include "hosts/mcbin/input/variables.h"
 
 #include "bins/infinitevalues.h"
-#include "columnplan.h"
-#include "failure.h"
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <mcobnqrt/ibinvariable.h>
 

@@ -1,11 +1,11 @@
-#include "bintable.h"
+#include "hosts/mcbin/output/bintable.h"
 
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
-#include "sharebar.h"
-#include "text.h"
-#include "utf8.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/output/sharebar.h"
+#include "hosts/mcbin/text.h"
+#include "hosts/mcbin/utf8.h"
 
 #include <fmt/format.h>
 

@@ -1,7 +1,7 @@
 #ifndef MCBIN_BINTABLE_H
 #define MCBIN_BINTABLE_H
 
-#include "tableoutput.h"
+#include "hosts/mcbin/output/tableoutput.h"
 
 #include <iosfwd>
 

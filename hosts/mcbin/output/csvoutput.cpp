@@ -1,9 +1,9 @@
-#include "csvoutput.h"
+#include "hosts/mcbin/output/csvoutput.h"
 
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <csv.h>
 

@@ -1,12 +1,12 @@
-#include "htmlreport.h"
+#include "hosts/mcbin/output/htmlreport.h"
 
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
-#include "pagestyle.h"
-#include "statuswords.h"
-#include "svgchart.h"
-#include "text.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/output/pagestyle.h"
+#include "hosts/mcbin/output/svgchart.h"
+#include "hosts/mcbin/statuswords.h"
+#include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
 

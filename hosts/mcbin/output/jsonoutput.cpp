@@ -1,8 +1,8 @@
-#include "jsonoutput.h"
+#include "hosts/mcbin/output/jsonoutput.h"
 
-#include "findings.h"
-#include "numbers.h"
-#include "statuswords.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/statuswords.h"
 
 #include <nlohmann/json.hpp>
 

@@ -1,7 +1,7 @@
-#include "outputfile.h"
+#include "hosts/mcbin/output/outputfile.h"
 
-#include "failure.h"
-#include "interrupt.h"
+#include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/interrupt.h"
 
 #include <cerrno>
 #include <cstring>

@@ -1,8 +1,8 @@
-#include "sharebar.h"
+#include "hosts/mcbin/output/sharebar.h"
 
-#include "figures.h"
-#include "findings.h"
-#include "text.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/text.h"
 
 #include <algorithm>
 #include <array>

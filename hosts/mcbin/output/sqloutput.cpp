@@ -1,9 +1,9 @@
-#include "sqloutput.h"
+#include "hosts/mcbin/output/sqloutput.h"
 
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <cmath>
 #include <limits>

@@ -1,9 +1,9 @@
-#include "svgchart.h"
+#include "hosts/mcbin/output/svgchart.h"
 
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
-#include "text.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
 

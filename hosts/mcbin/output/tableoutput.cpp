@@ -1,12 +1,12 @@
-#include "tableoutput.h"
+#include "hosts/mcbin/output/tableoutput.h"
 
-#include "bintable.h"
-#include "figures.h"
-#include "findings.h"
-#include "numbers.h"
-#include "statuswords.h"
-#include "text.h"
-#include "utf8.h"
+#include "hosts/mcbin/figures.h"
+#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/numbers.h"
+#include "hosts/mcbin/output/bintable.h"
+#include "hosts/mcbin/statuswords.h"
+#include "hosts/mcbin/text.h"
+#include "hosts/mcbin/utf8.h"
 
 #include <fmt/format.h>
 

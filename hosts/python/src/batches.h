@@ -1,7 +1,7 @@
 #ifndef MCBINNING_BATCHES_H
 #define MCBINNING_BATCHES_H
 
-#include "arrowabi.h"
+#include "hosts/python/src/arrowabi.h"
 
 #include <cstdint>
 

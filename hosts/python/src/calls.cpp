@@ -1,4 +1,4 @@
-#include "calls.h"
+#include "hosts/python/src/calls.h"
 
 #include <mcobnqrt/progressreport.h>
 

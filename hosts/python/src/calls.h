@@ -1,7 +1,7 @@
 #ifndef MCBINNING_CALLS_H
 #define MCBINNING_CALLS_H
 
-#include "blocks.h"
+#include "hosts/python/src/blocks.h"
 
 #include <mcobnqrt/ibinrecordsource.h>
 #include <mcobnqrt/mccommon.h>

@@ -1,6 +1,6 @@
-#include "capsules.h"
+#include "hosts/python/src/capsules.h"
 
-#include "faults.h"
+#include "hosts/python/src/faults.h"
 
 #include <nanobind/stl/string.h>
 

@@ -1,7 +1,7 @@
 #ifndef MCBINNING_CAPSULES_H
 #define MCBINNING_CAPSULES_H
 
-#include "batches.h"
+#include "hosts/python/src/batches.h"
 
 #include <nanobind/nanobind.h>
 

@@ -1,6 +1,6 @@
-#include "columnreader.h"
+#include "hosts/python/src/columnreader.h"
 
-#include "faults.h"
+#include "hosts/python/src/faults.h"
 
 #include <mcobnqrt/mccommon.h>
 

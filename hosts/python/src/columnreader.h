@@ -1,7 +1,7 @@
 #ifndef MCBINNING_COLUMNREADER_H
 #define MCBINNING_COLUMNREADER_H
 
-#include "columntype.h"
+#include "hosts/python/src/columntype.h"
 
 #include <mcobnqrt/mccommon.h>
 

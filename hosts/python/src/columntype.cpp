@@ -1,4 +1,4 @@
-#include "columntype.h"
+#include "hosts/python/src/columntype.h"
 
 #include <charconv>
 #include <cmath>

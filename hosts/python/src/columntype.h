@@ -1,7 +1,7 @@
 #ifndef MCBINNING_COLUMNTYPE_H
 #define MCBINNING_COLUMNTYPE_H
 
-#include "arrowabi.h"
+#include "hosts/python/src/arrowabi.h"
 
 #include <string>
 

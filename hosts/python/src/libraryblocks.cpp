@@ -1,4 +1,4 @@
-#include "libraryblocks.h"
+#include "hosts/python/src/libraryblocks.h"
 
 #include <mcobnqrt/mccommon.h>
 

@@ -3,8 +3,8 @@
 
 #include "bins/infinitevalues.h"
 #include "bins/weightgrid.h"
-#include "blocks.h"
-#include "variable.h"
+#include "hosts/python/src/blocks.h"
+#include "hosts/python/src/variable.h"
 
 #include <cstddef>
 #include <cstdint>

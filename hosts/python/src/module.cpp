@@ -1,13 +1,13 @@
 // The module mcbinning._core: what the Python code of the package needs of the library, in Python's types and no more.
 
-#include "batches.h"
-#include "calls.h"
-#include "capsules.h"
-#include "faults.h"
-#include "libraryblocks.h"
-#include "runs.h"
-#include "spool.h"
-#include "tableblocks.h"
+#include "hosts/python/src/batches.h"
+#include "hosts/python/src/calls.h"
+#include "hosts/python/src/capsules.h"
+#include "hosts/python/src/faults.h"
+#include "hosts/python/src/libraryblocks.h"
+#include "hosts/python/src/runs.h"
+#include "hosts/python/src/spool.h"
+#include "hosts/python/src/tableblocks.h"
 
 #include "bins/tempdirectory.h"
 

@@ -1,4 +1,4 @@
-#include "runs.h"
+#include "hosts/python/src/runs.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 

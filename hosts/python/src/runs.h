@@ -1,9 +1,9 @@
 #ifndef MCBINNING_RUNS_H
 #define MCBINNING_RUNS_H
 
-#include "blocks.h"
-#include "calls.h"
-#include "variable.h"
+#include "hosts/python/src/blocks.h"
+#include "hosts/python/src/calls.h"
+#include "hosts/python/src/variable.h"
 
 #include <mcobnqrt/binattributeresults.h>
 #include <mcobnqrt/binattributetargetresults.h>

@@ -1,4 +1,4 @@
-#include "spool.h"
+#include "hosts/python/src/spool.h"
 
 #include <cerrno>
 #include <cstdlib>

@@ -1,8 +1,8 @@
 #ifndef MCBINNING_SPOOL_H
 #define MCBINNING_SPOOL_H
 
-#include "blocks.h"
-#include "variable.h"
+#include "hosts/python/src/blocks.h"
+#include "hosts/python/src/variable.h"
 
 #include <cstdio>
 #include <memory>

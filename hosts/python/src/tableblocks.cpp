@@ -1,6 +1,6 @@
-#include "tableblocks.h"
+#include "hosts/python/src/tableblocks.h"
 
-#include "faults.h"
+#include "hosts/python/src/faults.h"
 
 #include <mcobnqrt/mccommon.h>
 

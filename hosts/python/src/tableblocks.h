@@ -1,10 +1,10 @@
 #ifndef MCBINNING_TABLEBLOCKS_H
 #define MCBINNING_TABLEBLOCKS_H
 
-#include "batches.h"
-#include "blocks.h"
-#include "columntype.h"
-#include "variable.h"
+#include "hosts/python/src/batches.h"
+#include "hosts/python/src/blocks.h"
+#include "hosts/python/src/columntype.h"
+#include "hosts/python/src/variable.h"
 
 #include <cstddef>
 #include <cstdint>

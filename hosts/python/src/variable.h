@@ -2,8 +2,8 @@
 #define MCBINNING_VARIABLE_H
 
 #include "bins/weightgrid.h"
-#include "categorytable.h"
-#include "columnreader.h"
+#include "hosts/python/src/categorytable.h"
+#include "hosts/python/src/columnreader.h"
 
 #include <mcobnqrt/binnumericusermissing.h>
 #include <mcobnqrt/binstringusermissing.h>

@@ -1,5 +1,5 @@
-#include "support/tempdir.h"
-#include "workloads.h"
+#include "bench/workloads.h"
+#include "tests/support/tempdir.h"
 
 #include <cstdio>
 #include <cstdlib>

@@ -1,5 +1,5 @@
 #include "binning/celltable.h"
-#include "support/runs.h"
+#include "tests/support/runs.h"
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,6 @@
 #include "data/binattributereader.h"
 #include "data/tally.h"
-#include "support/testpreparator.h"
+#include "tests/support/testpreparator.h"
 
 #include <gtest/gtest.h>
 

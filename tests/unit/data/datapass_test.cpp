@@ -1,4 +1,4 @@
-#include "support/testpreparator.h"
+#include "tests/support/testpreparator.h"
 
 #include <gtest/gtest.h>
 

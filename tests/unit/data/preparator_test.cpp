@@ -1,5 +1,5 @@
 #include "metadata/recordlayout.h"
-#include "support/testpreparator.h"
+#include "tests/support/testpreparator.h"
 
 #include <gtest/gtest.h>
 

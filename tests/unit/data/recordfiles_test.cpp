@@ -1,8 +1,8 @@
 #include "data/binaryrecorditerator.h"
 #include "data/binrecordbuffer.h"
 #include "data/recordfiles.h"
-#include "support/groupeddigits.h"
-#include "support/testpreparator.h"
+#include "tests/support/groupeddigits.h"
+#include "tests/support/testpreparator.h"
 
 #include <gtest/gtest.h>
 

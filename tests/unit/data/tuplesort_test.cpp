@@ -1,5 +1,5 @@
 #include "data/tuplesort.h"
-#include "support/hostdata.h"
+#include "tests/support/hostdata.h"
 
 #include <gtest/gtest.h>
 

@@ -2,7 +2,7 @@
 #include <mcobnqrt/efbinsettings.h>
 
 #include "platform/platform.h"
-#include "support/tempdir.h"
+#include "tests/support/tempdir.h"
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
 #include "metadata/recordlayout.h"
-#include "support/hostdata.h"
+#include "tests/support/hostdata.h"
 
 #include <mcobnqrt/bincatnumencoder.h>
 #include <mcobnqrt/bincontvar.h>
