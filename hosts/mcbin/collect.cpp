@@ -1,12 +1,12 @@
 #include "hosts/mcbin/collect.h"
 
 #include "bins/infinitevalues.h"
+#include "bins/numbers.h"
 #include "bins/weightgrid.h"
 #include "hosts/mcbin/figures.h"
 #include "hosts/mcbin/findings.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/variables.h"
-#include "hosts/mcbin/numbers.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 

@@ -1,7 +1,7 @@
 #include "hosts/mcbin/commandline.h"
 
+#include "bins/numbers.h"
 #include "hosts/mcbin/input/delimiter.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/text.h"
 
 #include "bins/tempdirectory.h"

@@ -1,7 +1,7 @@
 #include "hosts/mcbin/figures.h"
 
+#include "bins/numbers.h"
 #include "hosts/mcbin/findings.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/text.h"
 
 #include <algorithm>

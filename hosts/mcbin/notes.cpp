@@ -1,10 +1,10 @@
 #include "hosts/mcbin/notes.h"
 
+#include "bins/numbers.h"
 #include "hosts/mcbin/findings.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/recordsource.h"
 #include "hosts/mcbin/input/variables.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>

@@ -1,9 +1,9 @@
 #include "hosts/mcbin/progress.h"
 
+#include "bins/utf8.h"
 #include "hosts/mcbin/interrupt.h"
 #include "hosts/mcbin/terminal.h"
 #include "hosts/mcbin/text.h"
-#include "hosts/mcbin/utf8.h"
 
 #include <mcobnqrt/progressreport.h>
 

@@ -1,5 +1,6 @@
 #include "hosts/mcbin/run.h"
 
+#include "bins/words.h"
 #include "hosts/mcbin/collect.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/columnplan.h"
@@ -9,7 +10,6 @@
 #include "hosts/mcbin/interrupt.h"
 #include "hosts/mcbin/notes.h"
 #include "hosts/mcbin/progress.h"
-#include "hosts/mcbin/statuswords.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 

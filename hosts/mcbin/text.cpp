@@ -1,36 +1,13 @@
 #include "hosts/mcbin/text.h"
 
-#include "hosts/mcbin/utf8.h"
-
-#include <fmt/format.h>
+#include "bins/utf8.h"
 
 #include <algorithm>
-#include <cstdint>
 
 #include <fnmatch.h>
 
 namespace
 {
-
-/// Those of ASCII, and those of Latin-1, which some terminals obey as well.
-bool IsControl(char32_t value)
-{
-    return value < 0x20 || (value >= 0x7F && value < 0xA0);
-}
-
-/// What sets the direction of writing, so that a text can be shown as another one, and the ends of lines and paragraphs
-/// beyond Latin-1.
-bool IsFormat(char32_t value)
-{
-    return value == 0x061C || value == 0x200E || value == 0x200F || (value >= 0x2028 && value <= 0x202E) ||
-           (value >= 0x2066 && value <= 0x2069);
-}
-
-/// A byte that is no text, or a control character of ASCII, is "\x0a", any other character "\u202e".
-void AppendEscaped(std::string& text, const CodePoint& point)
-{
-    text += fmt::format(point.size > 1 ? "\\u{:04x}" : "\\x{:02x}", static_cast<std::uint32_t>(point.value));
-}
 
 std::string MakePadding(const std::string& text, std::size_t width)
 {
@@ -38,27 +15,6 @@ std::string MakePadding(const std::string& text, std::size_t width)
 }
 
 } // namespace
-
-std::string Printable(std::string_view text)
-{
-    std::string printable;
-    while (!text.empty())
-    {
-        const CodePoint point = GetFirst(text);
-        const std::string_view bytes = text.substr(0, point.size);
-        text.remove_prefix(point.size);
-        if (point.isValid && !IsControl(point.value) && !IsFormat(point.value))
-            printable += bytes;
-        else
-            AppendEscaped(printable, point);
-    }
-    return printable;
-}
-
-std::string Quote(std::string_view text)
-{
-    return "'" + Printable(text) + "'";
-}
 
 std::string EscapeHtml(std::string_view text)
 {
@@ -83,12 +39,6 @@ std::string EscapeHtml(std::string_view text)
     return escaped;
 }
 
-std::string Shorten(std::string_view text, std::size_t width)
-{
-    const std::string_view beginning = Clip(text, width);
-    return std::string(beginning) + (beginning.size() < text.size() ? "..." : "");
-}
-
 std::string PadLeft(const std::string& text, std::size_t width)
 {
     return MakePadding(text, width) + text;
@@ -97,18 +47,6 @@ std::string PadLeft(const std::string& text, std::size_t width)
 std::string PadRight(const std::string& text, std::size_t width)
 {
     return text + MakePadding(text, width);
-}
-
-std::string Join(const std::vector<std::string>& parts, std::string_view separator)
-{
-    std::string joined;
-    for (const std::string& part : parts)
-    {
-        if (&part != &parts.front())
-            joined += separator;
-        joined += part;
-    }
-    return joined;
 }
 
 std::vector<std::string> Split(std::string_view text, char separator)

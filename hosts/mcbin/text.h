@@ -1,29 +1,19 @@
 #ifndef MCBIN_TEXT_H
 #define MCBIN_TEXT_H
 
+#include "bins/text.h"
+
 #include <cstddef>
 #include <string>
 #include <string_view>
 #include <vector>
 
-/// Text of the data made fit for a terminal line: control characters, such as line ends, what sets the direction of
-/// writing, and bytes that are no UTF-8 become escapes like "\x0a" and "\u202e".
-std::string Printable(std::string_view text);
-
-/// Printable text in single quotes, for a message.
-std::string Quote(std::string_view text);
-
 /// Printable text escaped for a page in HTML, also within an attribute in double quotes.
 std::string EscapeHtml(std::string_view text);
-
-/// The beginning of a text that is wider than `width` columns, with "..." behind it.
-std::string Shorten(std::string_view text, std::size_t width = 30);
 
 /// The text with spaces in front of it, or behind it, until it is `width` wide.
 std::string PadLeft(const std::string& text, std::size_t width);
 std::string PadRight(const std::string& text, std::size_t width);
-
-std::string Join(const std::vector<std::string>& parts, std::string_view separator);
 
 std::vector<std::string> Split(std::string_view text, char separator);
 

@@ -104,7 +104,7 @@ def test_the_command_line_tool_applies_what_the_package_wrote(mcbin, tmp_path):
 
 
 def test_status_words_are_those_of_the_command_line_tool():
-    source = (ROOT / "hosts/mcbin/statuswords.cpp").read_text()
+    source = (ROOT / "bins/words.cpp").read_text()
     codes = (ROOT / "include/mcobnqrt/mcstatus.h").read_text()
     numbers = {name: int(number) for name, number in re.findall(r"(BINStatus\w+) = (\d+)", codes)}
     cases = re.findall(r"case MCBinning::(BINStatus\w+):\s*return ((?:\"[^\"]*\"\s*)+);", source)

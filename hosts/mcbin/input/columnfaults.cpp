@@ -1,8 +1,8 @@
 #include "hosts/mcbin/input/columnfaults.h"
 
+#include "bins/numbers.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/tablereader.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>

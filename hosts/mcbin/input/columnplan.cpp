@@ -1,11 +1,11 @@
 #include "hosts/mcbin/input/columnplan.h"
 
+#include "bins/numbers.h"
+#include "bins/utf8.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/tablereader.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/options.h"
 #include "hosts/mcbin/text.h"
-#include "hosts/mcbin/utf8.h"
 
 #include <algorithm>
 #include <cmath>

@@ -1,8 +1,8 @@
 #include "hosts/mcbin/input/jsoninput.h"
 
+#include "bins/numbers.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/inputfile.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/output/jsonoutput.h"
 #include "hosts/mcbin/text.h"
 

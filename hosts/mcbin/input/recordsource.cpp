@@ -1,10 +1,10 @@
 #include "hosts/mcbin/input/recordsource.h"
 
+#include "bins/numbers.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/tableprofile.h"
 #include "hosts/mcbin/input/tablereader.h"
 #include "hosts/mcbin/input/variables.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/progress.h"
 
 #include <mcobnqrt/binstringencoder.h>

@@ -1,12 +1,12 @@
 #include "hosts/mcbin/input/tableprofile.h"
 
+#include "bins/numbers.h"
+#include "bins/utf8.h"
 #include "hosts/mcbin/input/columnfaults.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/tablereader.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/progress.h"
 #include "hosts/mcbin/text.h"
-#include "hosts/mcbin/utf8.h"
 
 #include <fmt/format.h>
 

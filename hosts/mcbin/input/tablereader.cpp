@@ -1,6 +1,6 @@
 #include "hosts/mcbin/input/tablereader.h"
 
-#include "hosts/mcbin/numbers.h"
+#include "bins/numbers.h"
 #include "hosts/mcbin/text.h"
 
 #include <algorithm>

@@ -1,9 +1,9 @@
 #include "hosts/mcbin/input/variables.h"
 
 #include "bins/infinitevalues.h"
+#include "bins/numbers.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/columnplan.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/text.h"
 
 #include <mcobnqrt/ibinvariable.h>

@@ -1,11 +1,11 @@
 #include "hosts/mcbin/output/bintable.h"
 
+#include "bins/numbers.h"
+#include "bins/utf8.h"
 #include "hosts/mcbin/figures.h"
 #include "hosts/mcbin/findings.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/output/sharebar.h"
 #include "hosts/mcbin/text.h"
-#include "hosts/mcbin/utf8.h"
 
 #include <fmt/format.h>
 

@@ -1,11 +1,11 @@
 #include "hosts/mcbin/output/htmlreport.h"
 
+#include "bins/numbers.h"
+#include "bins/words.h"
 #include "hosts/mcbin/figures.h"
 #include "hosts/mcbin/findings.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/output/pagestyle.h"
 #include "hosts/mcbin/output/svgchart.h"
-#include "hosts/mcbin/statuswords.h"
 #include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>

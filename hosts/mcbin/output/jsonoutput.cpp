@@ -1,8 +1,8 @@
 #include "hosts/mcbin/output/jsonoutput.h"
 
+#include "bins/numbers.h"
+#include "bins/words.h"
 #include "hosts/mcbin/findings.h"
-#include "hosts/mcbin/numbers.h"
-#include "hosts/mcbin/statuswords.h"
 
 #include <nlohmann/json.hpp>
 

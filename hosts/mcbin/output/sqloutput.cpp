@@ -1,8 +1,8 @@
 #include "hosts/mcbin/output/sqloutput.h"
 
+#include "bins/numbers.h"
 #include "hosts/mcbin/figures.h"
 #include "hosts/mcbin/findings.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/text.h"
 
 #include <cmath>

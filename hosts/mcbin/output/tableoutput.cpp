@@ -1,12 +1,12 @@
 #include "hosts/mcbin/output/tableoutput.h"
 
+#include "bins/numbers.h"
+#include "bins/utf8.h"
+#include "bins/words.h"
 #include "hosts/mcbin/figures.h"
 #include "hosts/mcbin/findings.h"
-#include "hosts/mcbin/numbers.h"
 #include "hosts/mcbin/output/bintable.h"
-#include "hosts/mcbin/statuswords.h"
 #include "hosts/mcbin/text.h"
-#include "hosts/mcbin/utf8.h"
 
 #include <fmt/format.h>
 

@@ -1,4 +1,4 @@
-#include "hosts/mcbin/utf8.h"
+#include "bins/utf8.h"
 
 #include <array>
 

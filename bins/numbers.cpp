@@ -1,15 +1,26 @@
-#include "hosts/mcbin/numbers.h"
-
-#include <fmt/format.h>
+#include "bins/numbers.h"
 
 #include <array>
 #include <charconv>
 #include <cmath>
-#include <cstdlib>
 #include <limits>
+#include <locale>
+#include <sstream>
 
 namespace
 {
+
+constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
+
+/// The number, or a NaN if it is too large for a double. from_chars doesn't tell that from one that is too small for it.
+double ParseOutOfRange(std::string_view text)
+{
+    std::istringstream stream{std::string(text)};
+    stream.imbue(std::locale::classic());
+    double value = 0.0;
+    stream >> value;
+    return stream.fail() ? kNaN : value;
+}
 
 /// The number, or a NaN, of what from_chars doesn't take as it is.
 double ParseUnusualNumber(std::string_view text)
@@ -23,12 +34,19 @@ double ParseUnusualNumber(std::string_view text)
     double value = 0.0;
     const char* const end = text.data() + text.size();
     const std::from_chars_result result = std::from_chars(text.data(), end, value);
-    // Too large a number and too small a one are the same to from_chars.
-    if (result.ec == std::errc::result_out_of_range)
-        value = std::strtod(std::string(text).c_str(), nullptr);
-    const bool isTooLarge = result.ec == std::errc::result_out_of_range && std::isinf(value);
-    const bool isNumber = result.ec != std::errc::invalid_argument && result.ptr == end && !isTooLarge;
-    return isNumber ? value : std::numeric_limits<double>::quiet_NaN();
+    const bool isNumber = result.ec != std::errc::invalid_argument && result.ptr == end;
+    if (!isNumber)
+        return kNaN;
+    return result.ec == std::errc::result_out_of_range ? ParseOutOfRange(text) : value;
+}
+
+/// What to_chars writes, with further arguments for it.
+template<class... Arguments>
+std::string ToText(double value, Arguments... arguments)
+{
+    std::array<char, 400> text; // the largest double has 309 digits
+    const std::to_chars_result result = std::to_chars(text.data(), text.data() + text.size(), value, arguments...);
+    return std::string(text.data(), result.ptr);
 }
 
 } // namespace
@@ -68,11 +86,7 @@ std::string FormatNumber(double value)
     // Left to itself, to_chars writes 100000 as 1e+05, being the shorter one by a character.
     const double size = std::fabs(value);
     const bool isPlain = size == 0.0 || (size >= 1e-5 && size < 1e15);
-    std::array<char, 32> text;
-    const std::to_chars_result result =
-        isPlain ? std::to_chars(text.data(), text.data() + text.size(), value, std::chars_format::fixed)
-                : std::to_chars(text.data(), text.data() + text.size(), value);
-    return std::string(text.data(), result.ptr);
+    return isPlain ? ToText(value, std::chars_format::fixed) : ToText(value);
 }
 
 std::string FormatFigure(const std::optional<double>& figure)
@@ -85,5 +99,6 @@ std::string FormatWeight(double value)
     constexpr double kSixDigits = 1e6;
     if (value == std::floor(value))
         return FormatNumber(value);
-    return std::fabs(value) < kSixDigits ? fmt::format("{:.6g}", value) : fmt::format("{:.0f}", value);
+    return std::fabs(value) < kSixDigits ? ToText(value, std::chars_format::general, 6)
+                                         : ToText(value, std::chars_format::fixed, 0);
 }

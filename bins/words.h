@@ -1,5 +1,5 @@
-#ifndef MCBIN_STATUSWORDS_H
-#define MCBIN_STATUSWORDS_H
+#ifndef MCOBNQRT_BINS_WORDS_H
+#define MCOBNQRT_BINS_WORDS_H
 
 #include <string>
 

@@ -1,5 +1,5 @@
-#ifndef MCBIN_UTF8_H
-#define MCBIN_UTF8_H
+#ifndef MCOBNQRT_BINS_UTF8_H
+#define MCOBNQRT_BINS_UTF8_H
 
 #include <cstddef>
 #include <string_view>

@@ -1,5 +1,5 @@
-#ifndef MCBIN_NUMBERS_H
-#define MCBIN_NUMBERS_H
+#ifndef MCOBNQRT_BINS_NUMBERS_H
+#define MCOBNQRT_BINS_NUMBERS_H
 
 #include <optional>
 #include <string>
@@ -11,8 +11,8 @@
 /// too large for a double; "nan".
 std::optional<double> ParseNumber(std::string_view text);
 
-/// As ParseNumber, but returns NaN where there is no number. It is for millions of fields: an optional is stored in two parts and loaded as a
-/// whole, for which the processor waits half as long as it takes to read the number.
+/// As ParseNumber, but returns NaN where there is no number. It is for millions of fields: an optional is stored in two
+/// parts and loaded as a whole, for which the processor waits half as long as it takes to read the number.
 double ParseNumberOrNaN(std::string_view text);
 
 /// What keeps the text from being a number: those of the comma, $ and % that it has, each once, if it is a number

@@ -1,4 +1,4 @@
-#include "hosts/mcbin/statuswords.h"
+#include "bins/words.h"
 
 #include <mcobnqrt/mcstatus.h>
 
@@ -56,7 +56,7 @@ const char* GetWords(MCBinning::BINStatusCode code)
     case MCBinning::BINStatusCannotOpenTempFile:
         return "a temporary file cannot be opened, written or read; the disk may be full";
     }
-    return "a status that this tool does not know";
+    return "a status that this release does not know";
 }
 
 } // namespace

@@ -1,0 +1,54 @@
+#include "bins/binner.h"
+
+#include "bins/lookup.h"
+#include "bins/numbers.h"
+
+#include <algorithm>
+
+Binner::Binner(const AttributeBins& bins, const std::vector<std::string>& missingTexts)
+    : fBins(bins), fMissingTexts(missingTexts)
+{
+    const Variable& variable = *bins.attribute;
+    fMissingTexts.insert(fMissingTexts.end(), variable.missingTexts.begin(), variable.missingTexts.end());
+    fMissingNumbers = variable.missingNumbers;
+    for (const std::string& text : fMissingTexts)
+    {
+        if (const std::optional<double> number = ParseNumber(text))
+            fMissingNumbers.push_back(*number);
+    }
+    for (std::size_t code = 0; code < variable.categories.size(); ++code)
+        fBinsByCategory.emplace(variable.categories[code],
+                                FindBin(bins.cutPoints, bins.isRightClosed, static_cast<double>(code)));
+}
+
+Binner::Found Binner::Find(std::string_view field)
+{
+    if (field.empty() || std::find(fMissingTexts.begin(), fMissingTexts.end(), field) != fMissingTexts.end())
+        return {};
+    if (fBins.attribute->kind == VariableKind::kStringCategorical)
+        return FindCategory(field);
+    const std::optional<double> value = ParseNumber(field);
+    if (!value)
+        return {std::nullopt, true};
+    if (IsMissing(*value))
+        return {};
+    if (fBins.attribute->kind == VariableKind::kNumericCategorical)
+        return FindCategory(FormatNumber(*value)); // "1.0" is the category 1
+    return {FindBin(fBins.cutPoints, fBins.isRightClosed, *value), false};
+}
+
+bool Binner::IsMissing(double value) const
+{
+    const auto& interval = fBins.attribute->missingInterval;
+    return std::find(fMissingNumbers.begin(), fMissingNumbers.end(), value) != fMissingNumbers.end() ||
+           (interval && value >= interval->first && value <= interval->second);
+}
+
+Binner::Found Binner::FindCategory(std::string_view field)
+{
+    fKey = field;
+    const auto found = fBinsByCategory.find(fKey);
+    if (found == fBinsByCategory.end())
+        return {std::nullopt, true};
+    return {found->second, false};
+}

@@ -1,0 +1,127 @@
+#ifndef MCOBNQRT_BINS_BINS_H
+#define MCOBNQRT_BINS_BINS_H
+
+#include "bins/weightgrid.h"
+
+#include <mcobnqrt/mcstatus.h>
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+// Bins as plain values, whatever made them: a run of the library, or a file that an earlier run has written. Every form
+// of output, in every host, is made from these.
+
+enum class VariableKind
+{
+    kContinuous,
+    kStringCategorical,
+    kNumericCategorical,
+    kWeight
+};
+
+enum class VariableRole
+{
+    kAttribute,
+    kTarget,
+    kWeight
+};
+
+/// What the numbers of a variable stand for.
+enum class ValueKind
+{
+    kNumber,
+    kBoolean,  ///< 0 and 1
+    kDate,     ///< days since 1970-01-01
+    kTimestamp ///< microseconds since 1970-01-01 00:00 UTC
+};
+
+/// A column of the analysis.
+struct Variable
+{
+    std::string name;
+    std::string label;
+    VariableKind kind = VariableKind::kContinuous;
+    VariableRole role = VariableRole::kAttribute;
+    ValueKind valueKind = ValueKind::kNumber;
+    std::string timeZone;                ///< of a timestamp: the zone that it is shown in; empty without one
+    std::vector<std::string> categories; ///< by code; of a numeric-categorical variable as FormatNumber writes them
+    WeightRounding rounding = WeightRounding::kNone; ///< of a weight
+    std::optional<double> weightGrid; ///< of a weight: of what its values were made multiples, if one had to move
+    std::vector<std::string>
+        missingTexts; ///< of a string-categorical variable all; of others those that are no numbers
+    std::vector<double> missingNumbers;
+    std::optional<std::pair<double, double>> missingInterval; ///< both ends included; infinite ends are infinities
+
+    bool IsCategorical() const
+    {
+        return kind == VariableKind::kStringCategorical || kind == VariableKind::kNumericCategorical;
+    }
+};
+
+struct Bin
+{
+    double left = 0.0;  ///< -infinity in the first bin
+    double right = 0.0; ///< +infinity in the last bin
+    double weight = 0.0;
+    std::vector<double> weights; ///< by category of the target; empty without a target
+};
+
+/// The bins of one attribute, against one target or none. It stands alone: whatever is said about it needs nothing else.
+struct AttributeBins
+{
+    std::shared_ptr<const Variable> attribute; ///< never null
+    std::shared_ptr<const Variable> target;    ///< null without one
+    bool isRightClosed = true;                 ///< a bin is (left, right], otherwise [left, right)
+    MCBinning::MCStatus status;
+    std::int64_t numDistinct = 0;   ///< different valid values
+    double weight = 0.0;            ///< of the records with a valid value, and a valid target if there is one
+    double weightWithMissing = 0.0; ///< of all records
+    std::optional<double> minimum;  ///< of the valid values; nothing where there is none, as with an error
+    std::optional<double> maximum;
+    std::optional<double> modelEntropy; ///< of the target within the bins, in bits; nothing where there are no bins
+    std::vector<double> cutPoints;      ///< ascending; of a categorical attribute between codes
+    /// The cut points as people read them, where a host knows better than FormatValue(): of timestamps that are shown in a
+    /// time zone. Otherwise empty. It is not part of the form in JSON.
+    std::vector<std::string> borderTexts;
+    std::vector<Bin> bins; ///< one more than cut points, or none where nothing was binned
+
+    bool HasBins() const { return !bins.empty(); }
+};
+
+enum class Method
+{
+    kSupervised,
+    kEqualFrequency
+};
+
+/// How bins were asked for.
+struct Settings
+{
+    Method method = Method::kSupervised;
+    bool isRightClosed = true;
+    int numBins = 0; ///< of equal frequency; in a supervised run of pre-bins
+    std::optional<int>
+        maxDistinct; ///< supervised: an attribute with more distinct values is pre-binned; nothing: never
+    std::optional<double> smallBinRatio; ///< supervised: the ratio to the lighter neighbour below which a bin is merged
+};
+
+/// The bins of all attributes of a run.
+struct Bins
+{
+    std::string componentVersion;
+    Settings settings;
+    std::optional<std::string> dataName;
+    std::optional<std::int64_t> numRecords;              ///< read, whatever their weight
+    std::optional<std::int64_t> numRecordsWithoutWeight; ///< they count nowhere; nothing without a weight
+    std::vector<std::string> missingTexts;               ///< of all columns of a text file
+    std::vector<std::shared_ptr<const Variable>> variables;
+    MCBinning::MCStatus status;
+    std::vector<AttributeBins> results; ///< in the order in which they were binned
+};
+
+#endif

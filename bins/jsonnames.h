@@ -1,0 +1,41 @@
+#ifndef MCOBNQRT_BINS_JSONNAMES_H
+#define MCOBNQRT_BINS_JSONNAMES_H
+
+#include "bins/bins.h"
+
+#include <utility>
+
+// What the values that are told by name are called in JSON.
+
+template<class Value, std::size_t kSize>
+using Names = std::pair<const char*, Value>[kSize];
+
+inline constexpr Names<Method, 2> kMethodNames = {{"supervised", Method::kSupervised},
+                                                  {"equal-frequency", Method::kEqualFrequency}};
+
+inline constexpr Names<bool, 2> kClosedNames = {{"right", true}, {"left", false}};
+
+inline constexpr Names<VariableKind, 4> kKindNames = {{"continuous", VariableKind::kContinuous},
+                                                      {"string-categorical", VariableKind::kStringCategorical},
+                                                      {"numeric-categorical", VariableKind::kNumericCategorical},
+                                                      {"weight", VariableKind::kWeight}};
+
+inline constexpr Names<VariableRole, 3> kRoleNames = {
+    {"attribute", VariableRole::kAttribute}, {"target", VariableRole::kTarget}, {"weight", VariableRole::kWeight}};
+
+inline constexpr Names<ValueKind, 3> kValueKindNames = {
+    {"boolean", ValueKind::kBoolean}, {"date", ValueKind::kDate}, {"timestamp", ValueKind::kTimestamp}};
+
+/// The name of the value, or null if it has none.
+template<class Value, std::size_t kSize>
+const char* GetName(const std::pair<const char*, Value> (&names)[kSize], Value value)
+{
+    for (const auto& [name, named] : names)
+    {
+        if (named == value)
+            return name;
+    }
+    return nullptr;
+}
+
+#endif

@@ -1,0 +1,138 @@
+#include "bins/json.h"
+#include "bins/jsonnames.h"
+#include "bins/jsonvalue.h"
+#include "bins/measures.h"
+#include "bins/numbers.h"
+#include "bins/words.h"
+
+#include <cmath>
+
+namespace
+{
+
+using Array = JsonValue::Array;
+using Object = JsonValue::Object;
+
+/// A number as it stands in a list of categories or missing values.
+JsonValue ToValue(const std::string& number)
+{
+    return ParseNumberOrNaN(number);
+}
+
+JsonValue ToValue(const Settings& settings)
+{
+    return Object{{"closed", GetName(kClosedNames, settings.isRightClosed)},
+                  {"n_bins", settings.numBins},
+                  {"max_distinct", settings.maxDistinct},
+                  {"small_bin_ratio", settings.smallBinRatio}};
+}
+
+JsonValue ToValue(const MCBinning::MCStatus& status)
+{
+    Array discrete;
+    Array scale;
+    for (unsigned int slot = 0; slot < 3; ++slot)
+    {
+        discrete.emplace_back(std::int64_t{status.GetDiscreteDatum(slot)});
+        scale.emplace_back(status.GetScaleDatum(slot));
+    }
+    return Object{{"code", std::int64_t{status.GetErrorCode()}},
+                  {"severity", GetSeverity(status)},
+                  {"words", GetStatusWords(status)},
+                  {"discrete", discrete},
+                  {"scale", scale}};
+}
+
+JsonValue MakeCategories(const Variable& variable)
+{
+    if (!variable.IsCategorical())
+        return {};
+    if (variable.kind == VariableKind::kStringCategorical)
+        return variable.categories;
+    Array numbers;
+    for (const std::string& category : variable.categories) numbers.push_back(ToValue(category));
+    return numbers;
+}
+
+JsonValue MakeMissing(const Variable& variable)
+{
+    const bool areTexts = variable.kind == VariableKind::kStringCategorical;
+    JsonValue interval;
+    if (variable.missingInterval)
+        interval = Array{variable.missingInterval->first, variable.missingInterval->second};
+    return Object{{"values", areTexts ? JsonValue(variable.missingTexts) : JsonValue(variable.missingNumbers)},
+                  {"texts", areTexts ? JsonValue(Array()) : JsonValue(variable.missingTexts)},
+                  {"interval", interval}};
+}
+
+JsonValue ToValue(const Variable& variable)
+{
+    const bool isWeight = variable.role == VariableRole::kWeight;
+    const char* const valueKind = GetName(kValueKindNames, variable.valueKind);
+    return Object{{"name", variable.name},
+                  {"label", variable.label},
+                  {"kind", GetName(kKindNames, variable.kind)},
+                  {"role", GetName(kRoleNames, variable.role)},
+                  {"categories", MakeCategories(variable)},
+                  {"rounding", isWeight ? JsonValue(GetName(variable.rounding)) : JsonValue()},
+                  {"grid", variable.weightGrid},
+                  {"missing", MakeMissing(variable)},
+                  {"value_kind", valueKind ? JsonValue(valueKind) : JsonValue()},
+                  {"time_zone", variable.timeZone}};
+}
+
+JsonValue ToValue(const Bin& bin, const AttributeBins& bins, const Evidence* evidence)
+{
+    const auto figure = [evidence](double Evidence::*member)
+    { return evidence ? JsonValue(evidence->*member) : JsonValue(); };
+    return Object{{"left", bin.left},
+                  {"right", bin.right},
+                  {"weight", bin.weight},
+                  {"weights", bins.target ? JsonValue(bin.weights) : JsonValue()},
+                  {"rate", figure(&Evidence::rate)},
+                  {"woe", figure(&Evidence::weightOfEvidence)},
+                  {"iv", figure(&Evidence::informationValue)}};
+}
+
+JsonValue ToValue(const AttributeBins& result)
+{
+    const std::vector<Evidence> evidence = ComputeEvidence(result);
+    Array bins;
+    for (std::size_t i = 0; i < result.bins.size(); ++i)
+        bins.push_back(ToValue(result.bins[i], result, evidence.empty() ? nullptr : &evidence[i]));
+    return Object{{"attribute", result.attribute->name},
+                  {"target", result.target ? JsonValue(result.target->name) : JsonValue()},
+                  {"status", ToValue(result.status)},
+                  {"distinct_values", result.numDistinct},
+                  {"weight", result.weight},
+                  {"weight_with_missing", result.weightWithMissing},
+                  {"minimum", result.minimum},
+                  {"maximum", result.maximum},
+                  {"target_entropy", ComputeTargetEntropy(result)},
+                  {"model_entropy", result.modelEntropy},
+                  {"information_value", ComputeInformationValue(result)},
+                  {"cut_points", result.cutPoints},
+                  {"bins", bins}};
+}
+
+} // namespace
+
+std::string ToJson(const Bins& bins)
+{
+    Array variables;
+    for (const auto& variable : bins.variables) variables.push_back(ToValue(*variable));
+    Array results;
+    for (const AttributeBins& result : bins.results) results.push_back(ToValue(result));
+    return WriteJson(Object{{"schema", kSchema},
+                            {"schema_version", kSchemaVersion},
+                            {"component_version", bins.componentVersion},
+                            {"method", GetName(kMethodNames, bins.settings.method)},
+                            {"settings", ToValue(bins.settings)},
+                            {"data", Object{{"name", bins.dataName},
+                                            {"records", bins.numRecords},
+                                            {"records_without_weight", bins.numRecordsWithoutWeight},
+                                            {"missing_text", bins.missingTexts}}},
+                            {"variables", variables},
+                            {"status", ToValue(bins.status)},
+                            {"results", results}});
+}

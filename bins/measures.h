@@ -1,0 +1,47 @@
+#ifndef MCOBNQRT_BINS_MEASURES_H
+#define MCOBNQRT_BINS_MEASURES_H
+
+#include "bins/bins.h"
+
+#include <optional>
+#include <vector>
+
+// What follows from the weights of the bins.
+
+/// Of a distribution with these weights, in bits, summed in their order; 0 if there is no weight.
+double ComputeEntropy(const std::vector<double>& weights);
+
+/// The weight of each category of the target over all bins, summed from the first bin on; empty without a target.
+std::vector<double> SumByCategory(const AttributeBins& bins);
+
+/// The entropy of the target over all bins, in bits. Nothing without a target or bins.
+std::optional<double> ComputeTargetEntropy(const AttributeBins& bins);
+
+/// By how many bits the bins lower the entropy of the target. Nothing where one of the two was not found.
+std::optional<double> ComputeGain(const AttributeBins& bins);
+
+/// `part` of `whole`; 0 if the whole is.
+double ComputeShare(double part, double whole);
+
+/// What a bin says about a target of two categories, the second of which is the event.
+struct Evidence
+{
+    /// The share of the bin's weight that has the event.
+    double rate;
+    /// The weight of evidence ln(p / q): p is the bin's share of all events, and q its share of all others. Infinite where
+    /// one of them is 0, and 0 where both are.
+    double weightOfEvidence;
+    /// (p - q) ln(p / q). The sum over the bins is the information value of the attribute.
+    double informationValue;
+};
+
+/// By bin; empty unless the target has two categories.
+std::vector<Evidence> ComputeEvidence(const AttributeBins& bins);
+
+/// Nothing unless the target has two categories, and there are bins.
+std::optional<double> ComputeInformationValue(const AttributeBins& bins);
+
+/// Results with the largest gain first, those of equal gain, or without one, in their order. Only those with cut points.
+std::vector<const AttributeBins*> SortByGain(const Bins& bins);
+
+#endif

@@ -1,0 +1,79 @@
+#include "bins/run.h"
+
+#include "bins/collect.h"
+
+#include <mcobnqrt/mcobnqrt.h>
+
+#include <memory>
+
+namespace
+{
+
+template<class LibrarySettings>
+LibrarySettings MakeSettings(const Settings& settings, const RunHost& host)
+{
+    LibrarySettings made;
+    made.SetNumberOfBins(settings.numBins);
+    made.SetRightBorderClosed(settings.isRightClosed);
+    made.SetCancelPointer(host.cancel);
+    made.SetProgressListener(host.listener);
+    if (host.numRecordsBetweenReports > 0)
+        made.SetNSkippedCasesReports(host.numRecordsBetweenReports);
+    if (!host.tempDirectory.empty())
+        made.SetTempDirName(host.tempDirectory);
+    return made;
+}
+
+/// Takes all that the algorithm has found in a run that ended with `status`.
+template<class LibraryResult, class Algorithm>
+void Collect(Bins& bins, const MCBinning::MCStatus& status, Algorithm& algorithm, const RunHost& host)
+{
+    bins.status = status;
+    bins.componentVersion = algorithm.GetVersionString();
+    std::vector<LibraryResult> results;
+    algorithm.GetOutput()->GetAllCutPoints(results); // its only refusal is that there are none
+    for (const LibraryResult& result : results) AddResult(bins, result, *host.values);
+}
+
+void RunSupervised(Bins& bins, BINVarList& variables, const std::vector<int>* attributes,
+                   const std::vector<int>* targets, const RunHost& host)
+{
+    auto settings = MakeSettings<BINSettings>(bins.settings, host);
+    settings.SetSmallBinDetectionThreshold(bins.settings.smallBinRatio.value_or(0.0));
+    if (bins.settings.maxDistinct)
+        settings.SetNumDistinctValueThreshold(*bins.settings.maxDistinct);
+    BINFactory factory;
+    const std::unique_ptr<IBINAlgorithm> algorithm(factory.CreateBINAlgorithm(settings, variables));
+    if (!algorithm)
+    {
+        bins.status = factory.GetStatus();
+        return;
+    }
+    const MCBinning::MCStatus status = algorithm->Run(host.records, attributes, targets);
+    Collect<BINAttributeTargetResults>(bins, status, *algorithm, host);
+}
+
+void RunEqualFrequency(Bins& bins, BINVarList& variables, const std::vector<int>* attributes, const RunHost& host)
+{
+    auto settings = MakeSettings<EFBINSettings>(bins.settings, host);
+    EFBINFactory factory;
+    const std::unique_ptr<IEFBINAlgorithm> algorithm(factory.CreateEFBINAlgorithm(settings, variables));
+    if (!algorithm)
+    {
+        bins.status = factory.GetStatus();
+        return;
+    }
+    const MCBinning::MCStatus status = algorithm->Run(host.records, attributes);
+    Collect<BINAttributeResults>(bins, status, *algorithm, host);
+}
+
+} // namespace
+
+void RunBinning(Bins& bins, BINVarList& variables, const std::vector<int>* attributes, const std::vector<int>* targets,
+                const RunHost& host)
+{
+    if (bins.settings.method == Method::kSupervised)
+        RunSupervised(bins, variables, attributes, targets, host);
+    else
+        RunEqualFrequency(bins, variables, attributes, host);
+}

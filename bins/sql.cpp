@@ -1,0 +1,174 @@
+#include "bins/sql.h"
+
+#include "bins/labels.h"
+#include "bins/lookup.h"
+#include "bins/numbers.h"
+#include "bins/text.h"
+
+#include <cmath>
+#include <limits>
+
+namespace
+{
+
+/// Not every database has a literal for an infinity, but for all it lies beyond the largest finite number.
+constexpr double kLargest = std::numeric_limits<double>::max();
+
+/// Writes the expression of one result.
+class Expression
+{
+public:
+    Expression(const BinColumn& column, const SqlOptions& options)
+        : fBins(*column.bins), fVariable(*column.bins->attribute), fOptions(options),
+          fName(Enclose(fVariable.name, '"')), fAlias(Enclose(column.name, '"'))
+    {
+        if (options.areLabels)
+            fLabels = MakeLabels(fBins);
+    }
+
+    std::string Make() const
+    {
+        return "CASE\n  WHEN " + MakeMissingCondition() + " THEN NULL\n" + MakeBranches() + "END AS " + fAlias;
+    }
+
+private:
+    std::string MakeBranches() const
+    {
+        if (fVariable.IsCategorical())
+            return MakeCategoryBranches();
+        return fVariable.valueKind == ValueKind::kBoolean ? MakeBooleanBranches() : MakeNumberBranches();
+    }
+
+    std::string MakeResult(std::size_t bin) const
+    {
+        return fOptions.areLabels ? Enclose(fLabels[bin], '\'') : std::to_string(bin);
+    }
+
+    std::string MakeLiteral(double value) const
+    {
+        const std::string text = FormatValue(value, fVariable);
+        switch (fVariable.valueKind)
+        {
+        case ValueKind::kNumber:
+            break;
+        case ValueKind::kBoolean:
+            return text == "true" ? "TRUE" : "FALSE";
+        case ValueKind::kDate:
+            return "CAST(" + Enclose(text, '\'') + " AS DATE)";
+        case ValueKind::kTimestamp:
+            return "CAST(" + Enclose(text, '\'') + " AS " +
+                   (fVariable.timeZone.empty() ? "TIMESTAMP" : "TIMESTAMP WITH TIME ZONE") + ")";
+        }
+        return text;
+    }
+
+    std::string MakeCategoryLiteral(const std::string& category) const
+    {
+        return fVariable.kind == VariableKind::kStringCategorical ? Enclose(category, '\'')
+                                                                  : MakeLiteral(ParseNumberOrNaN(category));
+    }
+
+    /// The condition that the value is the infinity.
+    std::string MakeInfinityCondition(double infinity) const
+    {
+        return fName + (infinity > 0.0 ? " > " : " < ") + FormatNumber(std::copysign(kLargest, infinity));
+    }
+
+    std::string MakeMissingCondition() const
+    {
+        std::string condition = fName + " IS NULL";
+        const bool canBeNaN = fVariable.kind == VariableKind::kContinuous && fVariable.valueKind == ValueKind::kNumber;
+        if (canBeNaN && fOptions.dialect == SqlDialect::kDuckDb)
+            condition += " OR isnan(" + fName + ")";
+        std::vector<std::string> values;
+        std::string infinities;
+        for (const double number : fVariable.missingNumbers)
+        {
+            if (std::isinf(number))
+                infinities += " OR " + MakeInfinityCondition(number);
+            else
+                values.push_back(MakeLiteral(number));
+        }
+        // A column of numbers can't hold the texts that stand for a missing value in a file.
+        if (fVariable.kind == VariableKind::kStringCategorical)
+        {
+            for (const std::string& text : fVariable.missingTexts) values.push_back(Enclose(text, '\''));
+        }
+        if (!values.empty())
+            condition += " OR " + fName + " IN (" + Join(values, ", ") + ")";
+        return condition + infinities + (fVariable.missingInterval ? " OR " + MakeIntervalCondition() : "");
+    }
+
+    /// An infinite end takes in the infinity, too.
+    std::string MakeIntervalCondition() const
+    {
+        const auto [low, high] = *fVariable.missingInterval;
+        if (std::isinf(low) && std::isinf(high))
+            return "1 = 1";
+        if (std::isinf(low))
+            return fName + " <= " + MakeLiteral(high);
+        if (std::isinf(high))
+            return fName + " >= " + MakeLiteral(low);
+        return fName + " BETWEEN " + MakeLiteral(low) + " AND " + MakeLiteral(high);
+    }
+
+    std::string MakeCategoryBranches() const
+    {
+        std::string branches;
+        const std::vector<std::vector<std::size_t>> codes = FindCodes(fBins);
+        for (std::size_t bin = 0; bin < codes.size(); ++bin)
+        {
+            std::vector<std::string> literals;
+            for (const std::size_t code : codes[bin])
+                literals.push_back(MakeCategoryLiteral(fVariable.categories[code]));
+            if (!literals.empty())
+                branches += "  WHEN " + fName + " IN (" + Join(literals, ", ") + ") THEN " + MakeResult(bin) + "\n";
+        }
+        return branches + "  ELSE NULL\n";
+    }
+
+    /// The condition that a value that isn't missing lies left of the cut point. A cut point that is infinite is the
+    /// negative infinity with the right end of the bins closed, and the positive one with the left end closed.
+    std::string MakeLeftOf(double cutPoint) const
+    {
+        if (std::isinf(cutPoint))
+            return fName + (fBins.isRightClosed ? " < " : " <= ") + FormatNumber(std::copysign(kLargest, cutPoint));
+        return fName + (fBins.isRightClosed ? " <= " : " < ") + MakeLiteral(cutPoint);
+    }
+
+    std::string MakeNumberBranches() const
+    {
+        std::string branches;
+        const std::vector<double> borders = MakeBorders(fBins);
+        for (std::size_t i = 0; i < borders.size(); ++i)
+            branches += "  WHEN " + MakeLeftOf(borders[i]) + " THEN " + MakeResult(i) + "\n";
+        return branches + "  ELSE " + MakeResult(borders.size()) + "\n";
+    }
+
+    /// A boolean can be compared with a number only in some databases.
+    std::string MakeBooleanBranches() const
+    {
+        std::string branches;
+        for (const double value : {0.0, 1.0})
+            branches += "  WHEN " + fName + " = " + MakeLiteral(value) + " THEN " +
+                        MakeResult(FindBin(fBins.cutPoints, fBins.isRightClosed, value)) + "\n";
+        return branches + "  ELSE NULL\n";
+    }
+
+    const AttributeBins& fBins;
+    const Variable& fVariable;
+    const SqlOptions& fOptions;
+    std::string fName;
+    std::string fAlias;
+    std::vector<std::string> fLabels; ///< empty if they are not asked for
+};
+
+} // namespace
+
+std::string ToSql(const Bins& bins, const SqlOptions& options)
+{
+    std::string sql;
+    for (const BinColumn& column : MakeBinColumns(bins, options.taken))
+        sql += (sql.empty() ? "" : ",\n") + Expression(column, options).Make();
+    return sql + (sql.empty() ? "" : "\n");
+}
