@@ -18,7 +18,9 @@ public:
     using std::runtime_error::runtime_error;
 };
 
-/// The document of the bins.
+JsonValue MakeDocument(const Bins& bins);
+
+/// The text of the document.
 std::string ToJson(const Bins& bins);
 
 /// The bins of a document of this version or of an earlier one.

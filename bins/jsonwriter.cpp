@@ -117,22 +117,27 @@ JsonValue ToValue(const AttributeBins& result)
 
 } // namespace
 
-std::string ToJson(const Bins& bins)
+JsonValue MakeDocument(const Bins& bins)
 {
     Array variables;
     for (const auto& variable : bins.variables) variables.push_back(ToValue(*variable));
     Array results;
     for (const AttributeBins& result : bins.results) results.push_back(ToValue(result));
-    return WriteJson(Object{{"schema", kSchema},
-                            {"schema_version", kSchemaVersion},
-                            {"component_version", bins.componentVersion},
-                            {"method", GetName(kMethodNames, bins.settings.method)},
-                            {"settings", ToValue(bins.settings)},
-                            {"data", Object{{"name", bins.dataName},
-                                            {"records", bins.numRecords},
-                                            {"records_without_weight", bins.numRecordsWithoutWeight},
-                                            {"missing_text", bins.missingTexts}}},
-                            {"variables", variables},
-                            {"status", ToValue(bins.status)},
-                            {"results", results}});
+    return Object{{"schema", kSchema},
+                  {"schema_version", kSchemaVersion},
+                  {"component_version", bins.componentVersion},
+                  {"method", GetName(kMethodNames, bins.settings.method)},
+                  {"settings", ToValue(bins.settings)},
+                  {"data", Object{{"name", bins.dataName},
+                                  {"records", bins.numRecords},
+                                  {"records_without_weight", bins.numRecordsWithoutWeight},
+                                  {"missing_text", bins.missingTexts}}},
+                  {"variables", variables},
+                  {"status", ToValue(bins.status)},
+                  {"results", results}};
+}
+
+std::string ToJson(const Bins& bins)
+{
+    return WriteJson(MakeDocument(bins));
 }

@@ -1,0 +1,69 @@
+#include "bins/measures.h"
+
+#include "tests/support/samplebins.h"
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+
+namespace
+{
+
+std::shared_ptr<const Variable> ATarget(int numCategories)
+{
+    std::vector<std::string> categories;
+    for (int i = 0; i < numCategories; ++i) categories.push_back(std::to_string(i));
+    return AVariable("target", VariableKind::kStringCategorical, categories);
+}
+
+} // namespace
+
+TEST(Measures, GainIsTheTargetEntropyLessTheModelEntropyUnlessRoundingLeftIt)
+{
+    AttributeBins bins = SomeBins(AVariable("x"), ATarget(2), {1}, {{6, 0}, {0, 6}});
+    EXPECT_EQ(1.0, ComputeTargetEntropy(bins));
+    EXPECT_EQ(std::nullopt, ComputeGain(bins)); // no model entropy is known
+
+    bins.modelEntropy = 0.25;
+    EXPECT_EQ(0.75, ComputeGain(bins));
+    bins.modelEntropy = std::nextafter(1.0, 2.0);
+    EXPECT_EQ(0.0, ComputeGain(bins));
+    EXPECT_EQ(std::nullopt, ComputeTargetEntropy(SomeBins(AVariable("x"), nullptr, {}, {{5}})));
+    EXPECT_EQ(std::nullopt, ComputeTargetEntropy(SomeBins(AVariable("x"), ATarget(2), {}, {})));
+}
+
+TEST(Measures, EvidenceIsOfTheSecondOfTwoCategories)
+{
+    const AttributeBins bins = SomeBins(AVariable("x"), ATarget(2), {1, 2, 3}, {{6, 2}, {2, 4}, {0, 2}, {0, 0}});
+
+    const std::vector<Evidence> evidence = ComputeEvidence(bins);
+
+    ASSERT_EQ(4U, evidence.size());
+    EXPECT_EQ(0.25, evidence[0].rate);
+    EXPECT_EQ(std::log(0.25 / 0.75), evidence[0].weightOfEvidence);
+    EXPECT_EQ((0.25 - 0.75) * std::log(0.25 / 0.75), evidence[0].informationValue);
+    EXPECT_EQ(std::numeric_limits<double>::infinity(), evidence[2].weightOfEvidence);
+    // A bin without weight says nothing.
+    EXPECT_EQ(0.0, evidence[3].rate);
+    EXPECT_EQ(0.0, evidence[3].weightOfEvidence);
+    EXPECT_EQ(0.0, evidence[3].informationValue);
+    EXPECT_EQ(std::numeric_limits<double>::infinity(), ComputeInformationValue(bins));
+
+    EXPECT_TRUE(ComputeEvidence(SomeBins(AVariable("x"), ATarget(3), {}, {{1, 1, 1}})).empty());
+    EXPECT_EQ(std::nullopt, ComputeInformationValue(SomeBins(AVariable("x"), ATarget(2), {}, {})));
+}
+
+TEST(Measures, ResultsAreInTheOrderOfTheirGain)
+{
+    Bins bins;
+    for (const double modelEntropy : {0.5, 0.25, 0.5})
+    {
+        bins.results.push_back(SomeBins(AVariable("x"), ATarget(2), {1}, {{6, 0}, {0, 6}}));
+        bins.results.back().modelEntropy = modelEntropy;
+    }
+    bins.results.push_back(SomeBins(AVariable("uncut"), ATarget(2), {}, {{6, 6}}));
+
+    const auto* const first = bins.results.data();
+    EXPECT_EQ((std::vector<const AttributeBins*>{first + 1, first, first + 2}), SortByGain(bins));
+}
