@@ -186,7 +186,11 @@ void CheckFigures(const Truth& truth, const Results& result)
     const std::vector<double>& cuts = result.GetCutPoints();
     for (std::size_t i = 0; i < cuts.size(); ++i)
         Check(!std::isnan(cuts[i]) && (i == 0 || cuts[i - 1] < cuts[i]), "the cut points don't rise");
-    Check(cuts.empty() || cuts.size() < truth.values.size(), "more bins than distinct values");
+}
+
+void CheckNumBins(const Truth& truth, std::size_t numBinsWithValues)
+{
+    Check(numBinsWithValues <= std::max<std::size_t>(truth.values.size(), 1), "more bins than distinct values");
 }
 
 /// What the records weigh by bin and code.
@@ -284,6 +288,7 @@ void CheckResult(const HostData& data, const BINAttributeTargetResults& result)
     // has left of the gain.
     const bool isPreBinned =
         data.distinctThreshold != 0 && result.GetNDistinctValues() > static_cast<unsigned int>(data.distinctThreshold);
+    std::size_t numBinsWithValues = 0;
     for (std::size_t bin = 0; bin < cells.size(); ++bin)
     {
         Check(cells[bin].size() == numCodes + 1, "number of cells");
@@ -295,7 +300,9 @@ void CheckResult(const HostData& data, const BINAttributeTargetResults& result)
         }
         CheckWeight(truth, weight, cells[bin][0], "weight of a bin");
         Check(cells[bin][0] > 0.0 || (isPreBinned && cells[bin][0] == 0.0), "an empty bin");
+        numBinsWithValues += cells[bin][0] > 0.0 ? 1 : 0;
     }
+    CheckNumBins(truth, numBinsWithValues);
     if (truth.isExact)
         CheckModelEntropy(truth, expected, result.GetModelEntropy());
 }
@@ -324,4 +331,5 @@ void CheckResult(const HostData& data, const BINAttributeResults& result)
         CheckWeight(truth, expected[bin][0], counts[bin], "weight of a bin");
         Check(counts[bin] > 0.0, "an empty bin");
     }
+    CheckNumBins(truth, counts.size());
 }
