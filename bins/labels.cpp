@@ -123,6 +123,7 @@ std::vector<std::string> MakeLabels(const AttributeBins& bins)
         return labels;
     }
     const std::vector<std::string> borders = FormatBorders(bins);
+    labels.reserve(bins.bins.size());
     for (std::size_t i = 0; i < bins.bins.size(); ++i) labels.push_back(MakeInterval(bins, i, borders));
     return labels;
 }
@@ -151,7 +152,7 @@ std::vector<std::string> DescribeUnbinned(const Bins& bins)
     for (const AttributeBins& result : bins.results)
     {
         if (!result.HasBins())
-            descriptions.push_back(Quote(result.attribute->name) + ": " + DescribeStatus(result.status));
+            descriptions.push_back(Quote(result.attribute->name) + " has no bins: " + DescribeStatus(result.status));
     }
     return descriptions;
 }

@@ -43,7 +43,7 @@ struct BinColumn
 /// name, "_2", "_3" and so on follow it.
 std::vector<BinColumn> MakeBinColumns(const Bins& bins, const std::vector<std::string>& taken);
 
-/// What keeps each result without bins from having a column, as in "'age': error 120012: ...".
+/// The results without bins, which have no column, as in "'age' has no bins: error 120012: ...".
 std::vector<std::string> DescribeUnbinned(const Bins& bins);
 
 #endif

@@ -66,7 +66,7 @@ std::vector<Evidence> ComputeEvidence(const AttributeBins& bins)
 {
     const std::vector<double> categoryWeights = SumByCategory(bins);
     std::vector<Evidence> evidence;
-    if (categoryWeights.size() == 2)
+    if (categoryWeights.size() == 2 && categoryWeights[0] > 0.0 && categoryWeights[1] > 0.0)
     {
         for (const Bin& bin : bins.bins) evidence.push_back(MakeEvidence(bin, categoryWeights));
     }

@@ -35,10 +35,10 @@ struct Evidence
     double informationValue;
 };
 
-/// By bin; empty unless the target has two categories.
+/// By bin; empty unless the target has two categories, and both have weight.
 std::vector<Evidence> ComputeEvidence(const AttributeBins& bins);
 
-/// Nothing unless the target has two categories, and there are bins.
+/// Nothing where ComputeEvidence() is empty.
 std::optional<double> ComputeInformationValue(const AttributeBins& bins);
 
 /// Results with the largest gain first, those of equal gain, or without one, in their order. Only those with cut points.

@@ -11,6 +11,7 @@ class BINVarList;
 class IBINRecordSource;
 class MCQueryCancel;
 class ProgressListener;
+class WeightGrid;
 
 /// What a host brings to a run. All that is pointed to is the host's and outlives the run.
 struct RunHost
@@ -18,14 +19,15 @@ struct RunHost
     IBINRecordSource* records = nullptr;
     /// By variable index: the values that `records` has handed on; complete when the records are.
     const std::vector<InfiniteValues>* values = nullptr;
-    MCQueryCancel* cancel = nullptr;      ///< null for none
-    ProgressListener* listener = nullptr; ///< null for none
-    int numRecordsBetweenReports = 0;     ///< 0 for the library's default
-    std::string tempDirectory;            ///< empty for the library's default
+    const WeightGrid* weightGrid = nullptr; ///< that `records` has put the weights on
+    MCQueryCancel* cancel = nullptr;        ///< null for none
+    ProgressListener* listener = nullptr;   ///< null for none
+    int numRecordsBetweenReports = 0;       ///< 0 for the library's default
+    std::string tempDirectory;              ///< empty for the library's default
 };
 
 /// Runs the library as `bins.settings` say, and adds to `bins` what comes of it: the component's version, the status of
-/// the run and the results.
+/// the run, the results, and the grid of the weights.
 ///
 /// `variables` are those of `bins`, in their order. `attributes` and `targets` are lists of variable indices, or null, as
 /// IBINAlgorithm::Run() takes them. With equal frequency `targets` is not looked at.

@@ -46,7 +46,7 @@ private:
 
     std::string MakeLiteral(double value) const
     {
-        const std::string text = FormatValue(value, fVariable);
+        std::string text = FormatValue(value, fVariable);
         switch (fVariable.valueKind)
         {
         case ValueKind::kNumber:
@@ -167,8 +167,10 @@ private:
 
 std::string ToSql(const Bins& bins, const SqlOptions& options)
 {
+    std::vector<std::string> names;
+    for (const auto& variable : bins.variables) names.push_back(variable->name);
     std::string sql;
-    for (const BinColumn& column : MakeBinColumns(bins, options.taken))
+    for (const BinColumn& column : MakeBinColumns(bins, names))
         sql += (sql.empty() ? "" : ",\n") + Expression(column, options).Make();
     return sql + (sql.empty() ? "" : "\n");
 }

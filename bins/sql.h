@@ -4,7 +4,6 @@
 #include "bins/bins.h"
 
 #include <string>
-#include <vector>
 
 enum class SqlDialect
 {
@@ -15,8 +14,7 @@ enum class SqlDialect
 struct SqlOptions
 {
     SqlDialect dialect = SqlDialect::kStandard;
-    bool areLabels = false;         ///< the labels of the bins, not their numbers from 0
-    std::vector<std::string> taken; ///< columns of the table, whose names no column of bins gets
+    bool areLabels = false; ///< the labels of the bins, not their numbers from 0
 };
 
 /// A CASE expression for each result that has bins, with the name of its column, separated by commas and line ends. It

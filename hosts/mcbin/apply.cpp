@@ -1,13 +1,13 @@
 #include "hosts/mcbin/apply.h"
 
-#include "hosts/mcbin/binner.h"
+#include "bins/binner.h"
+#include "bins/csv.h"
+#include "bins/labels.h"
 #include "hosts/mcbin/failure.h"
-#include "hosts/mcbin/figures.h"
 #include "hosts/mcbin/input/jsoninput.h"
 #include "hosts/mcbin/input/tablereader.h"
 #include "hosts/mcbin/interrupt.h"
 #include "hosts/mcbin/options.h"
-#include "hosts/mcbin/output/csvoutput.h"
 #include "hosts/mcbin/output/outputfile.h"
 #include "hosts/mcbin/progress.h"
 #include "hosts/mcbin/text.h"
@@ -20,98 +20,85 @@ namespace
 {
 
 /// One column of the output that isn't the input's.
-struct BinColumn
+struct OutputColumn
 {
-    std::size_t place; ///< of the attribute in the table
+    std::size_t position; ///< of the attribute in the table
+    const Variable* attribute;
     std::string name;
     Binner binner;
     std::vector<std::string> fields; ///< by bin: what is written
 };
 
-std::vector<std::string> MakeFields(const Findings& findings, const Result& result, const ApplyOptions& options,
-                                    char delimiter)
+std::vector<std::string> MakeFields(const AttributeBins& bins, bool areLabels, char delimiter)
 {
     std::vector<std::string> fields;
-    for (std::size_t i = 0; i < result.bins.size(); ++i)
-        fields.push_back(options.areLabels ? QuoteField(FormatBin(findings, result, result.bins[i]), delimiter)
-                                           : std::to_string(i));
+    if (areLabels)
+    {
+        for (const std::string& label : MakeLabels(bins)) fields.push_back(QuoteField(label, delimiter));
+        return fields;
+    }
+    for (std::size_t i = 0; i < bins.bins.size(); ++i) fields.push_back(std::to_string(i));
     return fields;
 }
 
-std::vector<BinColumn> MakeColumns(const TableReader& table, const Findings& findings, const ApplyOptions& options)
+std::vector<OutputColumn> MakeColumns(const TableReader& table, const Bins& bins, const ApplyOptions& options)
 {
-    std::vector<BinColumn> columns;
-    for (const Result& result : findings.results)
+    std::vector<std::string> missingTexts = bins.missingTexts;
+    missingTexts.insert(missingTexts.end(), options.missingText.begin(), options.missingText.end());
+    std::vector<OutputColumn> columns;
+    for (const BinColumn& column : MakeBinColumns(bins, table.GetColumnNames()))
     {
-        if (result.cutPoints.empty())
-            continue;
-        const std::size_t place = table.FindColumn(findings.GetAttribute(result).name);
-        const auto isSame = [place](const BinColumn& column) { return column.place == place; };
+        const Variable& attribute = *column.bins->attribute;
+        const std::size_t position = table.FindColumn(attribute.name);
+        const auto isSame = [position](const OutputColumn& other) { return other.position == position; };
         if (options.isInPlace && std::any_of(columns.begin(), columns.end(), isSame))
-            throw Failure("column " + Quote(findings.GetAttribute(result).name) +
+            throw Failure("column " + Quote(attribute.name) +
                           " has been binned for more than one target, so its bins can't take its place");
-        columns.push_back({place, GetBinColumn(findings, result), Binner(findings, result, options.missingText),
-                           MakeFields(findings, result, options, table.GetDelimiter())});
+        columns.push_back({position, &attribute, column.name, Binner(*column.bins, missingTexts),
+                           MakeFields(*column.bins, options.areLabels, table.GetDelimiter())});
     }
     if (columns.empty())
-        throw Failure(options.bins + ": there is nothing to apply, as no attribute has cut points");
+        throw Failure(options.bins + ": there is nothing to apply, as no attribute has bins");
     return columns;
 }
 
-/// An output with two columns of one name would be no table to anybody, this tool included.
-void ThrowIfTaken(const TableReader& table, const std::vector<BinColumn>& columns)
-{
-    const std::vector<std::string>& names = table.GetColumnNames();
-    for (auto column = columns.begin(); column != columns.end(); ++column)
-    {
-        if (std::find(names.begin(), names.end(), column->name) != names.end())
-            throw table.MakeFailure("there is a column " + Quote(column->name) +
-                                    " already; --in-place-columns makes no new ones");
-        const auto isSame = [column](const BinColumn& other) { return other.name == column->name; };
-        const auto same = std::find_if(columns.begin(), column, isSame);
-        if (same != column)
-            throw table.MakeFailure("the bins of " + Quote(names[same->place]) + " and those of " +
-                                    Quote(names[column->place]) + " would both be the column " + Quote(column->name));
-    }
-}
-
-std::string MakeHeader(const TableReader& table, const std::vector<BinColumn>& columns, bool isInPlace)
+std::string MakeHeader(const TableReader& table, const std::vector<OutputColumn>& columns, bool isInPlace)
 {
     std::string header = table.GetHeader();
     if (!isInPlace)
-        for (const BinColumn& column : columns)
+        for (const OutputColumn& column : columns)
             header += table.GetDelimiter() + QuoteField(column.name, table.GetDelimiter());
     return header + table.GetLineEnd();
 }
 
-[[noreturn]] void ThrowBadField(const TableReader& table, const CsvRow& row, const BinColumn& column)
+[[noreturn]] void ThrowBadField(const TableReader& table, const CsvRow& row, const OutputColumn& column)
 {
-    const std::string_view field = row[column.place];
-    if (!column.binner.IsCategorical())
-        throw table.MakeNotANumber(row.GetLine(), column.place, field);
-    throw table.MakeFailure(row.GetLine(), column.place,
+    const std::string_view field = row[column.position];
+    if (!column.attribute->IsCategorical())
+        throw table.MakeNotANumber(row.GetLine(), column.position, field);
+    throw table.MakeFailure(row.GetLine(), column.position,
                             Quote(Shorten(field)) + " is a category that the bins don't know; with --bad missing it "
                                                     "counts as missing");
 }
 
 /// The field that is written for the row's value; empty for a missing one.
-std::string_view FindField(const TableReader& table, const CsvRow& row, BinColumn& column, bool isBadMissing)
+std::string_view FindField(const TableReader& table, const CsvRow& row, OutputColumn& column, bool isBadMissing)
 {
-    const Binner::Place place = column.binner.Find(row[column.place]);
-    if (place.isBad && !isBadMissing)
+    const Binner::Found found = column.binner.Find(row[column.position]);
+    if (found.isBad && !isBadMissing)
         ThrowBadField(table, row, column);
-    return place.bin ? std::string_view(column.fields[*place.bin]) : std::string_view();
+    return found.bin ? std::string_view(column.fields[*found.bin]) : std::string_view();
 }
 
 /// Writes rows: the input's fields as they stand there, some perhaps replaced, and further ones behind them.
 class RowWriter
 {
 public:
-    RowWriter(const TableReader& table, std::vector<BinColumn>& columns, const ApplyOptions& options)
+    RowWriter(const TableReader& table, std::vector<OutputColumn>& columns, const ApplyOptions& options)
         : fTable(table), fColumns(columns), fOptions(options), fOwn(table.GetColumnNames().size(), nullptr)
     {
         if (options.isInPlace)
-            for (BinColumn& column : columns) fOwn[column.place] = &column;
+            for (OutputColumn& column : columns) fOwn[column.position] = &column;
     }
 
     /// The line is the object's and good until the next call.
@@ -123,7 +110,7 @@ public:
         else
         {
             Append(row.GetText().fields);
-            for (BinColumn& column : fColumns) Append(FindField(fTable, row, column, fOptions.isBadMissing));
+            for (OutputColumn& column : fColumns) Append(FindField(fTable, row, column, fOptions.isBadMissing));
         }
         fLine.pop_back(); // the delimiter behind the last field
         // A line of a single empty field would be a blank one, which no reader counts.
@@ -148,22 +135,20 @@ private:
     }
 
     const TableReader& fTable;
-    std::vector<BinColumn>& fColumns;
+    std::vector<OutputColumn>& fColumns;
     const ApplyOptions& fOptions;
-    std::vector<BinColumn*> fOwn;          ///< by column of the table: what replaces it, or null
+    std::vector<OutputColumn*> fOwn;       ///< by column of the table: what replaces it, or null
     std::vector<std::string_view> fFields; ///< of the row at hand
     std::string fLine;
 };
 
 } // namespace
 
-void ApplyBins(const ApplyOptions& options, Progress& progress)
+std::vector<std::string> ApplyBins(const ApplyOptions& options, Progress& progress)
 {
-    const Findings findings = ReadJson(options.bins);
+    const Bins bins = ReadJson(options.bins);
     TableReader table(options.table);
-    std::vector<BinColumn> columns = MakeColumns(table, findings, options);
-    if (!options.isInPlace)
-        ThrowIfTaken(table, columns);
+    std::vector<OutputColumn> columns = MakeColumns(table, bins, options);
 
     OutputFile output(options.output);
     output.Write(MakeHeader(table, columns, options.isInPlace));
@@ -176,4 +161,5 @@ void ApplyBins(const ApplyOptions& options, Progress& progress)
     }
     ThrowIfInterrupted(); // the signal may have ended what writes the table, and come a moment later
     output.Commit();
+    return DescribeUnbinned(bins);
 }

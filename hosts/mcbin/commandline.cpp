@@ -1,24 +1,27 @@
 #include "hosts/mcbin/commandline.h"
 
 #include "bins/numbers.h"
-#include "hosts/mcbin/input/delimiter.h"
-#include "hosts/mcbin/text.h"
-
 #include "bins/tempdirectory.h"
+#include "bins/text.h"
+#include "hosts/mcbin/helptexts.h"
+#include "hosts/mcbin/input/delimiter.h"
+#include "hosts/mcbin/manpage.h"
+#include "hosts/mcbin/spelling.h"
 
 #include <mcobnqrt/binfactory.h>
 #include <mcobnqrt/binsettings.h>
 #include <mcobnqrt/binvarlist.h>
 #include <mcobnqrt/ibinalgorithm.h>
 
+#include <CLI/CLI.hpp>
+
 #include <algorithm>
 #include <limits>
 #include <map>
 #include <memory>
-#include <numeric>
 #include <optional>
+#include <sstream>
 #include <string>
-#include <utility>
 #include <vector>
 
 namespace
@@ -30,34 +33,6 @@ constexpr int kMost = std::numeric_limits<int>::max();
 /// as no distinct value threshold is set. With 1000 bins pre-binning costs hardly any precision: a border is off by a
 /// thousandth of the weight at most.
 constexpr int kPreBins = 1000;
-
-constexpr const char* kData = "A delimited text file whose first line names the columns; - for standard input";
-
-constexpr const char* kSupervisedExamples = R"(Examples:
-  mcbin supervised iris.csv --target species
-  mcbin supervised people.csv --target income --weight weight --missing-text '?' --report people.html
-  mcbin supervised loans.csv --target default --format json > bins.json
-  mcbin supervised survey.csv --pairs 'age:bought,income:bought,age:returned' --missing age=-9:-1
-
-A numeric target is cut into bins, whose numbers are its categories then:
-  mcbin equal-frequency cars.csv --attributes price --bins 4 --format json > price.json
-  mcbin apply price.json cars.csv | mcbin supervised - --target price_bin --exclude price)";
-
-constexpr const char* kEqualFrequencyExamples = R"(Examples:
-  mcbin equal-frequency iris.csv --bins 4
-  zcat big.csv.gz | mcbin equal-frequency - --attributes 'amount_*' --bins 20 --format sql)";
-
-constexpr const char* kApplyExamples = R"(Examples:
-  mcbin supervised train.csv --target bought --format json > bins.json
-  mcbin apply bins.json new.csv -o new_binned.csv
-  mcbin apply bins.json new.csv --labels --in-place-columns | head)";
-
-constexpr const char* kExitCodes = R"(Exit codes:
-  0    done
-  1    failure: a file, a row or the data cannot be used, or the output cannot be written
-  2    the command line is wrong
-  3    with --strict: done, but an attribute carries a warning or an error
-  130  interrupted; what was found before that has been printed, and no file is written)";
 
 CLI::Validator MakeDelimiterCheck()
 {
@@ -101,6 +76,15 @@ CLI::Option* AddList(CLI::App& command, const std::string& name, std::vector<std
     return AddRepeated(command, name, list, description, what)->delimiter(',');
 }
 
+/// An option that also goes by the name of an earlier release, which the help doesn't tell.
+template<class Value>
+CLI::Option* AddRenamed(CLI::App& command, const std::string& name, const std::string& earlierName, Value& value,
+                        const std::string& description, const CLI::Validator& check)
+{
+    command.add_option(earlierName, value)->check(check)->group("");
+    return command.add_option(name, value, description)->check(check);
+}
+
 void AddTable(CLI::App& command, TableOptions& table)
 {
     command.add_option("DATA", table.file, kData)->required()->option_text("FILE");
@@ -129,6 +113,23 @@ void AddMissing(CLI::App& command, std::vector<std::string>& missingText, bool& 
         ->group("Input");
 }
 
+void AddRounding(CLI::App& command, ColumnOptions& columns)
+{
+    for (const char* const name : {"--round", "--rounding"}) // the first is that of an earlier release
+    {
+        const bool isTold = std::string(name) == "--rounding";
+        command
+            .add_option_function<std::string>(
+                name, [&columns](const std::string& how) { columns.rounding = *FindWeightRounding(how); },
+                "Whether a weight becomes a whole number, and how. none, if not given: fractions count as they are, "
+                "but for a last digit or two, to a grid on which all sums are exact; among a million rows a weight "
+                "moves by less than one part in 10^9 of the largest")
+            ->check(CLI::IsMember({"none", "truncate", "closest"}))
+            ->option_text("none|truncate|closest")
+            ->group(isTold ? "Columns" : "");
+    }
+}
+
 void AddColumns(CLI::App& command, ColumnOptions& columns)
 {
     AddRepeated(command, "--attributes", columns.attributes,
@@ -144,16 +145,7 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
         ->check(MakeNameCheck())
         ->option_text("NAME")
         ->group("Columns");
-    command
-        .add_option_function<std::string>(
-            "--round", [&columns](const std::string& how) { columns.rounding = *FindWeightRounding(how); },
-            "Whether a weight becomes a whole number, and how. none, if not given: fractions count as they are, but "
-            "for "
-            "a last digit or two, to a grid on which all sums are exact; among a million rows a weight moves by less "
-            "than one part in 10^9 of the largest")
-        ->check(CLI::IsMember({"none", "truncate", "closest"}))
-        ->option_text("none|truncate|closest")
-        ->group("Columns");
+    AddRounding(command, columns);
     AddRepeated(
         command, "--categorical", columns.categorical,
         "Columns of categories, at most 256, also if they are numbers; an attribute's are binned in sorted order",
@@ -170,18 +162,25 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
         ->group("Input");
 }
 
-void AddSettings(CLI::App& command, SettingOptions& settings)
+void AddNumBins(CLI::App& command, BinOptions& options, const std::string& description)
+{
+    AddRenamed(command, "--n-bins", "--bins", options.settings.numBins, description, CLI::Range(2, kMost))
+        ->option_text("N")
+        ->group("Settings");
+}
+
+void AddSettings(CLI::App& command, BinOptions& options)
 {
     command
         .add_option_function<std::string>(
-            "--closed", [&settings](const std::string& side) { settings.isRightClosed = side == "right"; },
+            "--closed", [&options](const std::string& side) { options.settings.isRightClosed = side == "right"; },
             "Which end of an interval belongs to it; right if not given")
         ->check(CLI::IsMember({"right", "left"}))
         ->option_text("right|left")
         ->group("Settings");
     command
         .add_option_function<std::string>(
-            "--temp-dir", [&settings](const std::string& directory) { settings.tempDirectory = directory; },
+            "--temp-dir", [&options](const std::string& directory) { options.tempDirectory = directory; },
             "Where the temporary files go, which hold all records; the directory in TMPDIR, else /tmp, if not given")
         ->check(MakeNameCheck())
         ->option_text("DIR")
@@ -189,11 +188,11 @@ void AddSettings(CLI::App& command, SettingOptions& settings)
 }
 
 /// A temporary directory that can't be used ends the tool as any other wrong use of it does.
-void SettleTempDirectory(SettingOptions& settings)
+void SettleTempDirectory(BinOptions& options)
 {
     try
     {
-        settings.tempDirectory = ChooseTempDirectory(settings.tempDirectory, "--temp-dir");
+        options.tempDirectory = ChooseTempDirectory(options.tempDirectory, "--temp-dir");
     }
     catch (const TempDirectoryUnusable& error)
     {
@@ -217,6 +216,16 @@ void AddOutput(CLI::App& command, OutputOptions& output)
             "sql: a CASE expression for each attribute")
         ->check(CLI::IsMember({"table", "json", "csv", "sql"}))
         ->option_text("FORMAT")
+        ->group("Output");
+    command
+        .add_option_function<std::string>(
+            "--dialect",
+            [&output](const std::string& name)
+            { output.dialect = name == "duckdb" ? SqlDialect::kDuckDb : SqlDialect::kStandard; },
+            "What --format sql is for: standard, for most databases (the default), or duckdb, where a NaN is missing, "
+            "too")
+        ->check(CLI::IsMember({"standard", "duckdb"}))
+        ->option_text("standard|duckdb")
         ->group("Output");
     command.add_option("--report", output.report, "Write a page with tables and charts, too")
         ->check(MakeNameCheck())
@@ -251,25 +260,21 @@ void AddSupervised(CLI::App& app, Request& request)
     pairs->excludes(target);
     AddColumns(command, request.bin.columns);
     for (const char* const name : {"--attributes", "--exclude"}) pairs->excludes(command.get_option(name));
-    SettingOptions& settings = request.bin.settings;
-    command
-        .add_option("--distinct-threshold", settings.distinctThreshold,
-                    "An attribute with more distinct values is first cut into --bins bins of equal frequency; never if "
-                    "not given")
-        ->check(CLI::Range(0, kMost))
+    Settings& settings = request.bin.settings;
+    AddRenamed(
+        command, "--max-distinct", "--distinct-threshold", settings.maxDistinct,
+        "An attribute with more distinct values is first cut into --n-bins bins of equal frequency; never if not "
+        "given",
+        CLI::Range(0, kMost))
         ->option_text("N")
         ->group("Settings");
-    command.add_option("--bins", settings.bins, "The number of bins for that; 1000 if not given")
-        ->check(CLI::Range(2, kMost))
-        ->option_text("N")
-        ->group("Settings");
-    command
-        .add_option("--small-bins", settings.smallBins,
-                    "An inner bin of less than this share of its lighter neighbour's weight is merged, from 0 to 1")
-        ->check(MakeRatioCheck())
+    AddNumBins(command, request.bin, "The number of bins for that; 1000 if not given");
+    AddRenamed(command, "--small-bin-ratio", "--small-bins", settings.smallBinRatio,
+               "An inner bin of less than this share of its lighter neighbour's weight is merged, from 0 to 1",
+               MakeRatioCheck())
         ->option_text("RATIO")
         ->group("Settings");
-    AddSettings(command, settings);
+    AddSettings(command, request.bin);
     AddOutput(command, request.bin.output);
     command.footer(kSupervisedExamples);
     command.callback(
@@ -279,9 +284,10 @@ void AddSupervised(CLI::App& app, Request& request)
                 throw CLI::RequiredError("--target, or --pairs,");
             request.command = Request::Command::kSupervised;
             request.bin.settings.method = Method::kSupervised;
-            SettleTempDirectory(request.bin.settings);
-            if (request.bin.settings.bins == 0)
-                request.bin.settings.bins = kPreBins;
+            SettleTempDirectory(request.bin);
+            if (request.bin.settings.numBins == 0)
+                request.bin.settings.numBins = kPreBins;
+            request.bin.settings.smallBinRatio = request.bin.settings.smallBinRatio.value_or(0.0);
         });
 }
 
@@ -292,11 +298,8 @@ void AddEqualFrequency(CLI::App& app, Request& request)
         *app.add_subcommand("equal-frequency", "Cut the columns of numbers into bins of about equal weight");
     AddTable(command, request.bin.table);
     AddColumns(command, request.bin.columns);
-    command.add_option("--bins", request.bin.settings.bins, "The number of bins to aim at; 10 if not given")
-        ->check(CLI::Range(2, kMost))
-        ->option_text("N")
-        ->group("Settings");
-    AddSettings(command, request.bin.settings);
+    AddNumBins(command, request.bin, "The number of bins to aim at; 10 if not given");
+    AddSettings(command, request.bin);
     AddOutput(command, request.bin.output);
     command.footer(kEqualFrequencyExamples);
     command.callback(
@@ -304,9 +307,9 @@ void AddEqualFrequency(CLI::App& app, Request& request)
         {
             request.command = Request::Command::kEqualFrequency;
             request.bin.settings.method = Method::kEqualFrequency;
-            SettleTempDirectory(request.bin.settings);
-            if (request.bin.settings.bins == 0)
-                request.bin.settings.bins = kUsualBins;
+            SettleTempDirectory(request.bin);
+            if (request.bin.settings.numBins == 0)
+                request.bin.settings.numBins = kUsualBins;
         });
 }
 
@@ -332,31 +335,6 @@ void AddApply(CLI::App& app, Request& request)
     command.callback([&request] { request.command = Request::Command::kApply; });
 }
 
-/// How many letters must be put in, taken out or replaced to make one word of the other.
-std::size_t GetDistance(const std::string& left, const std::string& right)
-{
-    std::vector<std::size_t> row(right.size() + 1); // by end of right: the distance from left up to letter i
-    std::iota(row.begin(), row.end(), std::size_t(0));
-    for (std::size_t i = 0; i < left.size(); ++i)
-    {
-        std::size_t diagonal = std::exchange(row[0], i + 1);
-        for (std::size_t j = 0; j < right.size(); ++j)
-        {
-            const std::size_t replaced = diagonal + (left[i] == right[j] ? 0 : 1);
-            diagonal = row[j + 1];
-            row[j + 1] = std::min({replaced, row[j] + 1, row[j + 1] + 1});
-        }
-    }
-    return row.back();
-}
-
-/// Whether the word is the beginning of the name, or is mistyped in no more than every third letter of it.
-bool IsNear(const std::string& word, const std::string& name)
-{
-    const bool isBeginning = !word.empty() && name.compare(0, word.size(), word) == 0;
-    return isBeginning || GetDistance(word, name) <= std::max<std::size_t>(2, name.size() / 3);
-}
-
 /// The version of the tool, which is the library's.
 std::string GetVersion()
 {
@@ -367,15 +345,57 @@ std::string GetVersion()
     return "mcbin " MCBIN_VERSION " with " + (algorithm ? algorithm->GetVersionString() : "");
 }
 
-} // namespace
+/// The options of a command by group; those without one are hidden.
+std::vector<OptionGroup> DescribeOptions(const CLI::App& command)
+{
+    std::vector<OptionGroup> groups;
+    for (const std::string& title : command.get_groups())
+    {
+        OptionGroup group{title, {}};
+        for (const CLI::Option* const option : command.get_options())
+        {
+            if (option->get_group() == title)
+                group.options.push_back(
+                    {option->get_name(false, true), option->get_option_text(), option->get_description()});
+        }
+        if (!title.empty() && !group.options.empty())
+            groups.push_back(group);
+    }
+    return groups;
+}
 
-std::unique_ptr<CLI::App> MakeCommandLine(Request& request)
+ToolHelp DescribeTool(const CLI::App& app)
+{
+    ToolHelp tool{app.get_name(), app.get_description(), {}, app.get_footer()};
+    for (const CLI::App* const command : app.get_subcommands([](const CLI::App*) { return true; }))
+    {
+        CommandHelp help{
+            command->get_name(), command->get_description(), {}, DescribeOptions(*command), command->get_footer()};
+        for (const CLI::Option* const option : command->get_options())
+        {
+            if (option->get_positional())
+                help.positionals.push_back(option->get_name(true));
+        }
+        tool.commands.push_back(help);
+    }
+    return tool;
+}
+
+std::unique_ptr<CLI::App> MakeApp(Request& request)
 {
     auto app =
         std::make_unique<CLI::App>("Finds bins in the columns of a text file, shows them, and applies them.", "mcbin");
     app->require_subcommand(0, 1);
     app->set_version_flag("--version", GetVersion);
-    app->add_flag("--man", request.isManPage, "Print this as a manual page, for man")->group("");
+    app->add_flag_callback(
+           "--man",
+           [&request, tool = app.get()]
+           {
+               request.command = Request::Command::kText;
+               request.text = MakeManPage(DescribeTool(*tool));
+           },
+           "Print this as a manual page, for man")
+        ->group("");
     app->footer(std::string("'mcbin COMMAND --help' tells of the options of a command.\n\n") + kExitCodes);
     AddSupervised(*app, request);
     AddEqualFrequency(*app, request);
@@ -383,12 +403,13 @@ std::unique_ptr<CLI::App> MakeCommandLine(Request& request)
     app->final_callback(
         [&request]
         {
-            if (request.command == Request::Command::kNone && !request.isManPage)
+            if (request.command == Request::Command::kNone)
                 throw CLI::RequiredError("A command");
         });
     return app;
 }
 
+/// The first argument is an option or the name of a command. Without this check it would be told to be one too many.
 void ThrowUnlessCommand(const CLI::App& app, int argc, const char* const* argv)
 {
     const std::string word = argc > 1 ? argv[1] : "-";
@@ -399,8 +420,32 @@ void ThrowUnlessCommand(const CLI::App& app, int argc, const char* const* argv)
         names.push_back(command->get_name());
     if (std::find(names.begin(), names.end(), word) != names.end())
         return;
-    const auto near =
-        std::find_if(names.begin(), names.end(), [&](const std::string& name) { return IsNear(word, name); });
-    const std::string advice = near == names.end() ? "there are " + Join(names, ", ") : "did you mean '" + *near + "'?";
-    throw CLI::ParseError("no such command: " + Quote(word) + "; " + advice, CLI::ExitCodes::InvalidError);
+    const std::optional<std::string> near = FindNear(word, names);
+    throw UsageError("no such command: " + Quote(word) + "; " +
+                     (near ? "did you mean '" + *near + "'?" : "there are " + Join(names, ", ")));
+}
+
+} // namespace
+
+Request ParseCommandLine(int argc, const char* const* argv)
+{
+    Request request;
+    const std::unique_ptr<CLI::App> app = MakeApp(request);
+    ThrowUnlessCommand(*app, argc, argv);
+    try
+    {
+        app->parse(argc, argv);
+    }
+    catch (const CLI::Success& help)
+    {
+        std::ostringstream text;
+        app->exit(help, text, text);
+        request.command = Request::Command::kText;
+        request.text = text.str();
+    }
+    catch (const CLI::ParseError& error)
+    {
+        throw UsageError(error.what());
+    }
+    return request;
 }

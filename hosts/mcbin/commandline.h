@@ -3,11 +3,10 @@
 
 #include "hosts/mcbin/options.h"
 
-#include <CLI/CLI.hpp>
+#include <stdexcept>
+#include <string>
 
-#include <memory>
-
-/// What the command line asks for. One of the commands is set.
+/// What the command line asks for.
 struct Request
 {
     enum class Command
@@ -15,20 +14,24 @@ struct Request
         kNone,
         kSupervised,
         kEqualFrequency,
-        kApply
+        kApply,
+        kText ///< to print `text` and end
     };
 
     Command command = Command::kNone;
-    BinOptions bin;
-    ApplyOptions apply;
-    bool isManPage = false;
+    BinOptions bin;     ///< of the first two commands
+    ApplyOptions apply; ///< of kApply
+    std::string text;   ///< the help, the version or the manual page
 };
 
-/// The options, commands and help texts of the tool; parsing fills `request`, which must outlive the result.
-std::unique_ptr<CLI::App> MakeCommandLine(Request& request);
+/// What is wrong with a command line, in words for the user.
+class UsageError : public std::runtime_error
+{
+public:
+    using std::runtime_error::runtime_error;
+};
 
-/// \throw CLI::ParseError if the first argument is neither an option nor the name of a command. It tells which command may
-/// be meant, or else which there are.
-void ThrowUnlessCommand(const CLI::App& app, int argc, const char* const* argv);
+/// \throw UsageError
+Request ParseCommandLine(int argc, const char* const* argv);
 
 #endif

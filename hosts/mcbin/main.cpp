@@ -1,15 +1,14 @@
+#include "bins/csv.h"
+#include "bins/json.h"
+#include "bins/labels.h"
+#include "bins/sql.h"
 #include "hosts/mcbin/apply.h"
 #include "hosts/mcbin/commandline.h"
 #include "hosts/mcbin/failure.h"
-#include "hosts/mcbin/figures.h"
 #include "hosts/mcbin/input/tablereader.h"
 #include "hosts/mcbin/interrupt.h"
-#include "hosts/mcbin/manpage.h"
-#include "hosts/mcbin/output/csvoutput.h"
 #include "hosts/mcbin/output/htmlreport.h"
-#include "hosts/mcbin/output/jsonoutput.h"
 #include "hosts/mcbin/output/outputfile.h"
-#include "hosts/mcbin/output/sqloutput.h"
 #include "hosts/mcbin/output/tableoutput.h"
 #include "hosts/mcbin/progress.h"
 #include "hosts/mcbin/run.h"
@@ -34,24 +33,21 @@ constexpr int kUsage = 2;
 constexpr int kFlagged = 3;
 constexpr int kInterrupted = 130;
 
-std::string Print(const Findings& findings, Format format)
+std::string Print(const Outcome& outcome, const OutputOptions& options)
 {
-    std::ostringstream os;
-    switch (format)
+    switch (options.format)
     {
     case Format::kTable:
-        PrintTables(os, findings, {GetTerminalWidth(STDOUT_FILENO), HasColours(STDOUT_FILENO)});
         break;
     case Format::kJson:
-        PrintJson(os, findings);
-        break;
+        return ToJson(outcome.bins);
     case Format::kCsv:
-        PrintCsv(os, findings);
-        break;
+        return ToCsv(outcome.bins);
     case Format::kSql:
-        PrintSql(os, findings);
-        break;
+        return ToSql(outcome.bins, {options.dialect, false});
     }
+    std::ostringstream os;
+    PrintTables(os, outcome, {GetTerminalWidth(STDOUT_FILENO), HasColours(STDOUT_FILENO)});
     return os.str();
 }
 
@@ -70,13 +66,13 @@ void WriteOut(const std::string& text)
 
 /// Writes the page unless a signal has asked for the end: the page of a whole run is worth more than that of a part.
 /// \return what has gone wrong, for later: a full disk is no reason to lose the tables.
-std::exception_ptr WriteReport(OutputFile& report, const Findings& findings)
+std::exception_ptr WriteReport(OutputFile& report, const Outcome& outcome)
 {
     try
     {
         ThrowIfInterrupted();
         std::ostringstream page;
-        PrintHtml(page, findings);
+        PrintHtml(page, outcome);
         report.Write(page.str());
         report.Commit();
     }
@@ -92,15 +88,15 @@ std::exception_ptr WriteReport(OutputFile& report, const Findings& findings)
 }
 
 /// Behind a signal nothing is a success, even if the last record had been read.
-int GetExitCode(const Findings& findings, bool isStrict)
+int GetExitCode(const Outcome& outcome, bool isStrict)
 {
     if (IsInterrupted())
     {
         Tell("interrupted; these are the results up to then");
         return kInterrupted;
     }
-    const auto isFlagged = [](const Result& result) { return !result.status.IsOK(); };
-    return isStrict && std::any_of(findings.results.begin(), findings.results.end(), isFlagged) ? kFlagged : 0;
+    const auto isFlagged = [](const AttributeBins& result) { return !result.status.IsOK(); };
+    return isStrict && std::any_of(outcome.bins.results.begin(), outcome.bins.results.end(), isFlagged) ? kFlagged : 0;
 }
 
 int Bin(const BinOptions& options)
@@ -108,54 +104,48 @@ int Bin(const BinOptions& options)
     Progress progress(IsTerminal(STDERR_FILENO) && !options.output.isQuiet);
     TableOptions tableOptions = options.table;
     tableOptions.isReadTwice = true;
-    tableOptions.spoolDirectory = options.settings.tempDirectory;
+    tableOptions.spoolDirectory = options.tempDirectory;
     TableReader table(tableOptions);
     // A name that can't be written is found out before the work.
     std::optional<OutputFile> report;
     if (!options.output.report.empty())
         report.emplace(options.output.report);
-    const Findings findings = FindBins(table, options, progress);
-    const std::exception_ptr failure = report ? WriteReport(*report, findings) : nullptr;
-    WriteOut(Print(findings, options.output.format));
-    for (const std::string& note : findings.notes) Tell(note);
+    const Outcome outcome = FindBins(table, options, progress);
+    const std::exception_ptr failure = report ? WriteReport(*report, outcome) : nullptr;
+    WriteOut(Print(outcome, options.output));
+    for (const std::string& note : outcome.notes) Tell(note);
+    // The other forms have a row or a line of their own for it.
+    if (options.output.format == Format::kSql || options.output.format == Format::kCsv)
+    {
+        for (const std::string& unbinned : DescribeUnbinned(outcome.bins)) Tell(unbinned);
+    }
     if (failure)
         std::rethrow_exception(failure);
-    return GetExitCode(findings, options.output.isStrict);
+    return GetExitCode(outcome, options.output.isStrict);
 }
 
 int Run(int argc, char** argv)
 {
     Request request;
-    const std::unique_ptr<CLI::App> app = MakeCommandLine(request);
     try
     {
-        ThrowUnlessCommand(*app, argc, argv);
-        app->parse(argc, argv);
+        request = ParseCommandLine(argc, argv);
     }
-    catch (const CLI::Success& help)
-    {
-        std::ostringstream text;
-        app->exit(help, text, text);
-        WriteOut(text.str());
-        return 0;
-    }
-    catch (const CLI::ParseError& error)
+    catch (const UsageError& error)
     {
         Tell(error.what());
         std::cerr << "Run 'mcbin --help' for more information.\n";
         return kUsage;
     }
-    if (request.isManPage)
+    if (request.command == Request::Command::kText)
     {
-        std::ostringstream page;
-        PrintManPage(page, *app);
-        WriteOut(page.str());
+        WriteOut(request.text);
         return 0;
     }
     if (request.command != Request::Command::kApply)
         return Bin(request.bin);
     Progress progress(IsTerminal(STDERR_FILENO) && !request.apply.isQuiet);
-    ApplyBins(request.apply, progress);
+    for (const std::string& unbinned : ApplyBins(request.apply, progress)) Tell(unbinned);
     return 0;
 }
 

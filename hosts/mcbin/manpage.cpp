@@ -1,13 +1,6 @@
 #include "hosts/mcbin/manpage.h"
 
-#include "hosts/mcbin/text.h"
-
-#include <CLI/CLI.hpp>
-
 #include <cctype>
-#include <ostream>
-#include <string>
-#include <vector>
 
 namespace
 {
@@ -32,54 +25,40 @@ std::string ToUpper(std::string text)
     return text;
 }
 
-void PrintOption(std::ostream& os, const CLI::Option& option)
+std::string MakeOptions(const CommandHelp& command)
 {
-    os << ".TP\n.B " << Escape(option.get_name(false, true)) << " \\fI" << Escape(option.get_option_text()) << "\\fR\n"
-       << Escape(option.get_description()) << '\n';
-}
-
-/// Options without a group are hidden ones.
-void PrintOptions(std::ostream& os, const CLI::App& app)
-{
-    for (const std::string& group : app.get_groups())
+    std::string page;
+    for (const OptionGroup& group : command.groups)
     {
-        const auto isInGroup = [&](const CLI::Option* option) { return option->get_group() == group; };
-        const std::vector<const CLI::Option*> options = app.get_options(isInGroup);
-        if (group.empty() || options.empty())
-            continue;
-        os << ".SS " << Escape(app.get_name() + ": " + group) << '\n';
-        for (const CLI::Option* const option : options) PrintOption(os, *option);
+        page += ".SS " + Escape(command.name + ": " + group.title) + "\n";
+        for (const OptionHelp& option : group.options)
+            page += ".TP\n.B " + Escape(option.name) + " \\fI" + Escape(option.argument) + "\\fR\n" +
+                    Escape(option.description) + "\n";
     }
+    return page;
 }
 
-/// A footer is made of parts, "Title:" with lines below it, or text alone.
-void PrintFooter(std::ostream& os, const CLI::App& app)
+std::string MakeFooter(const std::string& footer)
 {
-    os << ".PP\n.nf\n" << Escape(app.get_footer()) << "\n.fi\n";
+    return ".PP\n.nf\n" + Escape(footer) + "\n.fi\n";
+}
+
+std::string MakeSynopsis(const std::string& tool, const CommandHelp& command)
+{
+    std::string line = ".B " + tool + " " + Escape(command.name) + "\\fR";
+    for (const std::string& positional : command.positionals) line += " \\fI" + Escape(positional) + "\\fR";
+    return line + " [\\fIoptions\\fR]\n.br\n";
 }
 
 } // namespace
 
-void PrintManPage(std::ostream& os, const CLI::App& app)
+std::string MakeManPage(const ToolHelp& tool)
 {
-    const std::string& name = app.get_name();
-    os << ".TH " << ToUpper(name) << " 1\n.SH NAME\n"
-       << name << " \\- " << Escape(app.get_description()) << "\n.SH SYNOPSIS\n";
-    const std::vector<const CLI::App*> commands = app.get_subcommands([](const CLI::App*) { return true; });
-    for (const CLI::App* const command : commands)
-    {
-        os << ".B " << name << ' ' << Escape(command->get_name()) << "\\fR";
-        for (const CLI::Option* const option : command->get_options())
-            if (option->get_positional())
-                os << " \\fI" << Escape(option->get_name(true)) << "\\fR";
-        os << " [\\fIoptions\\fR]\n.br\n";
-    }
-    for (const CLI::App* const command : commands)
-    {
-        os << ".SH " << Escape(ToUpper(command->get_name())) << '\n' << Escape(command->get_description()) << ".\n";
-        PrintOptions(os, *command);
-        PrintFooter(os, *command);
-    }
-    os << ".SH NOTES\n";
-    PrintFooter(os, app);
+    std::string page = ".TH " + ToUpper(tool.name) + " 1\n.SH NAME\n" + tool.name + " \\- " + Escape(tool.description) +
+                       "\n.SH SYNOPSIS\n";
+    for (const CommandHelp& command : tool.commands) page += MakeSynopsis(tool.name, command);
+    for (const CommandHelp& command : tool.commands)
+        page += ".SH " + Escape(ToUpper(command.name)) + "\n" + Escape(command.description) + ".\n" +
+                MakeOptions(command) + MakeFooter(command.footer);
+    return page + ".SH NOTES\n" + MakeFooter(tool.footer);
 }

@@ -1,14 +1,42 @@
 #ifndef MCBIN_MANPAGE_H
 #define MCBIN_MANPAGE_H
 
-#include <iosfwd>
+#include <string>
+#include <vector>
 
-namespace CLI
+// What there is to tell of the tool, apart from how its command line is parsed.
+
+struct OptionHelp
 {
-class App;
-}
+    std::string name;
+    std::string argument; ///< what it is followed by; empty of a flag
+    std::string description;
+};
 
-/// Prints the help texts of the tool and of its commands as a manual page, in the language of man.
-void PrintManPage(std::ostream& os, const CLI::App& app);
+struct OptionGroup
+{
+    std::string title;
+    std::vector<OptionHelp> options;
+};
+
+struct CommandHelp
+{
+    std::string name;
+    std::string description;
+    std::vector<std::string> positionals;
+    std::vector<OptionGroup> groups;
+    std::string footer; ///< parts, each "Title:" with lines below it, or text alone
+};
+
+struct ToolHelp
+{
+    std::string name;
+    std::string description;
+    std::vector<CommandHelp> commands;
+    std::string footer;
+};
+
+/// The manual page, in the language of man.
+std::string MakeManPage(const ToolHelp& tool);
 
 #endif

@@ -1,7 +1,7 @@
 #include "hosts/mcbin/notes.h"
 
+#include "bins/bins.h"
 #include "bins/numbers.h"
-#include "hosts/mcbin/findings.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/recordsource.h"
 #include "hosts/mcbin/input/variables.h"
@@ -24,11 +24,11 @@ std::string DescribeMerged(const Column& column, const std::pair<std::string, st
 }
 
 /// The weight of all records, or nothing if no result tells of it.
-std::optional<double> FindTotalWeight(const Findings& findings)
+std::optional<double> FindTotalWeight(const Bins& bins)
 {
-    const auto isFound = [](const Result& result) { return !result.status.IsError(); };
-    const auto found = std::find_if(findings.results.begin(), findings.results.end(), isFound);
-    return found == findings.results.end() ? std::nullopt : std::optional(found->weightWithMissing);
+    const auto isFound = [](const AttributeBins& result) { return !result.status.IsError(); };
+    const auto found = std::find_if(bins.results.begin(), bins.results.end(), isFound);
+    return found == bins.results.end() ? std::nullopt : std::optional(found->weightWithMissing);
 }
 
 /// N of the criterion is the sum of the weights: the larger it is, the less gain a cut needs to be accepted.
@@ -51,7 +51,7 @@ std::string DescribeOrnamented(const Column& column)
 
 } // namespace
 
-std::vector<std::string> MakeNotes(const Findings& findings, const ColumnPlan& plan, const Variables& variables,
+std::vector<std::string> MakeNotes(const Bins& bins, const ColumnPlan& plan, const Variables& variables,
                                    const TableRecordSource& source)
 {
     constexpr double kFar = 2.0;
@@ -65,9 +65,9 @@ std::vector<std::string> MakeNotes(const Findings& findings, const ColumnPlan& p
         if (const MergeWatch::Merged& merged = source.GetMergeWatch(i).GetMerged(); merged && column.isAttribute)
             notes.push_back(DescribeMerged(column, *merged));
     }
-    const std::optional<double> weight = FindTotalWeight(findings);
+    const std::optional<double> weight = FindTotalWeight(bins);
     const auto records = static_cast<double>(source.CountWeighted());
-    if (findings.settings.method == Method::kSupervised && weight && records > 0.0 &&
+    if (bins.settings.method == Method::kSupervised && weight && records > 0.0 &&
         (*weight > kFar * records || *weight < records / kFar))
         notes.push_back(DescribeWeights(*weight, source.CountWeighted()));
     return notes;

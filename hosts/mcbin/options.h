@@ -1,7 +1,8 @@
 #ifndef MCBIN_OPTIONS_H
 #define MCBIN_OPTIONS_H
 
-#include "bins/weightgrid.h"
+#include "bins/bins.h"
+#include "bins/sql.h"
 #include "hosts/mcbin/input/tablereader.h"
 
 #include <string>
@@ -26,22 +27,6 @@ struct ColumnOptions
     bool isBadMissing = false;        ///< what is no number, where it should be one, is missing and no failure
 };
 
-enum class Method
-{
-    kSupervised,
-    kEqualFrequency
-};
-
-struct SettingOptions
-{
-    Method method = Method::kSupervised;
-    int bins = 0;               ///< at least 2
-    int distinctThreshold = -1; ///< supervised only; below 0 for never
-    bool isRightClosed = true;
-    double smallBins = 0.0;    ///< supervised only; from 0 to 1
-    std::string tempDirectory; ///< empty for the library's default
-};
-
 enum class Format
 {
     kTable,
@@ -53,7 +38,8 @@ enum class Format
 struct OutputOptions
 {
     Format format = Format::kTable;
-    std::string report;    ///< the file for the page; empty for none
+    std::string report; ///< the file for the page; empty for none
+    SqlDialect dialect = SqlDialect::kStandard;
     bool isStrict = false; ///< the exit code tells of a warning
     bool isQuiet = false;  ///< no progress line, even on a terminal
 };
@@ -62,7 +48,8 @@ struct BinOptions
 {
     TableOptions table;
     ColumnOptions columns;
-    SettingOptions settings;
+    Settings settings;
+    std::string tempDirectory; ///< empty for the library's default
     OutputOptions output;
 };
 

@@ -6,17 +6,17 @@
 #include "tests/fuzz/mcbin.h"
 #include "tests/support/tempdir.h"
 
+#include "bins/csv.h"
+#include "bins/json.h"
+#include "bins/labels.h"
+#include "bins/numbers.h"
+#include "bins/sql.h"
 #include "hosts/mcbin/apply.h"
 #include "hosts/mcbin/commandline.h"
 #include "hosts/mcbin/failure.h"
-#include "hosts/mcbin/figures.h"
-#include "hosts/mcbin/findings.h"
 #include "hosts/mcbin/input/jsoninput.h"
 #include "hosts/mcbin/input/tablereader.h"
-#include "hosts/mcbin/output/csvoutput.h"
 #include "hosts/mcbin/output/htmlreport.h"
-#include "hosts/mcbin/output/jsonoutput.h"
-#include "hosts/mcbin/output/sqloutput.h"
 #include "hosts/mcbin/output/tableoutput.h"
 #include "hosts/mcbin/progress.h"
 #include "hosts/mcbin/run.h"
@@ -41,29 +41,31 @@ std::optional<BinOptions> Parse(const std::string& line, const TempDir& director
 {
     std::istringstream stream(line);
     std::vector<std::string> words;
-    for (std::string word; stream >> word;) words.insert(words.begin(), word); // backwards, as CLI11 takes them
-    words.insert(words.begin(), "DATA");
+    words.emplace_back("mcbin");
+    for (std::string word; stream >> word;) words.push_back(word);
+    words.emplace_back("DATA");
+    std::vector<const char*> arguments;
+    for (const std::string& word : words) arguments.push_back(word.c_str());
     Request request;
-    const std::unique_ptr<CLI::App> app = MakeCommandLine(request);
     try
     {
-        app->parse(words);
+        request = ParseCommandLine(static_cast<int>(arguments.size()), arguments.data());
     }
-    catch (const CLI::Error&) // help is one, too
+    catch (const UsageError&)
     {
         return std::nullopt;
     }
-    if (request.isManPage || request.command == Request::Command::kApply)
+    if (request.command == Request::Command::kText || request.command == Request::Command::kApply)
         return std::nullopt;
     BinOptions options = request.bin;
     options.table.file = directory.File("table.csv");
     options.table.isReadTwice = true;
-    options.settings.tempDirectory = directory.Path();
+    options.tempDirectory = directory.Path();
     options.output = {};
     return options;
 }
 
-std::optional<Findings> Find(const BinOptions& options)
+std::optional<Outcome> Find(const BinOptions& options)
 {
     Progress progress(false);
     try
@@ -77,32 +79,13 @@ std::optional<Findings> Find(const BinOptions& options)
     }
 }
 
-void PrintAll(const Findings& findings)
+void PrintAll(const Outcome& outcome)
 {
     std::ostringstream os;
-    PrintTables(os, findings, {80, true});
-    PrintCsv(os, findings);
-    PrintSql(os, findings);
-    PrintHtml(os, findings);
-}
-
-bool HasCuts(const Result& result)
-{
-    return !result.cutPoints.empty();
-}
-
-/// Whether a new column would have the name of another one.
-bool IsTaken(const Findings& findings, std::vector<std::string> names)
-{
-    for (const Result& result : findings.results)
-    {
-        if (!HasCuts(result))
-            continue;
-        names.push_back(GetBinColumn(findings, result));
-        if (std::count(names.begin(), names.end(), names.back()) > 1)
-            return true;
-    }
-    return false;
+    PrintTables(os, outcome, {80, true});
+    PrintHtml(os, outcome);
+    ToCsv(outcome.bins);
+    ToSql(outcome.bins, {SqlDialect::kDuckDb, true});
 }
 
 ApplyOptions MakeApplyOptions(const BinOptions& options, const TempDir& directory, char delimiter)
@@ -120,37 +103,47 @@ ApplyOptions MakeApplyOptions(const BinOptions& options, const TempDir& director
 /// A result, the weights of whose bins are counted again in the table with the new columns.
 struct Recount
 {
-    const Result* result;
-    std::size_t place;                        ///< of the column with the bins
+    const AttributeBins* result;
+    std::size_t position;                     ///< of the column with the bins
     std::optional<std::size_t> target;        ///< the column of the target
     std::map<std::string, std::size_t> codes; ///< of the target
     std::vector<std::vector<double>> weights;
 };
 
-Recount MakeRecount(const TableReader& table, const Findings& findings, const Result& result)
+Recount MakeRecount(const TableReader& table, const BinColumn& column)
 {
-    Recount recount{&result, table.FindColumn(GetBinColumn(findings, result)), std::nullopt, {}, {}};
+    const AttributeBins& bins = *column.bins;
+    Recount recount{&bins, table.FindColumn(column.name), std::nullopt, {}, {}};
     std::size_t numCodes = 1;
-    if (const Variable* const target = findings.FindTarget(result))
+    if (bins.target)
     {
-        recount.target = table.FindColumn(target->name);
-        for (const std::string& category : target->categories) recount.codes.emplace(category, recount.codes.size());
-        numCodes = target->categories.size();
+        recount.target = table.FindColumn(bins.target->name);
+        for (const std::string& category : bins.target->categories)
+            recount.codes.emplace(category, recount.codes.size());
+        numCodes = bins.target->categories.size();
     }
-    recount.weights.assign(result.bins.size(), std::vector<double>(numCodes, 0.0));
+    recount.weights.assign(bins.bins.size(), std::vector<double>(numCodes, 0.0));
     return recount;
+}
+
+/// The category that the field of a target stands for.
+std::string ToCategory(const Variable& target, std::string_view field)
+{
+    const std::optional<double> number = ParseNumber(field);
+    const bool isNumber = target.kind == VariableKind::kNumericCategorical && number;
+    return isNumber ? FormatNumber(*number + 0.0) : std::string(field);
 }
 
 void Count(Recount& recount, const CsvRow& row)
 {
-    const std::string bin(row[recount.place]);
+    const std::string bin(row[recount.position]);
     if (bin.empty())
         return;
     Check(std::stoul(bin) < recount.weights.size(), "a bin that there is not");
     std::size_t code = 0;
     if (recount.target)
     {
-        const auto found = recount.codes.find(std::string(row[*recount.target]));
+        const auto found = recount.codes.find(ToCategory(*recount.result->target, row[*recount.target]));
         if (found == recount.codes.end())
             return; // missing
         code = found->second;
@@ -164,28 +157,28 @@ void CheckRecount(const Recount& recount)
     {
         const Bin& bin = recount.result->bins[i];
         if (recount.weights[i] != (recount.target ? bin.weights : std::vector<double>{bin.weight}))
-            Fail("the weight of bin " + std::to_string(i) + " of " + std::to_string(recount.result->attribute));
+            Fail("the weight of bin " + std::to_string(i) + " of " + recount.result->attribute->name);
     }
 }
 
-void CheckBinned(const Findings& findings, const ApplyOptions& apply)
+void CheckBinned(const Bins& bins, const std::vector<std::string>& taken, const ApplyOptions& apply)
 {
     TableOptions options;
     options.file = apply.output;
     options.delimiter = apply.table.delimiter;
     TableReader table(options);
     std::vector<Recount> recounts;
-    for (const Result& result : findings.results)
-        if (HasCuts(result))
-            recounts.push_back(MakeRecount(table, findings, result));
+    for (const BinColumn& column : MakeBinColumns(bins, taken)) recounts.push_back(MakeRecount(table, column));
     while (const CsvRow* const row = table.NextRow())
+    {
         for (Recount& recount : recounts) Count(recount, *row);
+    }
     for (const Recount& recount : recounts) CheckRecount(recount);
 }
 
-void CheckSums(const Findings& findings)
+void CheckSums(const Bins& bins)
 {
-    for (const Result& result : findings.results)
+    for (const AttributeBins& result : bins.results)
     {
         Check(result.bins.empty() || result.bins.size() == result.cutPoints.size() + 1, "number of bins");
         Check(std::adjacent_find(result.cutPoints.begin(), result.cutPoints.end(),
@@ -206,29 +199,25 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* bytes, std::size_t siz
         return -1; // not worth keeping
     WriteFile(options->table.file, text.substr(std::min(end + 1, text.size())));
 
-    const std::optional<Findings> findings = Find(*options);
-    if (!findings)
+    const std::optional<Outcome> outcome = Find(*options);
+    if (!outcome)
         return 0;
-    CheckSums(*findings);
-    PrintAll(*findings);
-    std::ostringstream json;
-    PrintJson(json, *findings);
+    const Bins& bins = outcome->bins;
+    CheckSums(bins);
+    PrintAll(*outcome);
+    const std::string json = ToJson(bins);
     TableReader table(options->table);
     const ApplyOptions apply = MakeApplyOptions(*options, directory, table.GetDelimiter());
-    WriteFile(apply.bins, json.str());
-    const Findings readBack = ReadJson(apply.bins);
-    std::ostringstream jsonAgain;
-    PrintJson(jsonAgain, readBack);
+    WriteFile(apply.bins, json);
     // As documents, since -0 is read as a whole number, and so as 0.
-    Check(nlohmann::json::parse(json.str()) == nlohmann::json::parse(jsonAgain.str()),
+    Check(nlohmann::json::parse(json) == nlohmann::json::parse(ToJson(ReadJson(apply.bins))),
           "JSON that is read and written again differs");
 
-    const auto& results = findings->results;
-    if (std::none_of(results.begin(), results.end(), HasCuts) || IsTaken(*findings, table.GetColumnNames()))
+    if (MakeBinColumns(bins, {}).empty())
         return 0;
     Progress progress(false);
     ApplyBins(apply, progress);
     if (options->columns.weight.empty())
-        CheckBinned(*findings, apply);
+        CheckBinned(bins, table.GetColumnNames(), apply);
     return 0;
 }

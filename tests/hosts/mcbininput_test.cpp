@@ -90,7 +90,7 @@ TEST_F(McbinInput, OrderOfRowsMakesNoDifference)
     const Outcome outcome = Run("supervised " + iris + " --target species --format csv");
 
     EXPECT_NE(std::string::npos,
-              outcome.out.find("petal_length,species,1,\"(1.9, 4.7]\",1.9,4.7,right,45,0.3,0,44,1\n"));
+              outcome.out.find("petal_length,species,1,\"(1.9, 4.7]\",1.9,4.7,right,45,0.3,,,,0,44,1\n"));
     EXPECT_EQ(outcome.out, Run("supervised sorted.csv --target species --format csv").out);
 }
 
@@ -331,15 +331,15 @@ TEST_F(McbinInput, PairsBinForSeveralTargetsInOnePass)
 
     const Outcome outcome = RunOn(data, "supervised", "--pairs '*:p' --pairs b:q,a:p --format csv");
 
-    EXPECT_EQ(
-        "attribute,target,bin,label,left,right,closed,weight,share,weight:p=no,weight:p=yes,weight:q=hi,weight:q=lo\n"
-        "a,p,0,\"(-inf, 19]\",-inf,19,right,20,0.5,20,0,,\n"
-        "a,p,1,\"(19, +inf)\",19,inf,right,20,0.5,0,20,,\n"
-        "b,p,0,\"(-inf, -20]\",-inf,-20,right,20,0.5,0,20,,\n"
-        "b,p,1,\"(-20, +inf)\",-20,inf,right,20,0.5,20,0,,\n"
-        "b,q,0,\"(-inf, -10]\",-inf,-10,right,30,0.75,,,30,0\n"
-        "b,q,1,\"(-10, +inf)\",-10,inf,right,10,0.25,,,0,10\n",
-        outcome.out)
+    EXPECT_EQ("attribute,target,bin,label,left,right,closed,weight,share,rate,woe,iv,weight:p=no,weight:p=yes,weight:q="
+              "hi,weight:q=lo\n"
+              "a,p,0,\"(-inf, 19]\",-inf,19,right,20,0.5,0,-inf,inf,20,0,,\n"
+              "a,p,1,\"(19, +inf)\",19,inf,right,20,0.5,1,inf,inf,0,20,,\n"
+              "b,p,0,\"(-inf, -20]\",-inf,-20,right,20,0.5,1,inf,inf,0,20,,\n"
+              "b,p,1,\"(-20, +inf)\",-20,inf,right,20,0.5,0,-inf,inf,20,0,,\n"
+              "b,q,0,\"(-inf, -10]\",-inf,-10,right,30,0.75,0,-inf,inf,,,30,0\n"
+              "b,q,1,\"(-10, +inf)\",-10,inf,right,10,0.25,1,inf,inf,,,0,10\n",
+              outcome.out)
         << outcome.err;
     EXPECT_EQ(1, RunOn(data, "supervised", "--pairs a:none").exitCode);
 }

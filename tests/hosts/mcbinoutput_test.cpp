@@ -92,10 +92,10 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
     json.replace(version, json.find(')', version) - version, "(V");
     EXPECT_EQ(R"json({
   "schema": "mcobnqrt-bins",
-  "schema_version": 2,
+  "schema_version": 3,
   "component_version": "Supervised Binning Component Ver. 1.0 (V)",
   "method": "supervised",
-  "settings": {"closed": "right", "bins": 1000, "distinct_threshold": null, "small_bins": 0},
+  "settings": {"closed": "right", "n_bins": 1000, "max_distinct": null, "small_bin_ratio": 0},
   "data": {"name": "data.csv", "records": 4, "records_without_weight": 0, "missing_text": ["NA", "-9"]},
   "variables": [
     {
@@ -106,7 +106,9 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "categories": null,
       "rounding": null,
       "grid": null,
-      "missing": {"values": [7, -9], "texts": ["unknown"], "interval": [90, "inf"]}
+      "missing": {"values": [7, -9], "texts": ["unknown"], "interval": [90, "inf"]},
+      "value_kind": null,
+      "time_zone": ""
     },
     {
       "name": "y",
@@ -116,7 +118,9 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "categories": ["a", "b"],
       "rounding": null,
       "grid": null,
-      "missing": {"values": [], "texts": [], "interval": null}
+      "missing": {"values": [], "texts": [], "interval": null},
+      "value_kind": null,
+      "time_zone": ""
     },
     {
       "name": "w",
@@ -126,7 +130,9 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "categories": null,
       "rounding": "none",
       "grid": null,
-      "missing": {"values": [-9], "texts": [], "interval": null}
+      "missing": {"values": [-9], "texts": [], "interval": null},
+      "value_kind": null,
+      "time_zone": ""
     }
   ],
   "status": {"code": 120018, "severity": "warning", "words": "some results carry a warning or an error", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
@@ -142,9 +148,10 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "maximum": 0.30000000000000004,
       "target_entropy": 0,
       "model_entropy": 0,
+      "information_value": null,
       "cut_points": [],
       "bins": [
-        {"left": "-inf", "right": "inf", "weight": 2, "weights": [2, 0]}
+        {"left": "-inf", "right": "inf", "weight": 2, "weights": [2, 0], "rate": null, "woe": null, "iv": null}
       ]
     }
   ]
@@ -163,7 +170,7 @@ TEST_F(McbinOutput, ThePageHasTheFiguresOfTheTables)
     const std::string cells = CollectNumbers(bins);
     const Outcome expected =
         Shell("mcbin supervised data.csv --target kind --format csv | grep '^age' | sed 's/\"[^\"]*\"//' | "
-              "cut -d, -f8,10- | tr , '\\n'");
+              "cut -d, -f8,13- | tr , '\\n'");
     EXPECT_EQ(expected.out, cells);
     EXPECT_NE(std::string::npos, page.find("retired &amp; &lt;old&gt;"));
     EXPECT_EQ(std::string::npos, page.find("<script"));

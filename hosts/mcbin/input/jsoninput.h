@@ -1,12 +1,12 @@
 #ifndef MCBIN_JSONINPUT_H
 #define MCBIN_JSONINPUT_H
 
-#include "hosts/mcbin/findings.h"
+#include "bins/bins.h"
 
 #include <string>
 
-/// Reads what PrintJson(), or another program that keeps to docs/json.md, has written.
+/// Reads what ToJson(), or another program that keeps to docs/json.md, has written.
 /// \throw Failure if the file can't be read, isn't JSON, or isn't of the form.
-Findings ReadJson(const std::string& path);
+Bins ReadJson(const std::string& path);
 
 #endif

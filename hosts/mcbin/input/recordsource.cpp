@@ -7,8 +7,6 @@
 #include "hosts/mcbin/input/variables.h"
 #include "hosts/mcbin/progress.h"
 
-#include <mcobnqrt/binstringencoder.h>
-
 #include <cmath>
 
 namespace
@@ -16,22 +14,19 @@ namespace
 
 constexpr const char* kChanged = "the file has changed while it was read";
 
-/// A weight has an encoder, too, but its field is the weight as it is.
-const BINStringEncoder* FindEncoder(const BINVarList& list, int index)
-{
-    return dynamic_cast<const BINStringEncoder*>(list.GetEncoderAt(index));
-}
-
 } // namespace
 
-TableRecordSource::TableRecordSource(TableReader& table, const ColumnPlan& plan, const Variables& variables,
+TableRecordSource::TableRecordSource(TableReader& table, const ColumnPlan& plan, Variables& variables,
                                      Progress& progress)
     : fTable(table), fPlan(plan), fProgress(progress), fWeightGrid(plan.weights), fValues(variables.columns.size()),
       fRowsLeft(plan.nRows), fRecord(static_cast<int>(variables.columns.size()))
 {
     for (std::size_t i = 0; i < variables.columns.size(); ++i)
+    {
+        std::optional<Categories>& categories = variables.categories[i];
         fFields.push_back({variables.columns[i], &plan.columns[variables.columns[i]],
-                           FindEncoder(variables.list, static_cast<int>(i)), MergeWatch()});
+                           categories ? &*categories : nullptr, MergeWatch()});
+    }
     fTable.Rewind();
 }
 
@@ -52,7 +47,7 @@ const MCCommon::Record* TableRecordSource::Next()
     if (!HasNext())
         return nullptr;
     for (std::size_t i = 0; i < fFields.size(); ++i)
-        fRecord[static_cast<int>(i)] = Convert(fFields[i], (*fRow)[fFields[i].place], fValues[i]);
+        fRecord[static_cast<int>(i)] = Convert(fFields[i], (*fRow)[fFields[i].position], fValues[i]);
     --fRowsLeft;
     fRow = nullptr;
     return &fRecord;
@@ -62,7 +57,7 @@ double TableRecordSource::Convert(Field& field, std::string_view text, InfiniteV
 {
     if (fPlan.IsMissing(*field.column, text))
         return MCMV::gMissingValue;
-    if (field.encoder)
+    if (field.categories)
         return ConvertCategory(field, text);
     const double number = ParseNumberOrNaN(text);
     if (!std::isnan(number))
@@ -90,11 +85,10 @@ double TableRecordSource::ConvertNumber(const Field& field, double number, Infin
     return fWeightGrid.Round(number);
 }
 
-double TableRecordSource::ConvertCategory(const Field& field, std::string_view text)
+double TableRecordSource::ConvertCategory(Field& field, std::string_view text)
 {
-    fCategory = text;
-    const double code = field.encoder->EncodeConst(fCategory);
-    if (code < 0.0)
+    const std::optional<double> code = field.categories->FindCode(text);
+    if (!code)
         throw fTable.MakeFailure(fRow->GetLine(), kChanged);
-    return code;
+    return *code;
 }

@@ -13,7 +13,7 @@
 #include <string_view>
 #include <vector>
 
-class BINStringEncoder;
+class Categories;
 class CsvRow;
 class Progress;
 class TableReader;
@@ -30,7 +30,7 @@ class TableRecordSource : public IBINRecordSource
 public:
     /// `table` has been read to its end once, to complete `plan`, from which `variables` have been made. All are the
     /// caller's and outlive this object.
-    TableRecordSource(TableReader& table, const ColumnPlan& plan, const Variables& variables, Progress& progress);
+    TableRecordSource(TableReader& table, const ColumnPlan& plan, Variables& variables, Progress& progress);
 
     bool HasNext() override;
 
@@ -51,15 +51,15 @@ public:
 private:
     struct Field
     {
-        std::size_t place;               ///< of the column in the table
-        const Column* column;            ///< the same
-        const BINStringEncoder* encoder; ///< null for a number
+        std::size_t position; ///< of the column in the table
+        const Column* column;
+        Categories* categories; ///< null for a number
         MergeWatch merges;
     };
 
     double Convert(Field& field, std::string_view text, InfiniteValues& values);
     double ConvertNumber(const Field& field, double number, InfiniteValues& values);
-    double ConvertCategory(const Field& field, std::string_view text);
+    double ConvertCategory(Field& field, std::string_view text);
 
     TableReader& fTable;
     const ColumnPlan& fPlan;
@@ -71,7 +71,6 @@ private:
     long fRowsLeft;                      ///< how many more rows there should be
     long fNumWeighted = 0;
     MCCommon::Record fRecord;
-    std::string fCategory; ///< kept for its memory
 };
 
 #endif

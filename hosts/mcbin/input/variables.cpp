@@ -15,29 +15,29 @@
 namespace
 {
 
-std::vector<std::string> GetCategories(const Column& column)
+void ThrowIfTooFew(const Column& column, const std::vector<std::string>& categories)
 {
     const std::string what = column.isTarget ? "target" : "categorical attribute";
-    if (column.categories.empty())
+    if (categories.empty())
         throw Failure("column " + Quote(column.name) + " has no value; a " + what + " needs at least 2 categories");
-    if (column.categories.size() == 1)
-        throw Failure("column " + Quote(column.name) + " has a single category, " + Quote(*column.categories.begin()) +
-                      "; a " + what + " needs at least 2");
-    return {column.categories.begin(), column.categories.end()};
+    if (categories.size() == 1)
+        throw Failure("column " + Quote(column.name) + " has a single category, " + Quote(categories.front()) + "; a " +
+                      what + " needs at least 2");
 }
 
 /// Neither of the named options: the library counts a weight as the record source hands it on, rounded by then.
 constexpr auto kUnrounded = static_cast<IBINVariable::BINWRoundingOption>(2);
 
-/// With a list of pairs no variable is the target of the list.
-int AddVariable(BINVarList& list, const Column& column, bool hasPairs)
+/// With a list of pairs no variable is the target of the list. `categories` are null for a column that has none.
+int AddVariable(BINVarList& list, const Column& column, const Categories* categories, bool hasPairs)
 {
     if (column.isWeight)
         return list.AddWeightVar(column.name, "", kUnrounded);
-    if (column.kind == ColumnKind::kContinuous)
+    if (!categories)
         return list.AddContVar(column.name, "", IBINVariable::RoleAttribute);
+    ThrowIfTooFew(column, categories->GetNames());
     const bool isTarget = column.isTarget && !hasPairs;
-    return list.AddCatVar(column.name, "", GetCategories(column),
+    return list.AddCatVar(column.name, "", categories->GetNames(),
                           isTarget ? IBINVariable::RoleTarget : IBINVariable::RoleAttribute);
 }
 
@@ -49,19 +49,14 @@ double GetEnd(double end)
 }
 
 /// The record source leaves out the missing values of a weight, as the library would look for them among the rounded
-/// ones.
-void DeclareMissing(BINVarList& list, int index, const Column& column)
+/// ones, and those of a categorical column.
+void DeclareMissing(BINVarList& list, int index, const Column& column, const Categories* categories)
 {
-    if (column.isWeight)
+    if (categories && !categories->AreNumbers() && column.missingInterval)
+        throw Failure("column " + Quote(column.name) +
+                      " is categorical, and so its missing values can't be declared as an interval");
+    if (column.isWeight || categories)
         return;
-    if (column.kind == ColumnKind::kCategorical)
-    {
-        for (const std::string& text : column.missingTexts) list.AddDiscreteUserMissing(index, text, "");
-        if (column.missingInterval)
-            throw Failure("column " + Quote(column.name) +
-                          " is categorical, and so its missing values can't be declared as an interval");
-        return;
-    }
     for (const double number : column.missingNumbers) list.AddDiscreteUserMissing(index, EncodeInfinity(number), "");
     if (column.missingInterval)
         list.SetMissingInterval(index, GetEnd(column.missingInterval->first), GetEnd(column.missingInterval->second));
@@ -78,6 +73,48 @@ void AddPairs(Variables& variables, const ColumnPlan& plan, const std::vector<in
     }
 }
 
+VariableRole GetRole(const Column& column, bool hasPairs)
+{
+    if (column.isWeight)
+        return VariableRole::kWeight;
+    return column.isTarget && !hasPairs ? VariableRole::kTarget : VariableRole::kAttribute;
+}
+
+VariableKind GetKind(const Column& column, const Categories* categories)
+{
+    if (column.isWeight)
+        return VariableKind::kWeight;
+    if (!categories)
+        return VariableKind::kContinuous;
+    return categories->AreNumbers() ? VariableKind::kNumericCategorical : VariableKind::kStringCategorical;
+}
+
+Variable DescribeVariable(const Column& column, const Categories* categories, const ColumnPlan& plan)
+{
+    Variable variable;
+    variable.name = column.name;
+    variable.role = GetRole(column, !plan.pairs.empty());
+    variable.kind = GetKind(column, categories);
+    if (column.isWeight)
+        variable.rounding = plan.weights.rounding;
+    if (categories)
+        variable.categories = categories->GetNames();
+    if (variable.kind == VariableKind::kStringCategorical)
+    {
+        variable.missingTexts = column.missingTexts;
+        return variable;
+    }
+    variable.missingNumbers = column.missingNumbers;
+    variable.missingInterval = column.missingInterval;
+    // The numbers among the texts are told as numbers.
+    for (const std::string& text : column.missingTexts)
+    {
+        if (!ParseNumber(text))
+            variable.missingTexts.push_back(text);
+    }
+    return variable;
+}
+
 } // namespace
 
 Variables MakeVariables(const ColumnPlan& plan)
@@ -91,9 +128,13 @@ Variables MakeVariables(const ColumnPlan& plan)
         if (!column.IsUsed())
             continue;
         hasAttribute = hasAttribute || column.isAttribute;
-        variableOfColumn[i] = AddVariable(variables.list, column, !plan.pairs.empty());
-        DeclareMissing(variables.list, variableOfColumn[i], column);
         variables.columns.push_back(i);
+        std::optional<Categories>& categories = variables.categories.emplace_back();
+        if (column.kind == ColumnKind::kCategorical && !column.isWeight)
+            categories.emplace(column);
+        const Categories* const known = categories ? &*categories : nullptr;
+        variableOfColumn[i] = AddVariable(variables.list, column, known, !plan.pairs.empty());
+        DeclareMissing(variables.list, variableOfColumn[i], column, known);
     }
     if (!hasAttribute)
     {
@@ -106,4 +147,17 @@ Variables MakeVariables(const ColumnPlan& plan)
     }
     AddPairs(variables, plan, variableOfColumn);
     return variables;
+}
+
+std::vector<std::shared_ptr<const Variable>> DescribeVariables(const ColumnPlan& plan, const Variables& variables)
+{
+    std::vector<std::shared_ptr<const Variable>> described;
+    for (std::size_t i = 0; i < variables.columns.size(); ++i)
+    {
+        const std::optional<Categories>& categories = variables.categories[i];
+        const Column& column = plan.columns[variables.columns[i]];
+        described.push_back(
+            std::make_shared<const Variable>(DescribeVariable(column, categories ? &*categories : nullptr, plan)));
+    }
+    return described;
 }

@@ -1,9 +1,10 @@
 #include "hosts/mcbin/output/bintable.h"
 
+#include "bins/labels.h"
+#include "bins/measures.h"
 #include "bins/numbers.h"
 #include "bins/utf8.h"
-#include "hosts/mcbin/figures.h"
-#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/output/sharebar.h"
 #include "hosts/mcbin/text.h"
 
@@ -29,18 +30,31 @@ constexpr std::size_t kMostCategoryColumns = 12;
 /// What a table shows beside the bin, its weight and its share.
 struct Extent
 {
-    std::size_t nCategories; ///< how many have a column of their own; the others share one, unless this is 0
-    std::size_t nRates;      ///< how many of rate, weight of evidence and information value, in this order
+    std::size_t numCategories; ///< how many have a column of their own; the others share one, unless this is 0
+    std::size_t numRates;      ///< how many of rate, weight of evidence and information value, in this order
     bool hasBar;
     std::size_t labelWidth; ///< a set of categories is cut off at it
 };
 
-Extent MakeWidest(const Findings& findings, const Result& result, const Screen& screen)
+/// The bins, and what is said of them in every table, however wide it is.
+struct Content
+{
+    explicit Content(const AttributeBins& attributeBins)
+        : bins(attributeBins), labels(MakeLabels(bins)), evidence(ComputeEvidence(bins))
+    {
+    }
+
+    const AttributeBins& bins;
+    std::vector<std::string> labels;
+    std::vector<Evidence> evidence; ///< by bin; empty unless the target has two categories
+};
+
+Extent MakeWidest(const Content& content, const Screen& screen)
 {
     constexpr std::size_t kNumRates = 3;
-    const Variable* const target = findings.FindTarget(result);
+    const Variable* const target = content.bins.target.get();
     return {std::min(kMostCategoryColumns, target ? target->categories.size() : 0),
-            HasTwoCategories(findings, result) ? kNumRates : 0, true,
+            content.evidence.empty() ? 0 : kNumRates, true,
             std::min(kWidestLabel, screen.width.value_or(2 * kWidestLabel) / 2)};
 }
 
@@ -48,37 +62,36 @@ Extent MakeWidest(const Findings& findings, const Result& result, const Screen& 
 /// \return false if there is nothing more to give up.
 bool Narrow(Extent& extent)
 {
-    if (extent.nCategories > 1 && extent.nRates == 0)
-        --extent.nCategories;
+    if (extent.numCategories > 1 && extent.numRates == 0)
+        --extent.numCategories;
     else if (extent.hasBar)
         extent.hasBar = false;
-    else if (extent.nCategories > 0)
-        extent.nCategories = 0;
-    else if (extent.nRates > 0)
-        --extent.nRates;
+    else if (extent.numCategories > 0)
+        extent.numCategories = 0;
+    else if (extent.numRates > 0)
+        --extent.numRates;
     else
         return false;
     return true;
 }
 
-std::vector<std::string> MakeHead(const Findings& findings, const Result& result, const std::vector<std::size_t>& codes,
+std::vector<std::string> MakeHead(const AttributeBins& bins, const std::vector<std::size_t>& codes,
                                   const Extent& extent)
 {
     const std::vector<std::string> rates{"rate", "WoE", "IV"};
     std::vector<std::string> head{"bin", "weight", "share"};
-    for (const std::size_t code : codes)
-        head.push_back(Printable(Shorten(findings.FindTarget(result)->categories[code])));
-    if (!codes.empty() && codes.size() < findings.FindTarget(result)->categories.size())
+    for (const std::size_t code : codes) head.push_back(Printable(Shorten(bins.target->categories[code])));
+    if (!codes.empty() && codes.size() < bins.target->categories.size())
         head.emplace_back("others");
-    head.insert(head.end(), rates.begin(), rates.begin() + static_cast<std::ptrdiff_t>(extent.nRates));
+    head.insert(head.end(), rates.begin(), rates.begin() + static_cast<std::ptrdiff_t>(extent.numRates));
     return head;
 }
 
 /// The interval, or as many of the bin's categories as have room.
-std::string MakeLabel(const Findings& findings, const Result& result, const Bin& bin, std::size_t width)
+std::string MakeLabel(const Content& content, std::size_t index, std::size_t width)
 {
-    std::string label = Printable(FormatBin(findings, result, bin));
-    std::vector<std::string> categories = GetBinCategories(findings, result, bin);
+    std::string label = Printable(content.labels[index]);
+    std::vector<std::string> categories = ListCategories(content.bins, index);
     if (categories.empty() || GetWidth(label) <= width)
         return label;
     for (std::string& category : categories) category = Printable(Shorten(category, width / 2));
@@ -104,19 +117,19 @@ void AppendCategories(std::vector<std::string>& row, const Bin& bin, const std::
         row.push_back(FormatWeight(others));
 }
 
-std::vector<std::string> MakeRow(const Findings& findings, const Result& result, const Bin& bin,
-                                 const std::vector<double>& categoryWeights, const std::vector<std::size_t>& codes,
+std::vector<std::string> MakeRow(const Content& content, std::size_t index, const std::vector<std::size_t>& codes,
                                  const Extent& extent)
 {
-    std::vector<std::string> row{MakeLabel(findings, result, bin, extent.labelWidth), FormatWeight(bin.weight),
-                                 fmt::format("{:.1f}%", 100.0 * GetShare(bin.weight, result.weight))};
+    const Bin& bin = content.bins.bins[index];
+    std::vector<std::string> row{MakeLabel(content, index, extent.labelWidth), FormatWeight(bin.weight),
+                                 fmt::format("{:.1f}%", 100.0 * ComputeShare(bin.weight, content.bins.weight))};
     AppendCategories(row, bin, codes);
-    if (extent.nRates > 0)
-        row.push_back(fmt::format("{:.1f}%", 100.0 * GetShare(bin.weights[1], bin.weight)));
-    if (extent.nRates > 1)
-        row.push_back(fmt::format("{:+.3f}", GetWeightOfEvidence(bin, categoryWeights)));
-    if (extent.nRates > 2)
-        row.push_back(fmt::format("{:.4f}", GetInformationValue(bin, categoryWeights)));
+    if (extent.numRates > 0)
+        row.push_back(fmt::format("{:.1f}%", 100.0 * content.evidence[index].rate));
+    if (extent.numRates > 1)
+        row.push_back(fmt::format("{:+.3f}", content.evidence[index].weightOfEvidence));
+    if (extent.numRates > 2)
+        row.push_back(fmt::format("{:.4f}", content.evidence[index].informationValue));
     return row;
 }
 
@@ -136,12 +149,11 @@ std::string Align(const std::vector<std::string>& row, const std::vector<std::si
     return line;
 }
 
-Rows MakeRows(const Findings& findings, const Result& result, const Extent& extent)
+Rows MakeRows(const Content& content, const Extent& extent)
 {
-    const std::vector<double> categoryWeights = GetCategoryWeights(result);
-    const std::vector<std::size_t> codes = GetHeaviest(categoryWeights, extent.nCategories);
-    Rows rows{MakeHead(findings, result, codes, extent)};
-    for (const Bin& bin : result.bins) rows.push_back(MakeRow(findings, result, bin, categoryWeights, codes, extent));
+    const std::vector<std::size_t> codes = FindHeaviest(SumByCategory(content.bins), extent.numCategories);
+    Rows rows{MakeHead(content.bins, codes, extent)};
+    for (std::size_t i = 0; i < content.bins.bins.size(); ++i) rows.push_back(MakeRow(content, i, codes, extent));
     return rows;
 }
 
@@ -156,26 +168,27 @@ std::optional<std::size_t> GetRoom(const Rows& rows, const Screen& screen)
 
 } // namespace
 
-void PrintBinTable(std::ostream& os, const Findings& findings, const Result& result, const Screen& screen)
+void PrintBinTable(std::ostream& os, const AttributeBins& bins, const Screen& screen)
 {
     constexpr std::size_t kGap = 2; // in front of the bar
-    Extent extent = MakeWidest(findings, result, screen);
-    Rows rows = MakeRows(findings, result, extent);
+    const Content content(bins);
+    Extent extent = MakeWidest(content, screen);
+    Rows rows = MakeRows(content, extent);
     const auto fits = [&]
     {
         const std::optional<std::size_t> room = GetRoom(rows, screen);
         return room && (!extent.hasBar || *room >= kGap + kNarrowestBar);
     };
-    while (!fits() && Narrow(extent)) rows = MakeRows(findings, result, extent);
+    while (!fits() && Narrow(extent)) rows = MakeRows(content, extent);
 
     const std::size_t room = GetRoom(rows, screen).value_or(0);
     const std::vector<std::size_t> widths = GetWidths(rows);
-    const ShareBar bar(findings, result, extent.hasBar ? std::min(room - kGap, kWidestBar) : 0, screen.hasColours);
+    const ShareBar bar(bins, extent.hasBar ? std::min(room - kGap, kWidestBar) : 0, screen.hasColours);
     os << Align(rows.front(), widths) << '\n';
-    for (std::size_t i = 0; i < result.bins.size(); ++i)
-        os << Align(rows[i + 1], widths) << bar.Draw(result.bins[i]) << '\n';
+    for (std::size_t i = 0; i < bins.bins.size(); ++i)
+        os << Align(rows[i + 1], widths) << bar.Draw(bins.bins[i]) << '\n';
     os << bar.GetLegend();
-    if (extent.nRates > 0)
-        os << "  rate and WoE of " << Quote(findings.FindTarget(result)->categories[1]) << "; information value "
-           << fmt::format("{:.4f}", GetInformationValue(result)) << '\n';
+    if (extent.numRates > 0)
+        os << "  rate and WoE of " << Quote(bins.target->categories[1]) << "; information value "
+           << fmt::format("{:.4f}", *ComputeInformationValue(bins)) << '\n';
 }

@@ -5,11 +5,11 @@
 
 #include <iosfwd>
 
-struct Result;
+struct AttributeBins;
 
 /// Prints a row for each bin: the bin, its weight and share, the weights of the target's categories, for a target of
 /// two of them the rates, and a bar. On a narrow screen the less important columns are left out, so that no row is
 /// broken unless the bin, its weight and its share are too wide by themselves.
-void PrintBinTable(std::ostream& os, const Findings& findings, const Result& result, const Screen& screen);
+void PrintBinTable(std::ostream& os, const AttributeBins& bins, const Screen& screen);
 
 #endif

@@ -3,10 +3,10 @@
 
 #include <iosfwd>
 
-struct Findings;
+struct Outcome;
 
-/// Prints the findings as one page that needs nothing else to be read: an overview in the order of the gain, then for
+/// Prints the outcome as one page that needs nothing else to be read: an overview in the order of the gain, then for
 /// each attribute with cut points a chart and the table of its bins.
-void PrintHtml(std::ostream& os, const Findings& findings);
+void PrintHtml(std::ostream& os, const Outcome& outcome);
 
 #endif

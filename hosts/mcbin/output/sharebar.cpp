@@ -1,7 +1,8 @@
 #include "hosts/mcbin/output/sharebar.h"
 
-#include "hosts/mcbin/figures.h"
-#include "hosts/mcbin/findings.h"
+#include "bins/labels.h"
+#include "bins/measures.h"
+#include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/text.h"
 
 #include <algorithm>
@@ -15,21 +16,21 @@ constexpr std::array<const char*, 4> kShades{"█", "▓", "▒", "░"};
 /// Blue, yellow, magenta and grey, which most colour-blind people can tell apart.
 constexpr std::array<const char*, 4> kColours{"\x1b[34m", "\x1b[33m", "\x1b[35m", "\x1b[90m"};
 
-double GetLargestWeight(const Result& result)
+double GetLargestWeight(const AttributeBins& bins)
 {
     double largest = 0.0;
-    for (const Bin& bin : result.bins) largest = std::max(largest, bin.weight);
+    for (const Bin& bin : bins.bins) largest = std::max(largest, bin.weight);
     return largest;
 }
 
 } // namespace
 
-ShareBar::ShareBar(const Findings& findings, const Result& result, std::size_t width, bool hasColours)
-    : fFindings(findings), fResult(result), fWidth(width), fHasColours(hasColours)
+ShareBar::ShareBar(const AttributeBins& bins, std::size_t width, bool hasColours)
+    : fBins(bins), fWidth(width), fHasColours(hasColours)
 {
-    const std::vector<double> weights = GetCategoryWeights(result);
+    const std::vector<double> weights = SumByCategory(bins);
     fHasOthers = weights.size() > kShades.size();
-    fCodes = GetHeaviest(weights, fHasOthers ? kShades.size() - 1 : kShades.size());
+    fCodes = FindHeaviest(weights, fHasOthers ? kShades.size() - 1 : kShades.size());
 }
 
 std::string ShareBar::Draw(const Bin& bin) const
@@ -53,7 +54,7 @@ std::string ShareBar::Draw(const Bin& bin) const
 
 std::string ShareBar::GetLegend() const
 {
-    const Variable* const target = fFindings.FindTarget(fResult);
+    const Variable* const target = fBins.target.get();
     if (!target || fWidth == 0)
         return "";
     std::string legend = " ";
@@ -68,16 +69,16 @@ std::string ShareBar::GetLegend() const
 std::vector<double> ShareBar::GetParts(const Bin& bin) const
 {
     if (bin.weights.empty())
-        return {GetShare(bin.weight, GetLargestWeight(fResult))};
+        return {ComputeShare(bin.weight, GetLargestWeight(fBins))};
     std::vector<double> parts;
     double others = bin.weight;
     for (const std::size_t code : fCodes)
     {
-        parts.push_back(GetShare(bin.weights[code], bin.weight));
+        parts.push_back(ComputeShare(bin.weights[code], bin.weight));
         others -= bin.weights[code];
     }
     if (fHasOthers)
-        parts.push_back(GetShare(std::max(0.0, others), bin.weight));
+        parts.push_back(ComputeShare(std::max(0.0, others), bin.weight));
     return parts;
 }
 

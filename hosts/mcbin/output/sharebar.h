@@ -6,8 +6,7 @@
 #include <vector>
 
 struct Bin;
-struct Findings;
-struct Result;
+struct AttributeBins;
 
 /// Draws the shares of the target's categories in a bin as one bar of block characters. The heaviest categories have a
 /// shade each, or a colour; all others share the last one. Without a target it draws the bin's share of the heaviest
@@ -15,8 +14,8 @@ struct Result;
 class ShareBar
 {
 public:
-    /// A `width` of 0 is for no bar at all. `findings` and `result` must outlive the object.
-    ShareBar(const Findings& findings, const Result& result, std::size_t width, bool hasColours);
+    /// A `width` of 0 is for no bar at all. `bins` must outlive the object.
+    ShareBar(const AttributeBins& bins, std::size_t width, bool hasColours);
 
     /// The bar with two spaces in front, or nothing if there is to be none.
     std::string Draw(const Bin& bin) const;
@@ -28,8 +27,7 @@ private:
     std::vector<double> GetParts(const Bin& bin) const;
     std::string Mark(std::size_t part, std::size_t length) const;
 
-    const Findings& fFindings;
-    const Result& fResult;
+    const AttributeBins& fBins;
     std::size_t fWidth;
     bool fHasColours;
     std::vector<std::size_t> fCodes; ///< the categories with a shade of their own, in the order of their codes

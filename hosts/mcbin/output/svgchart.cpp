@@ -1,8 +1,9 @@
 #include "hosts/mcbin/output/svgchart.h"
 
+#include "bins/labels.h"
+#include "bins/measures.h"
 #include "bins/numbers.h"
-#include "hosts/mcbin/figures.h"
-#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
@@ -37,21 +38,21 @@ struct Layout
     double height;
 };
 
-Layout MakeLayout(const Result& result)
+Layout MakeLayout(const AttributeBins& bins)
 {
     Layout layout{};
-    layout.binWidth = (kWidth - kLeft - kRight) / static_cast<double>(result.bins.size());
-    layout.stackHeight = result.target < 0 ? 0.0 : kStackHeight;
-    layout.weightTop = kTop + layout.stackHeight + (result.target < 0 ? 0.0 : kGap);
+    layout.binWidth = (kWidth - kLeft - kRight) / static_cast<double>(bins.bins.size());
+    layout.stackHeight = !bins.target ? 0.0 : kStackHeight;
+    layout.weightTop = kTop + layout.stackHeight + (!bins.target ? 0.0 : kGap);
     layout.height = layout.weightTop + kWeightHeight + kLabelHeight;
     return layout;
 }
 
 /// By category: its colour. The heaviest have their own, in the order of their codes, and all others share one.
-std::vector<std::size_t> ChooseColours(const Result& result)
+std::vector<std::size_t> ChooseColours(const AttributeBins& bins)
 {
-    const std::vector<double> weights = GetCategoryWeights(result);
-    const std::vector<std::size_t> codes = GetHeaviest(weights, kNumColours);
+    const std::vector<double> weights = SumByCategory(bins);
+    const std::vector<std::size_t> codes = FindHeaviest(weights, kNumColours);
     std::vector<std::size_t> colours(weights.size(), kOthersColour);
     for (std::size_t i = 0; i < codes.size(); ++i) colours[codes[i]] = i;
     return colours;
@@ -101,65 +102,66 @@ void PrintAxes(std::ostream& os, const Layout& layout, double heaviest)
     PrintText(os, kLeft - 5.0, layout.weightTop + kWeightHeight + 2.0, "end", "0");
 }
 
-void PrintStack(std::ostream& os, const Findings& findings, const Result& result, const Bin& bin, const Layout& layout,
-                double x, const std::vector<std::size_t>& colours)
+void PrintStack(std::ostream& os, const Variable& target, const Bin& bin, const std::string& label,
+                const Layout& layout, double x, const std::vector<std::size_t>& colours)
 {
-    const Variable& target = *findings.FindTarget(result);
     double bottom = kTop + layout.stackHeight;
     for (std::size_t i = 0; i < bin.weights.size(); ++i)
     {
-        const double share = GetShare(bin.weights[i], bin.weight);
+        const double share = ComputeShare(bin.weights[i], bin.weight);
         if (share <= 0.0)
             continue;
         const double height = share * layout.stackHeight;
         bottom -= height;
         PrintRectangle(os, "c" + std::to_string(colours[i]), x, bottom, layout.binWidth - 1.0, height,
-                       fmt::format("{}: {} {}, {:.1f}%", FormatBin(findings, result, bin), target.categories[i],
-                                   FormatWeight(bin.weights[i]), 100.0 * share));
+                       fmt::format("{}: {} {}, {:.1f}%", label, target.categories[i], FormatWeight(bin.weights[i]),
+                                   100.0 * share));
     }
 }
 
 /// The cut points under the borders of the bins, as many as have room.
-void PrintCutPoints(std::ostream& os, const Findings& findings, const Result& result, const Layout& layout)
+void PrintCutPoints(std::ostream& os, const AttributeBins& bins, const Layout& layout)
 {
-    if (findings.GetAttribute(result).IsCategorical())
+    if (bins.attribute->IsCategorical())
         return; // a code tells nobody anything
     double free = 0.0;
-    for (std::size_t i = 0; i < result.cutPoints.size(); ++i)
+    for (std::size_t i = 0; i < bins.cutPoints.size(); ++i)
     {
         const double x = kLeft + layout.binWidth * static_cast<double>(i + 1) - 0.5;
         if (x - kLabelWidth / 2 < free)
             continue;
-        PrintText(os, x, layout.height - 7.0, "middle", fmt::format("{:.6g}", result.cutPoints[i]));
+        PrintText(os, x, layout.height - 7.0, "middle", fmt::format("{:.6g}", bins.cutPoints[i]));
         free = x + kLabelWidth / 2;
     }
 }
 
 } // namespace
 
-void PrintChart(std::ostream& os, const Findings& findings, const Result& result)
+void PrintChart(std::ostream& os, const AttributeBins& bins)
 {
-    const Layout layout = MakeLayout(result);
-    const std::vector<std::size_t> colours = ChooseColours(result);
+    const Layout layout = MakeLayout(bins);
+    const std::vector<std::size_t> colours = ChooseColours(bins);
     double heaviest = 0.0;
-    for (const Bin& bin : result.bins) heaviest = std::max(heaviest, bin.weight);
+    for (const Bin& bin : bins.bins) heaviest = std::max(heaviest, bin.weight);
 
-    if (const Variable* const target = findings.FindTarget(result))
+    if (const Variable* const target = bins.target.get())
         PrintKey(os, *target, colours);
     os << fmt::format("<svg viewBox=\"0 0 {:.0f} {:.0f}\" role=\"img\" aria-label=\"Bins of {}\">\n", kWidth,
-                      layout.height, EscapeHtml(findings.GetAttribute(result).name));
+                      layout.height, EscapeHtml(bins.attribute->name));
     PrintAxes(os, layout, heaviest);
     double x = kLeft;
-    for (const Bin& bin : result.bins)
+    const std::vector<std::string> labels = MakeLabels(bins);
+    for (std::size_t i = 0; i < bins.bins.size(); ++i)
     {
-        if (!bin.weights.empty())
-            PrintStack(os, findings, result, bin, layout, x, colours);
-        const double height = kWeightHeight * GetShare(bin.weight, heaviest);
+        const Bin& bin = bins.bins[i];
+        if (bins.target)
+            PrintStack(os, *bins.target, bin, labels[i], layout, x, colours);
+        const double height = kWeightHeight * ComputeShare(bin.weight, heaviest);
         PrintRectangle(os, "weight", x, layout.weightTop + kWeightHeight - height, layout.binWidth - 1.0, height,
-                       fmt::format("{}: weight {}, {:.1f}%", FormatBin(findings, result, bin), FormatWeight(bin.weight),
-                                   100.0 * GetShare(bin.weight, result.weight)));
+                       fmt::format("{}: weight {}, {:.1f}%", labels[i], FormatWeight(bin.weight),
+                                   100.0 * ComputeShare(bin.weight, bins.weight)));
         x += layout.binWidth;
     }
-    PrintCutPoints(os, findings, result, layout);
+    PrintCutPoints(os, bins, layout);
     os << "</svg>\n";
 }

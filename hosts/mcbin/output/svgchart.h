@@ -3,12 +3,11 @@
 
 #include <iosfwd>
 
-struct Findings;
-struct Result;
+struct AttributeBins;
 
 /// Prints the chart of an attribute as a key and an SVG element of a page: for each bin, side by side, the shares of
 /// the target's categories as a stack, and below it the weight of the bin. Without a target there are the weights
 /// alone. Every part tells its figures where the pointer rests on it.
-void PrintChart(std::ostream& os, const Findings& findings, const Result& result);
+void PrintChart(std::ostream& os, const AttributeBins& bins);
 
 #endif

@@ -1,11 +1,13 @@
 #include "hosts/mcbin/output/tableoutput.h"
 
+#include "bins/labels.h"
+#include "bins/measures.h"
 #include "bins/numbers.h"
 #include "bins/utf8.h"
 #include "bins/words.h"
-#include "hosts/mcbin/figures.h"
-#include "hosts/mcbin/findings.h"
+#include "hosts/mcbin/outcome.h"
 #include "hosts/mcbin/output/bintable.h"
+#include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
@@ -18,62 +20,61 @@
 namespace
 {
 
-std::string GetHeading(const Findings& findings, const Result& result)
+std::string MakeHeading(const AttributeBins& bins)
 {
-    const Variable* const target = findings.FindTarget(result);
-    const std::string name = Printable(findings.GetAttribute(result).name);
-    return target ? name + " by " + Printable(target->name) : name;
+    const std::string name = Printable(bins.attribute->name);
+    return bins.target ? name + " by " + Printable(bins.target->name) : name;
 }
 
-void PrintHeading(std::ostream& os, const Findings& findings, const Result& result, const Screen& screen)
+void PrintHeading(std::ostream& os, const AttributeBins& bins, const Screen& screen)
 {
-    const std::string heading = GetHeading(findings, result);
+    const std::string heading = MakeHeading(bins);
     os << (screen.hasColours ? "\x1b[1m" + heading + "\x1b[0m" : heading);
-    if (result.targetEntropy && result.modelEntropy)
-        os << fmt::format(": gain {:.4f} bits, {:.1f}%", GetGain(result),
-                          100.0 * GetShare(GetGain(result), *result.targetEntropy));
+    const std::optional<double> entropy = ComputeTargetEntropy(bins);
+    const std::optional<double> gain = ComputeGain(bins);
+    if (gain)
+        os << fmt::format(": gain {:.4f} bits, {:.1f}%", *gain, 100.0 * ComputeShare(*gain, *entropy));
     os << '\n';
-    if (result.targetEntropy && result.modelEntropy)
-        os << "  entropy " << FormatNumber(*result.targetEntropy) << " before, " << FormatNumber(*result.modelEntropy)
-           << " after\n";
-    os << "  " << DescribeValues(findings, result) << ", missing weight "
-       << FormatWeight(result.weightWithMissing - result.weight) << '\n';
+    if (gain)
+        os << "  entropy " << FormatNumber(*entropy) << " before, " << FormatNumber(*bins.modelEntropy) << " after\n";
+    os << "  " << DescribeValues(bins) << ", missing weight " << FormatWeight(bins.weightWithMissing - bins.weight)
+       << '\n';
 }
 
 /// With an error or a warning about an attribute that has cut points all the same.
-void PrintStatus(std::ostream& os, const Result& result)
+void PrintStatus(std::ostream& os, const AttributeBins& bins)
 {
-    if (!result.status.IsOK())
-        os << "  " << DescribeStatus(result.status) << '\n';
+    if (!bins.status.IsOK())
+        os << "  " << DescribeStatus(bins.status) << '\n';
 }
 
-void PrintUncut(std::ostream& os, const Findings& findings)
+void PrintUncut(std::ostream& os, const Bins& bins)
 {
-    const std::vector<const Result*> uncut = GetUncut(findings);
+    const std::vector<const AttributeBins*> uncut = FindUncut(bins);
     if (uncut.empty())
         return;
     std::size_t width = 0;
-    for (const Result* const result : uncut) width = std::max(width, GetWidth(GetHeading(findings, *result)));
+    for (const AttributeBins* const result : uncut) width = std::max(width, GetWidth(MakeHeading(*result)));
     os << "Without cut points:\n";
-    for (const Result* const result : uncut)
-        os << "  " << PadRight(GetHeading(findings, *result), width) << "  " << DescribeStatus(result->status) << '\n';
+    for (const AttributeBins* const result : uncut)
+        os << "  " << PadRight(MakeHeading(*result), width) << "  " << DescribeStatus(result->status) << '\n';
     os << '\n';
 }
 
 } // namespace
 
-void PrintTables(std::ostream& os, const Findings& findings, const Screen& screen)
+void PrintTables(std::ostream& os, const Outcome& outcome, const Screen& screen)
 {
-    for (const Result* const result : SortByGain(findings))
+    for (const AttributeBins* const result : SortByGain(outcome.bins))
     {
-        PrintHeading(os, findings, *result, screen);
-        PrintBinTable(os, findings, *result, screen);
+        PrintHeading(os, *result, screen);
+        PrintBinTable(os, *result, screen);
         PrintStatus(os, *result);
         os << '\n';
     }
-    PrintUncut(os, findings);
-    if (const std::string words = DescribeWithoutWeight(findings); !words.empty())
+    PrintUncut(os, outcome.bins);
+    if (const std::string words = DescribeWithoutWeight(outcome.bins); !words.empty())
         os << "Left out, as they have no weight: " << words << '\n';
-    if (!findings.leftOut.empty())
-        os << "Left out, as they hold text: " << Join(findings.leftOut, ", ") << '\n';
+    if (!outcome.leftOut.empty())
+        os << "Left out, as they hold text: " << Join(outcome.leftOut, ", ") << '\n';
 }

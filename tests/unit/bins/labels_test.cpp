@@ -81,7 +81,7 @@ TEST(Labels, ColumnsOfBinsHaveNamesOfTheirOwn)
 
     EXPECT_EQ((Labels{"age_bin", "x_bin"}), ColumnsOf(bins, {"age"}));
     EXPECT_EQ((Labels{"age_bin_3", "x_bin"}), ColumnsOf(bins, {"age_bin", "age_bin_2"}));
-    EXPECT_EQ((Labels{"'age_bin': OK"}), DescribeUnbinned(bins));
+    EXPECT_EQ((Labels{"'age_bin' has no bins: OK"}), DescribeUnbinned(bins));
 
     bins.results.push_back(SomeBins(age, other, {1}, {{1, 1}, {0, 1}}));
     EXPECT_EQ((Labels{"age_by_bought_bin", "x_by_bought_bin", "age_by_moved_bin"}), ColumnsOf(bins, {}));

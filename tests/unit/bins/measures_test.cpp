@@ -51,6 +51,7 @@ TEST(Measures, EvidenceIsOfTheSecondOfTwoCategories)
     EXPECT_EQ(std::numeric_limits<double>::infinity(), ComputeInformationValue(bins));
 
     EXPECT_TRUE(ComputeEvidence(SomeBins(AVariable("x"), ATarget(3), {}, {{1, 1, 1}})).empty());
+    EXPECT_TRUE(ComputeEvidence(SomeBins(AVariable("x"), ATarget(2), {1}, {{2, 0}, {1, 0}})).empty());
     EXPECT_EQ(std::nullopt, ComputeInformationValue(SomeBins(AVariable("x"), ATarget(2), {}, {})));
 }
 

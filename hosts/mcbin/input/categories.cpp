@@ -1,0 +1,63 @@
+#include "hosts/mcbin/input/categories.h"
+
+#include "bins/numbers.h"
+#include "hosts/mcbin/input/columnplan.h"
+
+#include <mcobnqrt/mccommon.h>
+
+#include <algorithm>
+#include <map>
+
+namespace
+{
+
+bool IsIdentifier(std::string_view field)
+{
+    return field.size() > 1 && field[0] == '0' && field[1] >= '0' && field[1] <= '9';
+}
+
+bool IsNumber(const std::string& field)
+{
+    return ParseNumber(field) && !IsIdentifier(field);
+}
+
+} // namespace
+
+Categories::Categories(const Column& column)
+    : fAreNumbers(std::all_of(column.categories.begin(), column.categories.end(), IsNumber))
+{
+    if (fAreNumbers)
+        AddNumbers(column);
+    else
+        AddTexts(column);
+}
+
+std::optional<double> Categories::FindCode(std::string_view field)
+{
+    fKey = field;
+    const auto found = fCodes.find(fKey);
+    return found == fCodes.end() ? std::nullopt : std::optional(found->second);
+}
+
+void Categories::AddNumbers(const Column& column)
+{
+    std::map<double, std::vector<std::string>> fieldsByNumber;
+    for (const std::string& field : column.categories) fieldsByNumber[*ParseNumber(field)].push_back(field);
+    for (const auto& [number, fields] : fieldsByNumber)
+    {
+        const bool isMissing = column.IsMissing(number);
+        const double code = isMissing ? MCMV::gMissingValue : static_cast<double>(fNames.size());
+        for (const std::string& field : fields) fCodes.emplace(field, code);
+        if (!isMissing)
+            fNames.push_back(FormatNumber(number + 0.0)); // the negative zero is 0
+    }
+}
+
+void Categories::AddTexts(const Column& column)
+{
+    for (const std::string& field : column.categories)
+    {
+        fCodes.emplace(field, static_cast<double>(fNames.size()));
+        fNames.push_back(field);
+    }
+}

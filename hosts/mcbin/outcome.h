@@ -1,0 +1,17 @@
+#ifndef MCBIN_OUTCOME_H
+#define MCBIN_OUTCOME_H
+
+#include "bins/bins.h"
+
+#include <string>
+#include <vector>
+
+/// What a run of the tool has to tell: the bins, and what stands beside them.
+struct Outcome
+{
+    Bins bins;
+    std::vector<std::string> leftOut; ///< columns of text, with an example each
+    std::vector<std::string> notes;   ///< for the user
+};
+
+#endif

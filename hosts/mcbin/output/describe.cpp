@@ -1,0 +1,59 @@
+#include "hosts/mcbin/output/describe.h"
+
+#include "bins/labels.h"
+#include "bins/numbers.h"
+#include "bins/text.h"
+
+#include <algorithm>
+#include <numeric>
+
+std::vector<std::size_t> FindHeaviest(const std::vector<double>& weights, std::size_t number)
+{
+    std::vector<std::size_t> codes(weights.size());
+    std::iota(codes.begin(), codes.end(), std::size_t(0));
+    std::stable_sort(codes.begin(), codes.end(), [&](std::size_t a, std::size_t b) { return weights[a] > weights[b]; });
+    codes.resize(std::min(codes.size(), number));
+    std::sort(codes.begin(), codes.end());
+    return codes;
+}
+
+std::vector<const AttributeBins*> FindUncut(const Bins& bins)
+{
+    std::vector<const AttributeBins*> uncut;
+    for (const AttributeBins& result : bins.results)
+    {
+        if (result.cutPoints.empty())
+            uncut.push_back(&result);
+    }
+    return uncut;
+}
+
+std::string DescribeValues(const AttributeBins& bins)
+{
+    const Variable& attribute = *bins.attribute;
+    const auto format = [&](const std::optional<double>& value)
+    {
+        const bool isCode = attribute.IsCategorical() && value;
+        return isCode ? Quote(Shorten(FormatCategory(attribute, static_cast<std::size_t>(*value))))
+                      : FormatFigure(value);
+    };
+    return std::to_string(bins.numDistinct) + (attribute.IsCategorical() ? " categories" : " distinct values") +
+           " from " + format(bins.minimum) + " to " + format(bins.maximum);
+}
+
+std::string DescribeWithoutWeight(const Bins& bins)
+{
+    const std::int64_t number = bins.numRecordsWithoutWeight.value_or(0);
+    return number == 0 ? "" : std::to_string(number) + (number == 1 ? " record" : " records");
+}
+
+std::vector<std::string> ListCategories(const AttributeBins& bins, std::size_t bin)
+{
+    std::vector<std::string> categories;
+    if (bins.attribute->IsCategorical())
+    {
+        const std::vector<std::vector<std::size_t>> codes = FindCodes(bins);
+        for (const std::size_t code : codes[bin]) categories.push_back(FormatCategory(*bins.attribute, code));
+    }
+    return categories;
+}

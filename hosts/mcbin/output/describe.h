@@ -1,0 +1,27 @@
+#ifndef MCBIN_DESCRIBE_H
+#define MCBIN_DESCRIBE_H
+
+#include "bins/bins.h"
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+// What the tables for people and the page have in common.
+
+/// The codes of the `number` heaviest of categories with these weights, ascending.
+std::vector<std::size_t> FindHeaviest(const std::vector<double>& weights, std::size_t number);
+
+/// Results without cut points, as they were found.
+std::vector<const AttributeBins*> FindUncut(const Bins& bins);
+
+/// What values the attribute has, as in "22 distinct values from 0.1 to 2.5", or "3 categories from 'high' to 'low'".
+std::string DescribeValues(const AttributeBins& bins);
+
+/// How many records were left out, as in "3 records"; empty if none was.
+std::string DescribeWithoutWeight(const Bins& bins);
+
+/// The categories that a bin of a categorical attribute holds; of another attribute none.
+std::vector<std::string> ListCategories(const AttributeBins& bins, std::size_t bin);
+
+#endif
