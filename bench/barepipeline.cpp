@@ -128,7 +128,9 @@ double RunBare(const Workload& workload, const std::string& directory)
 
     double sum = 0.0;
     for (std::size_t run = 0; run < workload.fNumbersOfBins.size(); ++run)
+    {
         sum += workload.fTarget.empty() ? TreatAttributes<BINValueTuple>(workload, pathOf)
                                         : TreatAttributes<BINSortTuple>(workload, pathOf);
+    }
     return sum;
 }

@@ -138,8 +138,10 @@ void Sort(benchmark::State& state, MakeValue makeValue, TieOrder ties)
     const Workload workload = MakeContinuous(numTuples, {1.0}, 3);
     std::vector<BINSortTuple> unsorted;
     for (std::size_t i = 0; i < numTuples; ++i)
+    {
         unsorted.push_back(
             {makeValue(workload.fColumns[0][i], i), static_cast<std::uint8_t>(workload.fTarget[i]), 1.0});
+    }
     std::vector<BINSortTuple> tuples;
     while (state.KeepRunning())
     {
@@ -263,8 +265,10 @@ void Store(benchmark::State& state)
     {
         BINOutput output;
         for (int attribute = kAttribute; attribute < kAttribute + kNumPairs; ++attribute)
+        {
             output.SetAttributeTargetResults(MCBinning::MCStatus(), cutPoints, cells, attribute, kTarget, 0U, 0.0, 0.0,
                                              0.0, 0.0, 0.0);
+        }
     }
     CountItems(state, kNumPairs * numBins);
 }

@@ -141,8 +141,10 @@ BINVarList ListOf(const Workload& workload)
     constexpr auto kUnrounded = static_cast<IBINVariable::BINWRoundingOption>(2);
     BINVarList list;
     if (!workload.fTarget.empty())
+    {
         list.AddCatVar("target", "", workload.fNumCategories, IBINVariable::MeasureNumericCategorical,
                        IBINVariable::RoleTarget);
+    }
     if (!workload.fWeight.empty())
         list.AddWeightVar("weight", "", kUnrounded);
     for (std::size_t column = 0; column < workload.fColumns.size(); ++column)

@@ -17,8 +17,10 @@ Binner::Binner(const AttributeBins& bins, const std::vector<std::string>& missin
             fMissingNumbers.push_back(*number);
     }
     for (std::size_t code = 0; code < variable.categories.size(); ++code)
+    {
         fBinsByCategory.emplace(variable.categories[code],
                                 FindBin(bins.cutPoints, bins.isRightClosed, static_cast<double>(code)));
+    }
 }
 
 Binner::Found Binner::Find(std::string_view field)

@@ -101,9 +101,11 @@ private:
     static void ReadCategories(Variable& variable, const JsonCursor& json)
     {
         for (const JsonCursor& category : json.GetElements())
+        {
             variable.categories.push_back(variable.kind == VariableKind::kStringCategorical
                                               ? category.GetString()
                                               : FormatNumber(category.GetNumber()));
+        }
     }
 
     void ReadMissing(Variable& variable, const JsonCursor& json) const
@@ -247,9 +249,11 @@ Bins ReadBins(const JsonValue& document)
         cursor.Refuse("this is not a document of bins");
     const std::int64_t version = cursor.At("schema_version").GetInteger();
     if (version < 1 || version > kSchemaVersion)
+    {
         cursor.At("schema_version")
             .Refuse("version " + std::to_string(version) + " is not known here, but those up to " +
                     std::to_string(kSchemaVersion) + " are");
+    }
     return Reader(version).Read(cursor);
 }
 

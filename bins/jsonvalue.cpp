@@ -35,7 +35,9 @@ void AppendString(std::string& json, std::string_view text)
         else if (point.isValid)
             AppendEscaped(json, text.front());
         else
+        {
             json += "\xEF\xBF\xBD"; // U+FFFD
+        }
         text.remove_prefix(point.size);
     }
     json += '"';
@@ -65,7 +67,7 @@ public:
 
     void Write(const JsonValue& value, const std::string& indent)
     {
-        std::visit([&](const auto& held) { WriteHeld(held, indent); }, value.held);
+        std::visit([this, &indent](const auto& held) { this->WriteHeld(held, indent); }, value.held);
     }
 
 private:

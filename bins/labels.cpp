@@ -117,6 +117,7 @@ std::vector<std::string> MakeLabels(const AttributeBins& bins)
         for (const std::vector<std::size_t>& codes : FindCodes(bins))
         {
             std::vector<std::string> categories;
+            categories.reserve(codes.size());
             for (const std::size_t code : codes) categories.push_back(FormatCategory(*bins.attribute, code));
             labels.push_back("{" + Join(categories, ", ") + "}");
         }

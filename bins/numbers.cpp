@@ -74,10 +74,12 @@ std::string FindOrnaments(std::string_view text)
     std::string number;
     std::string found;
     for (const char c : text)
+    {
         if (kOrnaments.find(c) == std::string_view::npos)
             number += c;
         else if (found.find(c) == std::string::npos)
             found += c;
+    }
     return ParseNumber(number) ? found : "";
 }
 

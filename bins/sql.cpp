@@ -150,8 +150,10 @@ private:
     {
         std::string branches;
         for (const double value : {0.0, 1.0})
+        {
             branches += "  WHEN " + fName + " = " + MakeLiteral(value) + " THEN " +
                         MakeResult(FindBin(fBins.cutPoints, fBins.isRightClosed, value)) + "\n";
+        }
         return branches + "  ELSE NULL\n";
     }
 

@@ -24,9 +24,11 @@ std::string ChooseTempDirectory(const std::string& named, const std::string& opt
     const char* const fromEnvironment = std::getenv("TMPDIR");
     const std::string wanted = WithoutTrailingSeparators(fromEnvironment != nullptr ? fromEnvironment : "");
     if (!wanted.empty() && wanted != standard)
+    {
         throw TempDirectoryUnusable("TMPDIR is " + wanted +
                                     ", which is no directory that files can be made in; set it to one, unset it, or "
                                     "give " +
                                     option);
+    }
     return standard;
 }

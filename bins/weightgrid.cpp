@@ -63,8 +63,10 @@ const char* GetName(WeightRounding rounding)
 std::optional<WeightRounding> FindWeightRounding(std::string_view name)
 {
     for (const auto& [rounding, known] : kNames)
+    {
         if (name == known)
             return rounding;
+    }
     return std::nullopt;
 }
 

@@ -52,8 +52,10 @@ std::vector<OutputColumn> MakeColumns(const TableReader& table, const Bins& bins
         const std::size_t position = table.FindColumn(attribute.name);
         const auto isSame = [position](const OutputColumn& other) { return other.position == position; };
         if (options.isInPlace && std::any_of(columns.begin(), columns.end(), isSame))
+        {
             throw Failure("column " + Quote(attribute.name) +
                           " has been binned for more than one target, so its bins can't take its place");
+        }
         columns.push_back({position, &attribute, column.name, Binner(*column.bins, missingTexts),
                            MakeFields(*column.bins, options.areLabels, table.GetDelimiter())});
     }
@@ -66,8 +68,10 @@ std::string MakeHeader(const TableReader& table, const std::vector<OutputColumn>
 {
     std::string header = table.GetHeader();
     if (!isInPlace)
+    {
         for (const OutputColumn& column : columns)
             header += table.GetDelimiter() + QuoteField(column.name, table.GetDelimiter());
+    }
     return header + table.GetLineEnd();
 }
 

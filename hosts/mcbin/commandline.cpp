@@ -355,8 +355,10 @@ std::vector<OptionGroup> DescribeOptions(const CLI::App& command)
         for (const CLI::Option* const option : command.get_options())
         {
             if (option->get_group() == title)
+            {
                 group.options.push_back(
                     {option->get_name(false, true), option->get_option_text(), option->get_description()});
+            }
         }
         if (!title.empty() && !group.options.empty())
             groups.push_back(group);

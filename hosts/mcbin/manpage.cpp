@@ -32,8 +32,10 @@ std::string MakeOptions(const CommandHelp& command)
     {
         page += ".SS " + Escape(command.name + ": " + group.title) + "\n";
         for (const OptionHelp& option : group.options)
+        {
             page += ".TP\n.B " + Escape(option.name) + " \\fI" + Escape(option.argument) + "\\fR\n" +
                     Escape(option.description) + "\n";
+        }
     }
     return page;
 }
@@ -58,7 +60,9 @@ std::string MakeManPage(const ToolHelp& tool)
                        "\n.SH SYNOPSIS\n";
     for (const CommandHelp& command : tool.commands) page += MakeSynopsis(tool.name, command);
     for (const CommandHelp& command : tool.commands)
+    {
         page += ".SH " + Escape(ToUpper(command.name)) + "\n" + Escape(command.description) + ".\n" +
                 MakeOptions(command) + MakeFooter(command.footer);
+    }
     return page + ".SH NOTES\n" + MakeFooter(tool.footer);
 }

@@ -57,8 +57,10 @@ std::vector<std::string> MakeNotes(const Bins& bins, const ColumnPlan& plan, con
     constexpr double kFar = 2.0;
     std::vector<std::string> notes;
     for (const Column& column : plan.columns)
+    {
         if (column.IsOrnamented())
             notes.push_back(DescribeOrnamented(column));
+    }
     for (std::size_t i = 0; i < variables.columns.size(); ++i)
     {
         const Column& column = plan.columns[variables.columns[i]];

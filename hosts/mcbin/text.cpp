@@ -19,7 +19,9 @@ std::string MakePadding(const std::string& text, std::size_t width)
 std::string EscapeHtml(std::string_view text)
 {
     std::string escaped;
-    for (const char c : Printable(text)) switch (c)
+    for (const char c : Printable(text))
+    {
+        switch (c)
         {
         case '&':
             escaped += "&amp;";
@@ -36,6 +38,7 @@ std::string EscapeHtml(std::string_view text)
         default:
             escaped += c;
         }
+    }
     return escaped;
 }
 
@@ -76,9 +79,11 @@ std::string EscapePattern(std::string_view name)
 {
     std::string pattern;
     for (const char c : name)
+    {
         if (c == '\\')
             pattern += "\\\\";
         else
             pattern += IsPattern(std::string_view(&c, 1)) ? std::string{'[', c, ']'} : std::string(1, c);
+    }
     return pattern;
 }

@@ -47,9 +47,7 @@ DataPass::DataPass(const BINVarList& list, const RecordLayout& layout, unsigned 
       fMaxNumRecords(maxNumRecords)
 {
     for (int variable = 0; variable < fLayout.GetNumVariables(); ++variable)
-    {
         fUserMissingInfo.push_back(fVarList.GetVarAt(variable)->GetUserMissingInfo());
-    }
     if (fLayout.GetWeightVariable() >= 0)
         fWeightEncoder = static_cast<const BINRoundEncoder*>(fVarList.GetEncoderAt(fLayout.GetWeightVariable()));
 }

@@ -236,8 +236,10 @@ private:
     static void SortTies(Tuple* tuples, std::size_t count)
     {
         if (kTies == TieOrder::kComplete)
+        {
             std::sort(tuples, tuples + count,
                       [](const Tuple& left, const Tuple& right) { return PrecedesInTie(left, right); });
+        }
     }
 
     std::vector<Tuple> fScratch;

@@ -19,11 +19,23 @@ inline MCBinning::MCStatus CheckVarList(const BINVarList& varList)
     const bool isValid = varList.IsValidList(oneCategory, noCategories);
     int culprit = -1;
     if (isValid)
-        culprit = FindVariableWithoutPosition(varList);
+    {
+        {
+            culprit = FindVariableWithoutPosition(varList);
+        }
+    }
     else if (!noCategories.empty())
-        culprit = noCategories.front();
+    {
+        {
+            culprit = noCategories.front();
+        }
+    }
     else if (!oneCategory.empty())
-        culprit = oneCategory.front();
+    {
+        {
+            culprit = oneCategory.front();
+        }
+    }
     if (isValid && culprit < 0)
         return MCBinning::MCStatus();
     MCBinning::MCStatus status = MakeError(MCBinning::BINStatusInvalidVarList);

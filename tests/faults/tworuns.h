@@ -77,9 +77,17 @@ void ExpectSound(const Outcome<Results>& undisturbed, const Outcome<Results>& di
                                        [&](const Results& candidate) { return EntryOf(candidate) == EntryOf(result); });
         ASSERT_NE(undisturbed.fResults.end(), twin);
         if (result.GetStatus().IsOK())
-            ExpectSame(*twin, result);
+        {
+            {
+                ExpectSame(*twin, result);
+            }
+        }
         else
-            EXPECT_TRUE(!isAllOK && CodeOf(result) == failure) << CodeOf(result);
+        {
+            {
+                EXPECT_TRUE(!isAllOK && CodeOf(result) == failure) << CodeOf(result);
+            }
+        }
     }
 }
 

@@ -54,10 +54,12 @@ std::vector<std::vector<std::string>> Cells(const std::string& csv, char delimit
     {
         rows.emplace_back(1);
         for (const char c : line)
+        {
             if (c == delimiter)
                 rows.back().emplace_back();
             else
                 rows.back().back() += c;
+        }
     }
     return rows;
 }
@@ -84,6 +86,7 @@ TEST_P(McbinApply, GivesTheWeightsOfTheTablesAndWhatTheSqlGives)
     EXPECT_EQ(301u, rows.size());
     std::string bins;
     for (std::size_t i = 1; i < rows.size(); ++i)
+    {
         for (std::size_t column = 6; column < rows[i].size(); ++column)
         {
             bins += rows[i][column] + (column + 1 < rows[i].size() ? "," : "\n");
@@ -93,11 +96,14 @@ TEST_P(McbinApply, GivesTheWeightsOfTheTablesAndWhatTheSqlGives)
             binWeights.resize(std::max<std::size_t>(binWeights.size(), std::stoul(rows[i][column]) + 1));
             binWeights[std::stoul(rows[i][column])] += std::stoi(rows[i][5]);
         }
+    }
     std::map<std::string, std::vector<int>> tables;
     for (const auto& row :
          Cells(Run("supervised data.csv " + (kOptions + closed) + " --format csv | sed 's/, /;/g'").out))
+    {
         if (row[0] != "attribute")
             tables[(row[0] == "\"od\"\"d\"" ? "\"od\"\"d_bin\"" : row[0] + "_bin")].push_back(std::stoi(row[7]));
+    }
     EXPECT_EQ(3u, tables.size());
     EXPECT_EQ(tables, weights);
     EXPECT_EQ(bins, Shell("sqlite3 :memory: <bins.sql | cut -d, -f7- | tr -d '\\r'").out);

@@ -99,8 +99,10 @@ TEST_F(McbinInput, AFileOfManyBlocksLosesNoRowAndNoLine)
     // Quoted and plain rows mixed, so that both ways of reading meet each other at every place of a block.
     std::string data = "x,padding\n";
     for (int i = 1; i <= 60000; ++i)
+    {
         data += std::to_string(i) +
                 (i % 3 == 0 ? ",plain" : ",\"" + std::string(static_cast<std::size_t>(i % 7), '\n') + "\"") + "\n";
+    }
     data += "60001," + std::string(3000000, 'y') + "\n";
 
     const Outcome whole = RunOn(data, "equal-frequency", "--bins 2 --attributes x");
@@ -261,8 +263,10 @@ TEST_F(McbinInput, MissingValuesAreDeclaredByTextByValueByIntervalOrAsWhatIsBad)
         {"--missing-text NA --missing x=:2 --missing x=3", "3 distinct values from 9 to 99, missing weight 5"},
     };
     for (const Case& c : cases)
+    {
         EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", c.options).out.find(c.missingAndRange))
             << c.options << RunOn(data, "equal-frequency", c.options).err;
+    }
     EXPECT_NE(std::string::npos, RunOn(data, "equal-frequency", "").err.find("line 8: column 'x': 'NA' is not a"));
     EXPECT_EQ(1, RunOn(data, "equal-frequency", "--bad missing --missing x=9:1").exitCode);
 }

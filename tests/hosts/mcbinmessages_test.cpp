@@ -68,9 +68,11 @@ TEST_F(McbinMessages, AllColumnsThatStopARunAreNamedAtOnceWithTheWayOut)
 {
     std::string data = "id,ticket,price,name,n,y\n";
     for (int i = 0; i < 300; ++i)
+    {
         data += "k" + std::to_string(i) + "," + (i == 7 ? "PC 17" : std::to_string(i)) + "," +
                 (i % 3 == 0 ? "\"$1,200\"" : std::to_string(i)) + ",Ann," + std::to_string(i) +
                 (i < 100 ? ",a\n" : ",b\n");
+    }
 
     EXPECT_EQ(
         "mcbin: data.csv: 4 columns cannot be binned as they are: 'id' has more than 256 categories, 'ticket' has "
@@ -147,8 +149,10 @@ TEST_F(McbinMessages, AMistypedCommandIsToldAsSuch)
 {
     const std::string more = "\nRun 'mcbin --help' for more information.\n";
     for (const char* word : {"supervise", "superviced", "Supervised", "super"})
+    {
         EXPECT_EQ("mcbin: no such command: '" + std::string(word) + "'; did you mean 'supervised'?" + more,
                   Run(std::string(word) + " data.csv --target y").err);
+    }
     EXPECT_NE(std::string::npos, Run("equal_frequency data.csv").err.find("did you mean 'equal-frequency'?"));
     EXPECT_NE(std::string::npos, Run("aplly b.json data.csv").err.find("did you mean 'apply'?"));
     EXPECT_EQ("mcbin: no such command: 'data.csv'; there are supervised, equal-frequency, apply" + more,

@@ -224,8 +224,10 @@ TEST_F(McbinOutputOnTerminal, TablesFitTheTerminalAndStandStraightWithWideCharac
         EXPECT_EQ(0, terminal.GetExitCode());
         std::string text;
         for (const char c : terminal.GetText())
+        {
             if (c != '\r')
                 text += c;
+        }
         const std::size_t begin = text.find("  bin ");
         return text.substr(begin, text.find("\n\n", begin) + 1 - begin);
     };

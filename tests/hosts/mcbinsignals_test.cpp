@@ -83,6 +83,7 @@ TEST_F(McbinSignals, TheEndOfTheInputBehindOneIsNoSuccess)
     ASSERT_EQ(0, RunOn(header + rows.substr(0, 4096), "equal-frequency", "--format json >bins.json").exitCode);
     Write("result", "former");
     for (const char* arguments : {"apply bins.json - -o result", "supervised - --target y --report result"})
+    {
         for (const int signal : {SIGINT, SIGTERM, SIGHUP})
         {
             const std::size_t numFiles = fData.FileNames().size();
@@ -97,4 +98,5 @@ TEST_F(McbinSignals, TheEndOfTheInputBehindOneIsNoSuccess)
             EXPECT_EQ("mcbin: interrupted; there are no results yet\n", ReadFile(fData.File("err"))) << arguments;
             EXPECT_EQ(numFiles, fData.FileNames().size()) << arguments;
         }
+    }
 }

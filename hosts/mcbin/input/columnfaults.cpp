@@ -56,8 +56,10 @@ Failure MakeFailure(const TableReader& table, const Column& column, const Faulty
     if (faulty.fault == Fault::kMixed)
         return Failure(table.MakeNotANumber(line, faulty.place, column.firstText).what() + advice);
     if (faulty.fault == Fault::kText)
+    {
         return table.MakeFailure(line, faulty.place,
                                  "holds text, such as " + Quote(Shorten(column.firstText)) + advice);
+    }
     return table.MakeFailure(
         line, faulty.place,
         fmt::format("more than {} categories, which are too many for a categorical attribute", kMostCategories) +
@@ -98,8 +100,10 @@ void ThrowIfFaulty(const TableReader& table, const ColumnPlan& plan)
 {
     std::vector<FaultyColumn> faulty;
     for (std::size_t i = 0; i < plan.columns.size(); ++i)
+    {
         if (const Fault fault = FindFault(plan, plan.columns[i]); fault != Fault::kNone)
             faulty.push_back({i, fault});
+    }
     if (faulty.size() == 1)
         throw MakeFailure(table, plan.columns[faulty.front().place], faulty.front());
     if (!faulty.empty())

@@ -27,9 +27,13 @@ Indices FindMatches(const TableReader& table, const std::string& pattern)
     const std::vector<std::string>& names = table.GetColumnNames();
     Indices found;
     if (IsPattern(pattern))
+    {
         for (std::size_t i = 0; i < names.size(); ++i)
+        {
             if (Matches(pattern, names[i]))
                 found.push_back(i);
+        }
+    }
     return found;
 }
 
@@ -42,10 +46,14 @@ Indices FindColumns(const TableReader& table, const std::string& pattern)
         return matches;
     const std::size_t own = table.FindColumn(pattern);
     for (const std::size_t other : matches)
+    {
         if (other != own)
+        {
             throw Failure(Quote(pattern) + " is the name of a column, and a pattern that " +
                           Quote(table.GetColumnNames()[other]) + " matches, too; " + Quote(EscapePattern(pattern)) +
                           " stands for the column alone");
+        }
+    }
     return {own};
 }
 
@@ -111,8 +119,10 @@ void SetTargetAndWeight(ColumnPlan& plan, const TableReader& table, const Column
 std::pair<std::string, std::string> SplitPair(const TableReader& table, const std::string& pair)
 {
     for (std::size_t at = pair.find(':'); at != std::string::npos; at = pair.find(':', at + 1))
+    {
         if (HasColumn(table, pair.substr(at + 1)))
             return {pair.substr(0, at), pair.substr(at + 1)};
+    }
     const std::size_t colon = pair.find(':');
     if (colon == std::string::npos)
         throw Failure("a pair is written ATTRIBUTE:TARGET, which " + Quote(pair) + " is not");
@@ -130,6 +140,7 @@ void SetPairs(ColumnPlan& plan, const TableReader& table, const ColumnOptions& o
         SetTarget(plan.columns[pairs.back().second]);
     }
     for (const auto& [pattern, target] : pairs)
+    {
         for (const std::size_t i : FindColumns(table, pattern))
         {
             Column& column = plan.columns[i];
@@ -137,14 +148,17 @@ void SetPairs(ColumnPlan& plan, const TableReader& table, const ColumnOptions& o
             if (!isNamed && (column.isWeight || column.isTarget))
                 continue;
             if (column.isWeight || i == target)
+            {
                 throw Failure("column " + Quote(column.name) + " cannot be an attribute in " +
                               Quote(pattern + ":" + plan.columns[target].name));
+            }
             column.isAttribute = true;
             column.isNamed = column.isNamed || isNamed;
             const std::pair<std::size_t, std::size_t> found(i, target);
             if (std::find(plan.pairs.begin(), plan.pairs.end(), found) == plan.pairs.end())
                 plan.pairs.push_back(found);
         }
+    }
 }
 
 void SetAttributes(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
@@ -152,16 +166,20 @@ void SetAttributes(ColumnPlan& plan, const TableReader& table, const ColumnOptio
     if (options.attributes.empty())
         for (Column& column : plan.columns) column.isAttribute = !column.isTarget && !column.isWeight;
     for (const std::string& pattern : SplitNames(table, options.attributes))
+    {
         for (const std::size_t i : FindColumns(table, pattern))
         {
             Column& column = plan.columns[i];
             const bool isFree = !column.isTarget && !column.isWeight;
             if (!isFree && column.name == pattern)
+            {
                 throw Failure("column " + Quote(column.name) +
                               " cannot be an attribute: it is the target or the weight");
+            }
             column.isAttribute = column.isAttribute || isFree;
             column.isNamed = column.isNamed || column.name == pattern;
         }
+    }
     for (const std::size_t i : FindColumns(table, options.exclude)) plan.columns[i].isAttribute = false;
 }
 
@@ -169,8 +187,10 @@ double ParseEnd(std::string_view text, double absent, const std::string& declara
 {
     const std::optional<double> end = text.empty() ? absent : ParseNumber(text);
     if (!end)
+    {
         throw Failure("an interval of missing values is written LOW:HIGH, with numbers, which is not so in " +
                       Quote(declaration));
+    }
     return *end;
 }
 
@@ -215,11 +235,15 @@ void DeclareMissing(ColumnPlan& plan, const TableReader& table, const std::strin
 {
     const std::size_t equals = declaration.rfind('=');
     if (equals == std::string::npos || equals + 1 == declaration.size())
+    {
         throw Failure("missing values are declared as COLUMN=9,99 or COLUMN=90:99, which " + Quote(declaration) +
                       " is not");
+    }
     for (const std::size_t column : FindColumns(table, declaration.substr(0, equals)))
+    {
         for (const std::string& value : Split(std::string_view(declaration).substr(equals + 1), ','))
             DeclareMissing(plan.columns[column], value, declaration);
+    }
 }
 
 void ThrowUnlessText(const std::string& text, const std::string& what)
@@ -258,9 +282,13 @@ std::vector<std::string> ColumnPlan::DescribeLeftOut() const
 {
     std::vector<std::string> described;
     for (const Column& column : columns)
+    {
         if (column.nTexts > 0 && !column.IsUsed())
+        {
             described.push_back(Printable(column.name) + " (" + Quote(Shorten(column.firstText)) + " in line " +
                                 std::to_string(column.firstTextLine) + ")");
+        }
+    }
     return described;
 }
 

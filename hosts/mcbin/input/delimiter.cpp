@@ -72,8 +72,10 @@ char ParseDelimiter(std::string_view name)
                                                                        {"pipe", '|'},
                                                                        {"space", ' '}}};
     for (const auto& [known, delimiter] : kNames)
+    {
         if (name == known)
             return delimiter;
+    }
     const bool isOne = name.size() == 1 && name != "\"" && name != "\n" && name != "\r" && name != "\0";
     return isOne ? name.front() : '\0';
 }

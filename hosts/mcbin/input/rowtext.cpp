@@ -10,10 +10,12 @@ std::size_t FindOutsideOfQuotes(std::string_view text, std::size_t begin, Predic
 {
     bool isQuoted = false;
     for (std::size_t i = begin; i < text.size(); ++i)
+    {
         if (text[i] == '"')
             isQuoted = !isQuoted;
         else if (!isQuoted && isWanted(text[i]))
             return i;
+    }
     return text.size();
 }
 

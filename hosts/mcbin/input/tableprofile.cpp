@@ -64,17 +64,21 @@ void ProfileCategory(const TableReader& table, Column& column, std::size_t place
     if (column.categories.find(field) != column.categories.end() || column.categories.size() > kMostCategories)
         return;
     if (!IsText(field))
+    {
         throw table.MakeFailure(
             line, place, Quote(Shorten(field)) + " is not UTF-8 text; convert the file first, for instance with iconv");
+    }
     column.categories.emplace(field);
     if (column.categories.size() <= kMostCategories)
         return;
     // Nothing can be done without the target. Of the others all are to be told together.
     if (column.isTarget)
+    {
         throw table.MakeFailure(line, place,
                                 fmt::format("more than {} categories, which are too many for a target; how a column of "
                                             "numbers becomes one is told by 'mcbin supervised --help'",
                                             kMostCategories));
+    }
     column.firstText = field;
     column.firstTextLine = line;
 }
@@ -122,6 +126,8 @@ void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care
         throw table.MakeFailure("there is no row below the header");
     ThrowIfFaulty(table, plan);
     for (Column& column : plan.columns)
+    {
         if (column.IsUsed())
             SettleKind(column);
+    }
 }

@@ -37,8 +37,10 @@ TableReader::TableReader(const TableOptions& options) : fReader(Open(options))
     fLineEnd = text.end.empty() ? "\n" : text.end;
     fColumnNames = NameColumns(*header);
     for (auto name = fColumnNames.begin(); name != fColumnNames.end(); ++name)
+    {
         if (std::find(fColumnNames.begin(), name, *name) != name)
             throw MakeFailure(header->GetLine(), "two columns are named " + Quote(*name));
+    }
 }
 
 std::size_t TableReader::FindColumn(const std::string& name) const
@@ -59,8 +61,10 @@ const CsvRow* TableReader::NextRow()
 {
     const CsvRow* const row = fReader.NextRow();
     if (row && row->Size() != fColumnNames.size())
+    {
         throw MakeFailure(row->GetLine(), "wrong number of fields: " + std::to_string(row->Size()) +
                                               ", but the header has " + std::to_string(fColumnNames.size()));
+    }
     return row;
 }
 

@@ -21,8 +21,10 @@ void ThrowIfTooFew(const Column& column, const std::vector<std::string>& categor
     if (categories.empty())
         throw Failure("column " + Quote(column.name) + " has no value; a " + what + " needs at least 2 categories");
     if (categories.size() == 1)
+    {
         throw Failure("column " + Quote(column.name) + " has a single category, " + Quote(categories.front()) + "; a " +
                       what + " needs at least 2");
+    }
 }
 
 /// Neither of the named options: the library counts a weight as the record source hands it on, rounded by then.
@@ -53,8 +55,10 @@ double GetEnd(double end)
 void DeclareMissing(BINVarList& list, int index, const Column& column, const Categories* categories)
 {
     if (categories && !categories->AreNumbers() && column.missingInterval)
+    {
         throw Failure("column " + Quote(column.name) +
                       " is categorical, and so its missing values can't be declared as an interval");
+    }
     if (column.isWeight || categories)
         return;
     for (const double number : column.missingNumbers) list.AddDiscreteUserMissing(index, EncodeInfinity(number), "");

@@ -189,6 +189,8 @@ void PrintBinTable(std::ostream& os, const AttributeBins& bins, const Screen& sc
         os << Align(rows[i + 1], widths) << bar.Draw(bins.bins[i]) << '\n';
     os << bar.GetLegend();
     if (extent.numRates > 0)
+    {
         os << "  rate and WoE of " << Quote(bins.target->categories[1]) << "; information value "
            << fmt::format("{:.4f}", *ComputeInformationValue(bins)) << '\n';
+    }
 }

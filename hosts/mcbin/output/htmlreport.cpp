@@ -101,8 +101,10 @@ void PrintBins(std::ostream& os, const AttributeBins& bins)
            << fmt::format("</td><td>{:.1f}%</td>", 100.0 * ComputeShare(bin.weight, bins.weight));
         for (const double weight : bin.weights) os << "<td>" << FormatWeight(weight) << "</td>";
         if (!evidence.empty())
+        {
             os << fmt::format("<td>{:.1f}%</td><td>{:+.3f}</td><td>{:.4f}</td>", 100.0 * evidence[i].rate,
                               evidence[i].weightOfEvidence, evidence[i].informationValue);
+        }
         os << "</tr>\n";
     }
     os << "</table></div>\n";
@@ -112,8 +114,10 @@ void PrintFigures(std::ostream& os, const AttributeBins& bins)
 {
     os << "<p>";
     if (const std::optional<double> gain = ComputeGain(bins))
+    {
         os << fmt::format("Gain {:.4f} bits: entropy ", *gain) << FormatNumber(*ComputeTargetEntropy(bins))
            << " before, " << FormatNumber(*bins.modelEntropy) << " after. ";
+    }
     os << EscapeHtml(DescribeValues(bins)) << ", missing weight " << FormatMissing(bins) << '.';
     if (!bins.status.IsOK())
         os << ' ' << EscapeHtml(DescribeStatus(bins.status)) << '.';

@@ -100,8 +100,10 @@ OutputFile::OutputFile(const std::string& path) : fPath(path)
     }
     const std::optional<fs::path> target = FollowLinks(path);
     if (target && IsDescriptor(*target))
+    {
         // To open it once more would begin at the front of a file that a shell has opened.
         fFile.reset(fdopen(dup(std::stoi(target->filename().string())), "wb"));
+    }
     else if (target && IsOtherThanAFile(*target))
         fFile.reset(std::fopen(path.c_str(), "wb"));
     else if (target)

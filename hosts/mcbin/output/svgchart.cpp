@@ -62,8 +62,10 @@ void PrintKey(std::ostream& os, const Variable& target, const std::vector<std::s
 {
     os << "<ul class=\"key\">";
     for (std::size_t i = 0; i < colours.size(); ++i)
+    {
         if (colours[i] != kOthersColour)
             os << "<li><i class=\"c" << colours[i] << "\"></i>" << EscapeHtml(target.categories[i]) << "</li>";
+    }
     if (colours.size() > kNumColours)
         os << "<li><i class=\"c" << kOthersColour << "\"></i>others</li>";
     os << "</ul>\n";
@@ -91,12 +93,14 @@ void PrintLine(std::ostream& os, double y)
 void PrintAxes(std::ostream& os, const Layout& layout, double heaviest)
 {
     if (layout.stackHeight > 0.0)
+    {
         for (const int percent : {0, 50, 100})
         {
             const double y = kTop + layout.stackHeight * (1.0 - percent / 100.0);
             PrintLine(os, y);
             PrintText(os, kLeft - 5.0, y + 4.0, "end", fmt::format("{}%", percent));
         }
+    }
     PrintLine(os, layout.weightTop + kWeightHeight);
     PrintText(os, kLeft - 5.0, layout.weightTop + 10.0, "end", fmt::format("{:.4g}", heaviest));
     PrintText(os, kLeft - 5.0, layout.weightTop + kWeightHeight + 2.0, "end", "0");

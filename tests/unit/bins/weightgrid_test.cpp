@@ -124,8 +124,10 @@ TEST(WeightGrid, EverySumIsExactInEveryOrder)
     {
         std::vector<double> weights;
         for (int i = 0; i < 20000; ++i)
+        {
             weights.push_back(scale == 0.7 ? scale
                                            : scale * std::exp(std::uniform_real_distribution(-40.0, 0.0)(random)));
+        }
         WeightGrid grid(Tally(weights));
         std::vector<double> onGrid;
         for (const double weight : weights) onGrid.push_back(grid.Round(weight));
