@@ -102,7 +102,9 @@ public:
         : fTable(table), fColumns(columns), fOptions(options), fOwn(table.GetColumnNames().size(), nullptr)
     {
         if (options.isInPlace)
+        {
             for (OutputColumn& column : columns) fOwn[column.position] = &column;
+        }
     }
 
     /// The line is the object's and good until the next call.

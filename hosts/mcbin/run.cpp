@@ -69,11 +69,11 @@ Outcome FindBins(TableReader& table, const BinOptions& options, Progress& progre
     Bins& bins = outcome.bins;
     bins.settings = options.settings;
     bins.dataName = table.GetName();
-    bins.numRecords = plan.nRows;
+    bins.numRecords = plan.numRows;
     bins.missingTexts = plan.missingTexts;
     bins.variables = DescribeVariables(plan, variables);
     if (std::any_of(plan.columns.begin(), plan.columns.end(), [](const Column& column) { return column.isWeight; }))
-        bins.numRecordsWithoutWeight = plan.nWithoutWeight;
+        bins.numRecordsWithoutWeight = plan.numWithoutWeight;
 
     Announce(progress, variables);
     TableRecordSource source(table, plan, variables, progress);

@@ -33,7 +33,7 @@ public:
     ///         equal.
     MCBinning::MCStatus SetAttributeTargetResults(MCBinning::MCStatus status, const std::set<double>& cutPoints,
                                                   const std::vector<double>& cellCounts, int attribute, int target,
-                                                  unsigned int nDistinctValues, double totalWeight,
+                                                  unsigned int numDistinctValues, double totalWeight,
                                                   double totalWeightWithMissing, double minimum, double maximum,
                                                   double modelEntropy);
 
@@ -62,9 +62,9 @@ public:
 private:
     /// In the order of storing.
     std::vector<BINAttributeTargetResults> fResults;
-    /// By attribute and target: the place in fResults of the first entry of that pair.
+    /// By attribute and target: the index in fResults of the first entry of that pair.
     std::map<std::pair<int, int>, int> fResultIndex;
-    /// By attribute: the places in fResults of its entries, in the order of storing.
+    /// By attribute: the indices in fResults of its entries, in the order of storing.
     std::map<int, std::vector<int>> fAttributeIndex;
 };
 

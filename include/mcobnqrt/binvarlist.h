@@ -13,7 +13,7 @@ class IBINEncoder;
 
 /// The host's description of its data: variables in the order of the fields of its records.
 ///
-/// A variable's index, from 0, is its place in the list and its field in a record. The list makes its variables and
+/// A variable's index, from 0, is its position in the list and its field in a record. The list makes its variables and
 /// owns them; what it hands out by pointer stays its own. The factories copy the list, so an algorithm doesn't see
 /// what is changed afterwards.
 ///
@@ -44,7 +44,7 @@ public:
                   IBINVariable::MeasureLevel level, IBINVariable::VariableRole role);
 
     /// Appends a categorical variable of numbers or strings and encodes its values, so that each one's code is its
-    /// place among the distinct ones. The number of categories is that of `values`, repeated ones included. `labels`
+    /// rank among the distinct ones. The number of categories is that of `values`, repeated ones included. `labels`
     /// are in the order of the codes.
     ///
     /// \return its index, or -1, and nothing is added, if the name is empty or taken, the role is RoleFrequencyWeight

@@ -31,7 +31,7 @@ public:
     ///
     /// \return the algorithm, which the caller owns, or null, and then GetStatus() tells why: BINStatusInvalidVarList
     ///         (slot 1 of the discrete data is the index of a variable without categories, else of one with a single
-    ///         category, else of one without a place in the analysis, else -1: no variable at all, or no attribute),
+    ///         category, else of one without a part in the analysis, else -1: no variable at all, or no attribute),
     ///         BINStatusOutOfMemory or BINStatusCancelled.
     IEFBINAlgorithm* CreateEFBINAlgorithm(EFBINSettings& settings, BINVarList& varList);
 

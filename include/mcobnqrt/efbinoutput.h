@@ -29,7 +29,7 @@ public:
     /// \return OK, or the error BINStatusBadAttributeIndex, and nothing is added, if `attribute` is negative.
     MCBinning::MCStatus SetAttributeResults(MCBinning::MCStatus status, const std::vector<double>& cutPoints,
                                             const std::vector<double>& cellCounts, int attribute,
-                                            unsigned int nDistinctValues, double totalWeight,
+                                            unsigned int numDistinctValues, double totalWeight,
                                             double totalWeightWithMissing, double minimum, double maximum);
 
     /// Copies the first entry of the attribute to `results`.
@@ -49,7 +49,7 @@ public:
 
 private:
     std::vector<BINAttributeResults> fResults; ///< in the order of storing
-    std::map<int, int> fResultIndex;           ///< by attribute: the place in fResults of its first entry
+    std::map<int, int> fResultIndex;           ///< by attribute: the index in fResults of its first entry
 };
 
 #endif

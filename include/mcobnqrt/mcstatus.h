@@ -29,7 +29,7 @@ enum BINStatusCode : int
     /// are filled: with the left border closed, a value of 1.7976931348623157e308 does that.
     BINStatusBadBinTable = 120002,
     /// The variable list can't be worked with. Discrete slot 1: the index of a variable without categories; else of one
-    /// with a single category; else of one without a place in the analysis; else -1: no variable at all, or no
+    /// with a single category; else of one without a part in the analysis; else -1: no variable at all, or no
     /// attribute.
     BINStatusInvalidVarList = 120003,
     /// There is no source, or it has no record, or none whose weight is above 0, or none ahead of a cancel.

@@ -57,7 +57,7 @@ private:
 
     std::vector<double> fBlock;
     std::size_t fBlockSize = 0; ///< values that the block holds
-    std::size_t fNextValue = 0; ///< place in the block of what Next() hands out
+    std::size_t fNextValue = 0; ///< index in the block of what Next() hands out
     File fFile;
     int fRecordStatus = kMoreToCome;
 };

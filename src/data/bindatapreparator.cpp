@@ -12,8 +12,8 @@ using MCBinning::MCStatus;
 
 BINDataPreparator::BINDataPreparator(BINVarList* varList, BINCancelMonitor* cancelMonitor,
                                      const std::string& tempDirName, ProgressListener* listener,
-                                     int nSkippedCasesReports, Platform* platform, unsigned int maxNumRecords)
-    : fProgressListener(listener), fNSkippedCasesReports(nSkippedCasesReports), fVarList(varList),
+                                     int numSkippedCasesReports, Platform* platform, unsigned int maxNumRecords)
+    : fProgressListener(listener), fNSkippedCasesReports(numSkippedCasesReports), fVarList(varList),
       fCancelMonitor(cancelMonitor), fPlatform(platform), fLayout(*varList),
       fFiles(tempDirName, cancelMonitor, platform), fPass(*varList, fLayout, maxNumRecords)
 {

@@ -28,10 +28,10 @@ class BINDataPreparator
 {
 public:
     /// Fixes the layout; does no input or output. All that is pointed to outlives the object; the listener may be null.
-    /// `nSkippedCasesReports` is the number of records between two reports of the pass, 0 for no report.
+    /// `numSkippedCasesReports` is the number of records between two reports of the pass, 0 for no report.
     /// `maxNumRecords` is the number of records that can be accepted.
     BINDataPreparator(BINVarList* varList, BINCancelMonitor* cancelMonitor, const std::string& tempDirName,
-                      ProgressListener* listener, int nSkippedCasesReports, Platform* platform = SystemPlatform(),
+                      ProgressListener* listener, int numSkippedCasesReports, Platform* platform = SystemPlatform(),
                       unsigned int maxNumRecords = std::numeric_limits<unsigned int>::max());
     BINDataPreparator(const BINDataPreparator&) = delete;
     BINDataPreparator& operator=(const BINDataPreparator&) = delete;

@@ -181,9 +181,9 @@ private:
             while (next[value] < ends[value])
             {
                 Tuple inHand = tuples[next[value]];
-                for (std::size_t place = digit.Of(inHand); place != value; place = digit.Of(inHand))
+                for (std::size_t part = digit.Of(inHand); part != value; part = digit.Of(inHand))
                 {
-                    const std::size_t there = next[place]++;
+                    const std::size_t there = next[part]++;
                     PrefetchForWriting(tuples + std::min(there + kAhead, end));
                     std::swap(inHand, tuples[there]);
                 }
@@ -218,9 +218,10 @@ private:
         for (std::size_t i = 1; i < count; ++i)
         {
             const Tuple inHand = tuples[i];
-            std::size_t place = i;
-            for (; place > 0 && Precedes(inHand, tuples[place - 1]); --place) tuples[place] = tuples[place - 1];
-            tuples[place] = inHand;
+            std::size_t position = i;
+            for (; position > 0 && Precedes(inHand, tuples[position - 1]); --position)
+                tuples[position] = tuples[position - 1];
+            tuples[position] = inHand;
         }
     }
 

@@ -177,9 +177,9 @@ int BINVarList::FindVariable(const std::string& name) const
 {
     if (fNames != nullptr && fNames->IsUpToDate())
         return fNames->Find(name);
-    const auto place = std::find_if(fVars.begin(), fVars.end(),
+    const auto found = std::find_if(fVars.begin(), fVars.end(),
                                     [&name](const auto& variable) { return variable->GetVariableName() == name; });
-    return place == fVars.end() ? kNone : static_cast<int>(place - fVars.begin());
+    return found == fVars.end() ? kNone : static_cast<int>(found - fVars.begin());
 }
 
 int BINVarList::GetNumAttributeVars() const

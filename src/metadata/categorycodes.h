@@ -22,11 +22,11 @@ template<class Value, class Entry, class EntryOf>
 double FindOrAddCode(std::map<Value, int>& codes, std::vector<Entry>& table, int& lastCode, const Value& value,
                      EntryOf entryOf)
 {
-    const auto place = codes.lower_bound(value);
-    if (place != codes.end() && place->first == value)
-        return place->second;
+    const auto found = codes.lower_bound(value);
+    if (found != codes.end() && found->first == value)
+        return found->second;
     ReserveOneMore(table);
-    const auto added = codes.emplace_hint(place, value, lastCode + 1);
+    const auto added = codes.emplace_hint(found, value, lastCode + 1);
     // From here on nothing can fail: map, table and last code stay in step.
     table.push_back(entryOf(added->first));
     return ++lastCode;
@@ -36,8 +36,8 @@ double FindOrAddCode(std::map<Value, int>& codes, std::vector<Entry>& table, int
 template<class Value>
 double FindCode(const std::map<Value, int>& codes, const Value& value)
 {
-    const auto place = codes.find(value);
-    return place == codes.end() ? kMissingCode : place->second;
+    const auto found = codes.find(value);
+    return found == codes.end() ? kMissingCode : found->second;
 }
 
 /// Replaces all labels.

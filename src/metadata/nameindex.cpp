@@ -20,10 +20,10 @@ int BINVarList::NameIndex::Find(const std::string& name) const
         return -1;
     std::uint64_t number = std::numeric_limits<std::uint64_t>::max(); // a weight may bear the name, too
     for (auto found = begin; found != end; ++found) number = std::min(number, found->second->fNumber);
-    const auto place =
+    const auto found =
         std::lower_bound(fNames.begin(), fNames.end(), number,
                          [](const auto& candidate, std::uint64_t wanted) { return candidate->fNumber < wanted; });
-    return static_cast<int>(place - fNames.begin());
+    return static_cast<int>(found - fNames.begin());
 }
 
 void BINVarList::NameIndex::Append(IBINVariable& variable)
@@ -38,9 +38,9 @@ void BINVarList::NameIndex::Append(IBINVariable& variable)
 
 void BINVarList::NameIndex::Remove(int index)
 {
-    const auto place = fNames.begin() + index;
-    const auto [begin, end] = fNameOfText.equal_range((*place)->fText);
+    const auto name = fNames.begin() + index;
+    const auto [begin, end] = fNameOfText.equal_range((*name)->fText);
     fNameOfText.erase(
-        std::find_if(begin, end, [&place](const auto& candidate) { return candidate.second == place->get(); }));
-    fNames.erase(place);
+        std::find_if(begin, end, [&name](const auto& candidate) { return candidate.second == name->get(); }));
+    fNames.erase(name);
 }

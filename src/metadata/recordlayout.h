@@ -17,7 +17,7 @@ class BINVarList;
 int FindVariableWithoutPosition(const BINVarList& list);
 
 /// Tells where the variables of a list stand in a processed record: target, weight, attributes in list order, target
-/// and weight only where the list has one. A field's place in that record is its position; its place in the host's
+/// and weight only where the list has one. A field's index in that record is its position; its index in the host's
 /// record is the variable's index in the list.
 ///
 /// The layout is that of the list at the time of construction.

@@ -56,7 +56,7 @@ BINOutput::~BINOutput() = default;
 
 MCStatus BINOutput::SetAttributeTargetResults(MCStatus status, const std::set<double>& cutPoints,
                                               const std::vector<double>& cellCounts, int attribute, int target,
-                                              unsigned int nDistinctValues, double totalWeight,
+                                              unsigned int numDistinctValues, double totalWeight,
                                               double totalWeightWithMissing, double minimum, double maximum,
                                               double modelEntropy)
 {
@@ -69,7 +69,7 @@ MCStatus BINOutput::SetAttributeTargetResults(MCStatus status, const std::set<do
     entry.fTargetIndex = target;
     entry.fCutPoints.assign(cutPoints.begin(), cutPoints.end());
     entry.fCellCounts = SplitIntoRows(cellCounts, cutPoints.size() + 1);
-    entry.fNDistinctValues = nDistinctValues;
+    entry.fNDistinctValues = numDistinctValues;
     entry.fTotalWeight = totalWeight;
     entry.fTotalWeightWithMissing = totalWeightWithMissing;
     entry.fMinimum = minimum;
@@ -78,14 +78,14 @@ MCStatus BINOutput::SetAttributeTargetResults(MCStatus status, const std::set<do
 
     // What the indices need is allocated ahead of the entry, and linking it in can't throw: all fields grow, or none
     // does. A pair that has an entry already keeps its node, so that its first entry is the one that is found.
-    const int place = static_cast<int>(fResults.size());
+    const int index = static_cast<int>(fResults.size());
     decltype(fResultIndex) node;
-    node.emplace(std::make_pair(attribute, target), place);
-    std::vector<int>& placesOfAttribute = fAttributeIndex[attribute];
-    ReserveOneMore(placesOfAttribute);
+    node.emplace(std::make_pair(attribute, target), index);
+    std::vector<int>& indicesOfAttribute = fAttributeIndex[attribute];
+    ReserveOneMore(indicesOfAttribute);
     fResults.push_back(std::move(entry));
     fResultIndex.merge(node);
-    placesOfAttribute.push_back(place);
+    indicesOfAttribute.push_back(index);
     return MCStatus();
 }
 
@@ -100,14 +100,14 @@ MCStatus BINOutput::GetAttributeTargetCutPoints(int attribute, int target, BINAt
 
 MCStatus BINOutput::GetAttributeCutPoints(int attribute, std::vector<BINAttributeTargetResults>& results) const
 {
-    const auto places = fAttributeIndex.find(attribute);
+    const auto indices = fAttributeIndex.find(attribute);
     // A store that failed for want of memory may have left an attribute without an entry.
-    if (places == fAttributeIndex.end() || places->second.empty())
+    if (indices == fAttributeIndex.end() || indices->second.empty())
         return MakeError(MCBinning::BINStatusIndexOutOfRange);
 
     std::vector<BINAttributeTargetResults> found;
-    found.reserve(places->second.size());
-    for (const int place : places->second) found.push_back(fResults[static_cast<std::size_t>(place)]);
+    found.reserve(indices->second.size());
+    for (const int index : indices->second) found.push_back(fResults[static_cast<std::size_t>(index)]);
     const MCStatus lastStatus = found.back().GetStatus();
     ReserveMore(results, found.size()); // the last allocation
     std::move(found.begin(), found.end(), std::back_inserter(results));

@@ -28,7 +28,7 @@ EFBINOutput::~EFBINOutput() = default;
 
 MCStatus EFBINOutput::SetAttributeResults(MCStatus status, const std::vector<double>& cutPoints,
                                           const std::vector<double>& cellCounts, int attribute,
-                                          unsigned int nDistinctValues, double totalWeight,
+                                          unsigned int numDistinctValues, double totalWeight,
                                           double totalWeightWithMissing, double minimum, double maximum)
 {
     if (attribute < 0)
@@ -39,7 +39,7 @@ MCStatus EFBINOutput::SetAttributeResults(MCStatus status, const std::vector<dou
     entry.fAttributeIndex = attribute;
     entry.fCutPoints = cutPoints;
     entry.fCellCounts = cellCounts;
-    entry.fNDistinctValues = nDistinctValues;
+    entry.fNDistinctValues = numDistinctValues;
     entry.fTotalWeight = totalWeight;
     entry.fTotalWeightWithMissing = totalWeightWithMissing;
     entry.fMinimum = minimum;

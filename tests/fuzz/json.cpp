@@ -103,15 +103,15 @@ Json MakeOddValue(unsigned int choice)
 /// Takes an element out, puts one in a second time, or changes the order.
 void ChangeContainer(Json& container, std::mt19937& dice)
 {
-    const auto place = static_cast<std::ptrdiff_t>(dice() % container.size());
+    const auto position = static_cast<std::ptrdiff_t>(dice() % container.size());
     switch (dice() % 3)
     {
     case 0:
-        container.erase(std::next(container.begin(), place));
+        container.erase(std::next(container.begin(), position));
         break;
     case 1:
         if (container.is_array())
-            container.push_back(Json(*std::next(container.begin(), place)));
+            container.push_back(Json(*std::next(container.begin(), position)));
         break;
     default:
         if (container.is_array())

@@ -96,7 +96,7 @@ TEST_F(McbinInput, OrderOfRowsMakesNoDifference)
 
 TEST_F(McbinInput, AFileOfManyBlocksLosesNoRowAndNoLine)
 {
-    // Quoted and plain rows mixed, so that both ways of reading meet each other at every place of a block.
+    // Quoted and plain rows mixed, so that both ways of reading meet each other at every position of a block.
     std::string data = "x,padding\n";
     for (int i = 1; i <= 60000; ++i)
     {
@@ -155,7 +155,7 @@ TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
         {"x,y\n\"1\n\",a\n\n2\n", ", line 5: wrong number of fields: 1, but the header has 2"},
         {"x,y\n1,a\n2,\"b\n3,c\n", ", line 3: a quoted field in this row is never closed"},
         {"x,y\n1,a,b\n2,5\" disk\n", ", line 2: wrong number of fields: 3, but the header has 2"},
-        {"x,y\n1,a\n2,5\" disk\n", ", line 3: a quote in the wrong place: a field that holds one must be quoted, and "
+        {"x,y\n1,a\n2,5\" disk\n", ", line 3: a quote where none can be: a field that holds one must be quoted, and "
                                    "the quote in it doubled"},
         {"x,y\n1,a\n2,m\xFCnster\n",
          ", line 3: column 'y': 'm\\xfcnster' is not UTF-8 text; convert the file first, for "

@@ -24,7 +24,7 @@ enum class Fault
 
 struct FaultyColumn
 {
-    std::size_t place; ///< in the table
+    std::size_t position; ///< in the table
     Fault fault;
 };
 
@@ -32,7 +32,7 @@ Fault FindFault(const ColumnPlan& plan, const Column& column)
 {
     if (column.categories.size() > kMostCategories)
         return Fault::kTooManyCategories;
-    if (!column.IsUsed() || column.kind == ColumnKind::kCategorical || column.nTexts == 0)
+    if (!column.IsUsed() || column.kind == ColumnKind::kCategorical || column.numTexts == 0)
         return Fault::kNone;
     if (column.IsText())
         return column.isNamed ? Fault::kText : Fault::kNone;
@@ -54,14 +54,14 @@ Failure MakeFailure(const TableReader& table, const Column& column, const Faulty
     const long line = column.firstTextLine;
     const std::string advice = AdviseOn(column, faulty.fault);
     if (faulty.fault == Fault::kMixed)
-        return Failure(table.MakeNotANumber(line, faulty.place, column.firstText).what() + advice);
+        return Failure(table.MakeNotANumber(line, faulty.position, column.firstText).what() + advice);
     if (faulty.fault == Fault::kText)
     {
-        return table.MakeFailure(line, faulty.place,
+        return table.MakeFailure(line, faulty.position,
                                  "holds text, such as " + Quote(Shorten(column.firstText)) + advice);
     }
     return table.MakeFailure(
-        line, faulty.place,
+        line, faulty.position,
         fmt::format("more than {} categories, which are too many for a categorical attribute", kMostCategories) +
             advice);
 }
@@ -81,13 +81,13 @@ Failure MakeFailure(const TableReader& table, const ColumnPlan& plan, const std:
     { return std::any_of(faulty.begin(), faulty.end(), [=](const FaultyColumn& one) { return one.fault == fault; }); };
     std::vector<std::string> described;
     described.reserve(faulty.size());
-    for (const FaultyColumn& one : faulty) described.push_back(Describe(plan.columns[one.place], one.fault));
+    for (const FaultyColumn& one : faulty) described.push_back(Describe(plan.columns[one.position], one.fault));
     std::vector<std::string> advice{"--exclude leaves a column out"};
     if (has(Fault::kMixed) || has(Fault::kText))
         advice.emplace_back("--categorical bins its fields as categories");
     if (has(Fault::kMixed))
         advice.emplace_back("--bad missing takes what is no number as missing");
-    const auto isOrnamented = [&](const FaultyColumn& one) { return plan.columns[one.place].IsOrnamented(); };
+    const auto isOrnamented = [&](const FaultyColumn& one) { return plan.columns[one.position].IsOrnamented(); };
     if (std::any_of(faulty.begin(), faulty.end(), isOrnamented))
         advice.emplace_back(kPlainNumbers);
     return table.MakeFailure(fmt::format("{} columns cannot be binned as they are: {}; {}", faulty.size(),
@@ -105,7 +105,7 @@ void ThrowIfFaulty(const TableReader& table, const ColumnPlan& plan)
             faulty.push_back({i, fault});
     }
     if (faulty.size() == 1)
-        throw MakeFailure(table, plan.columns[faulty.front().place], faulty.front());
+        throw MakeFailure(table, plan.columns[faulty.front().position], faulty.front());
     if (!faulty.empty())
         throw MakeFailure(table, plan, faulty);
 }

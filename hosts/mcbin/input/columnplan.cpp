@@ -74,7 +74,9 @@ Indices FindColumns(const TableReader& table, const std::vector<std::string>& li
 {
     Indices found;
     for (const std::string& pattern : SplitNames(table, lists))
+    {
         for (const std::size_t column : FindColumns(table, pattern)) found.push_back(column);
+    }
     return found;
 }
 
@@ -164,7 +166,9 @@ void SetPairs(ColumnPlan& plan, const TableReader& table, const ColumnOptions& o
 void SetAttributes(ColumnPlan& plan, const TableReader& table, const ColumnOptions& options)
 {
     if (options.attributes.empty())
+    {
         for (Column& column : plan.columns) column.isAttribute = !column.isTarget && !column.isWeight;
+    }
     for (const std::string& pattern : SplitNames(table, options.attributes))
     {
         for (const std::size_t i : FindColumns(table, pattern))
@@ -283,7 +287,7 @@ std::vector<std::string> ColumnPlan::DescribeLeftOut() const
     std::vector<std::string> described;
     for (const Column& column : columns)
     {
-        if (column.nTexts > 0 && !column.IsUsed())
+        if (column.numTexts > 0 && !column.IsUsed())
         {
             described.push_back(Printable(column.name) + " (" + Quote(Shorten(column.firstText)) + " in line " +
                                 std::to_string(column.firstTextLine) + ")");
@@ -317,7 +321,9 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     for (const std::string& declaration : options.missing) DeclareMissing(plan, table, declaration);
     // A database, or any other reader of typed columns, sees the number and not the text that stands for it here.
     for (Column& column : plan.columns)
+    {
         for (const std::string& text : plan.missingTexts) AddMissingNumber(column, text);
+    }
     ThrowUnlessText(plan);
     return plan;
 }

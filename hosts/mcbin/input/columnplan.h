@@ -36,21 +36,21 @@ struct Column
     std::optional<std::pair<double, double>> missingInterval;
 
     bool isBelieved = false;                       ///< to hold numbers alone, by its first rows
-    long nNumbers = 0;                             ///< fields that are numbers, of those looked at
-    long nTexts = 0;                               ///< fields that are something else
-    long nOrnamented = 0;                          ///< of the latter: numbers with signs such as $ around or in them
+    long numNumbers = 0;                           ///< fields that are numbers, of those looked at
+    long numTexts = 0;                             ///< fields that are something else
+    long numOrnamented = 0;                        ///< of the latter: numbers with signs such as $ around or in them
     std::string firstOrnamented;                   ///< the first of these
-    std::string firstText;                         ///< the first of nTexts, or the category that is one too many
+    std::string firstText;                         ///< the first of numTexts, or the category that is one too many
     long firstTextLine = 0;                        ///< its line
     std::set<std::string, std::less<>> categories; ///< the different fields, if it may be categorical
 
     bool IsUsed() const { return isAttribute || isTarget || isWeight; }
 
     /// Whether it holds text, as at least half of its fields do, and wasn't said to hold anything else.
-    bool IsText() const { return kind == ColumnKind::kUnknown && nTexts > 0 && nTexts >= nNumbers; }
+    bool IsText() const { return kind == ColumnKind::kUnknown && numTexts > 0 && numTexts >= numNumbers; }
 
     /// Whether its texts are numbers for the most part, written with signs that this tool doesn't read.
-    bool IsOrnamented() const { return nOrnamented > nTexts / 2; }
+    bool IsOrnamented() const { return numOrnamented > numTexts / 2; }
 
     /// Whether the number is declared missing.
     bool IsMissing(double number) const;
@@ -63,9 +63,9 @@ struct ColumnPlan
     std::vector<std::pair<std::size_t, std::size_t>> pairs; ///< attribute and target; empty without a list of pairs
     std::vector<std::string> missingTexts;                  ///< of all columns, beside the empty one
     bool isBadMissing = false;
-    long nRows = 0;
-    WeightTally weights;     ///< of all rows, if a column holds weights
-    long nWithoutWeight = 0; ///< rows whose weight is missing
+    long numRows = 0;
+    WeightTally weights;       ///< of all rows, if a column holds weights
+    long numWithoutWeight = 0; ///< rows whose weight is missing
 
     /// Whether the field stands for a missing value as text, before it is looked at as a number.
     bool IsMissing(const Column& column, std::string_view field) const

@@ -242,7 +242,7 @@ void CsvReader::Parse(std::string_view text)
     {
         if (csv_error(fParser.get()) != CSV_EPARSE)
             throw std::bad_alloc();
-        Fail("a quote in the wrong place: a field that holds one must be quoted, and the quote in it doubled");
+        Fail("a quote where none can be: a field that holds one must be quoted, and the quote in it doubled");
     }
     else if (csv_get_buffer_size(fParser.get()) > kLongestField)
         Fail("a field of more than 16 MB; is a closing quote missing?");

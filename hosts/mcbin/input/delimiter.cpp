@@ -27,9 +27,9 @@ std::vector<Counts> CountInLines(std::string_view text)
             isQuoted = !isQuoted; // a doubled one does so twice
         if (isQuoted)
             continue;
-        const auto place = std::find(kDelimiters.begin(), kDelimiters.end(), c);
-        if (place != kDelimiters.end())
-            ++counts[static_cast<std::size_t>(place - kDelimiters.begin())];
+        const auto found = std::find(kDelimiters.begin(), kDelimiters.end(), c);
+        if (found != kDelimiters.end())
+            ++counts[static_cast<std::size_t>(found - kDelimiters.begin())];
         const bool isEnd = c == '\n' || c == '\r';
         isBlank = isBlank && isEnd;
         if (!isEnd || isBlank)

@@ -19,7 +19,7 @@ constexpr const char* kChanged = "the file has changed while it was read";
 TableRecordSource::TableRecordSource(TableReader& table, const ColumnPlan& plan, Variables& variables,
                                      Progress& progress)
     : fTable(table), fPlan(plan), fProgress(progress), fWeightGrid(plan.weights), fValues(variables.columns.size()),
-      fRowsLeft(plan.nRows), fRecord(static_cast<int>(variables.columns.size()))
+      fRowsLeft(plan.numRows), fRecord(static_cast<int>(variables.columns.size()))
 {
     for (std::size_t i = 0; i < variables.columns.size(); ++i)
     {

@@ -18,12 +18,12 @@ namespace
 
 void NoteText(Column& column, std::string_view field, long line)
 {
-    if (column.nTexts++ == 0)
+    if (column.numTexts++ == 0)
     {
         column.firstText = field;
         column.firstTextLine = line;
     }
-    if (!FindOrnaments(field).empty() && column.nOrnamented++ == 0)
+    if (!FindOrnaments(field).empty() && column.numOrnamented++ == 0)
         column.firstOrnamented = field;
 }
 
@@ -32,41 +32,42 @@ void ProfileNumber(Column& column, std::string_view field, long line, Care care)
     constexpr long kManyNumbers = 1000;
     if (ParseNumber(field))
     {
-        ++column.nNumbers;
-        column.isBelieved = care == Care::kHasty && column.nTexts == 0 && column.nNumbers >= kManyNumbers;
+        ++column.numNumbers;
+        column.isBelieved = care == Care::kHasty && column.numTexts == 0 && column.numNumbers >= kManyNumbers;
         return;
     }
     NoteText(column, field, line);
 }
 
 /// A weight is looked at in every row: on all of them together depends what the library is given for each.
-void ProfileWeight(const TableReader& table, ColumnPlan& plan, std::size_t place, std::string_view field, long line)
+void ProfileWeight(const TableReader& table, ColumnPlan& plan, std::size_t position, std::string_view field, long line)
 {
-    Column& column = plan.columns[place];
+    Column& column = plan.columns[position];
     const double weight = ParseNumberOrNaN(field);
     if (ColumnPlan::IsWeight(column, weight))
     {
         plan.weights.Add(weight);
         return;
     }
-    ++plan.nWithoutWeight;
+    ++plan.numWithoutWeight;
     if (std::isnan(weight))
         NoteText(column, field, line);
     if (plan.isBadMissing || std::isnan(weight) || column.IsMissing(weight))
         return;
-    throw table.MakeFailure(line, place,
+    throw table.MakeFailure(line, position,
                             "the weight " + Quote(Shorten(field)) + (weight < 0.0 ? " is negative" : " is infinite") +
                                 "; --bad missing leaves such rows out");
 }
 
-void ProfileCategory(const TableReader& table, Column& column, std::size_t place, std::string_view field, long line)
+void ProfileCategory(const TableReader& table, Column& column, std::size_t position, std::string_view field, long line)
 {
     if (column.categories.find(field) != column.categories.end() || column.categories.size() > kMostCategories)
         return;
     if (!IsText(field))
     {
-        throw table.MakeFailure(
-            line, place, Quote(Shorten(field)) + " is not UTF-8 text; convert the file first, for instance with iconv");
+        throw table.MakeFailure(line, position,
+                                Quote(Shorten(field)) +
+                                    " is not UTF-8 text; convert the file first, for instance with iconv");
     }
     column.categories.emplace(field);
     if (column.categories.size() <= kMostCategories)
@@ -74,7 +75,7 @@ void ProfileCategory(const TableReader& table, Column& column, std::size_t place
     // Nothing can be done without the target. Of the others all are to be told together.
     if (column.isTarget)
     {
-        throw table.MakeFailure(line, place,
+        throw table.MakeFailure(line, position,
                                 fmt::format("more than {} categories, which are too many for a target; how a column of "
                                             "numbers becomes one is told by 'mcbin supervised --help'",
                                             kMostCategories));
@@ -83,21 +84,21 @@ void ProfileCategory(const TableReader& table, Column& column, std::size_t place
     column.firstTextLine = line;
 }
 
-void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t place, std::string_view field, long line,
+void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t position, std::string_view field, long line,
                   Care care)
 {
-    Column& column = plan.columns[place];
+    Column& column = plan.columns[position];
     if (column.isBelieved || !column.IsUsed())
         return;
     if (plan.IsMissing(column, field))
     {
-        plan.nWithoutWeight += column.isWeight ? 1 : 0;
+        plan.numWithoutWeight += column.isWeight ? 1 : 0;
         return;
     }
     if (column.isWeight)
-        ProfileWeight(table, plan, place, field, line);
+        ProfileWeight(table, plan, position, field, line);
     else if (column.kind == ColumnKind::kCategorical)
-        ProfileCategory(table, column, place, field, line);
+        ProfileCategory(table, column, position, field, line);
     else
         ProfileNumber(column, field, line, care);
 }
@@ -119,10 +120,10 @@ void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care
     while (const CsvRow* const row = table.NextRow())
     {
         progress.CountRow();
-        ++plan.nRows;
+        ++plan.numRows;
         for (std::size_t i = 0; i < row->Size(); ++i) ProfileField(table, plan, i, (*row)[i], row->GetLine(), care);
     }
-    if (plan.nRows == 0)
+    if (plan.numRows == 0)
         throw table.MakeFailure("there is no row below the header");
     ThrowIfFaulty(table, plan);
     for (Column& column : plan.columns)

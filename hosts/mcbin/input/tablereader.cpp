@@ -45,9 +45,9 @@ TableReader::TableReader(const TableOptions& options) : fReader(Open(options))
 
 std::size_t TableReader::FindColumn(const std::string& name) const
 {
-    const auto place = std::find(fColumnNames.begin(), fColumnNames.end(), name);
-    if (place != fColumnNames.end())
-        return static_cast<std::size_t>(place - fColumnNames.begin());
+    const auto found = std::find(fColumnNames.begin(), fColumnNames.end(), name);
+    if (found != fColumnNames.end())
+        return static_cast<std::size_t>(found - fColumnNames.begin());
     constexpr std::size_t kMostNames = 20;
     std::vector<std::string> some;
     for (std::size_t i = 0; i < std::min(kMostNames, fColumnNames.size()); ++i)

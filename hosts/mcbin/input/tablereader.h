@@ -19,7 +19,7 @@ struct TableOptions
 };
 
 /// Reads a table: a delimited file whose first row names the columns, and whose every other row has a field for each of
-/// them. A column without a name is called "column 1", "column 2", ... after its place.
+/// them. A column without a name is called "column 1", "column 2", ... after its position.
 class TableReader
 {
 public:
@@ -34,7 +34,7 @@ public:
     char GetDelimiter() const { return fReader.GetDelimiter(); }
     const std::string& GetName() const { return fReader.GetName(); }
 
-    /// The place of the column, from 0. \throw Failure, which tells what columns there are, if there is none of the
+    /// The position of the column, from 0. \throw Failure, which tells what columns there are, if there is none of the
     /// name.
     std::size_t FindColumn(const std::string& name) const;
 
@@ -45,7 +45,7 @@ public:
     /// Goes back to the first row below the header of a table that is read more than once.
     void Rewind();
 
-    /// What is wrong with the file, with the row, or with a field in it, with the place put in front.
+    /// What is wrong with the file, with the row, or with a field in it, with the line and the column put in front.
     Failure MakeFailure(const std::string& words) const;
     Failure MakeFailure(long line, const std::string& words) const;
     Failure MakeFailure(long line, std::size_t column, const std::string& words) const;

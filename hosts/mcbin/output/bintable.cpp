@@ -137,7 +137,9 @@ std::vector<std::size_t> GetWidths(const std::vector<std::vector<std::string>>& 
 {
     std::vector<std::size_t> widths(rows.front().size());
     for (const std::vector<std::string>& row : rows)
+    {
         for (std::size_t i = 0; i < row.size(); ++i) widths[i] = std::max(widths[i], GetWidth(row[i]));
+    }
     return widths;
 }
 

@@ -61,9 +61,9 @@ TEST(TupleSort, PutsAllKindsOfValuesInOrder)
             EXPECT_EQ(CompleteKey(leftOver), CompleteKey(tuples.back())) << "behind the tuples that count";
             for (std::size_t i = 0; i < expected.size(); ++i)
             {
-                ASSERT_EQ(CompleteKey(expected[i]), CompleteKey(tuples[i])) << "place " << i;
-                ASSERT_EQ(expected[i].fValue, byValueAlone[i].fValue) << "place " << i;
-                ASSERT_EQ(std::signbit(expected[i].fValue), std::signbit(byValueAlone[i].fValue)) << "place " << i;
+                ASSERT_EQ(CompleteKey(expected[i]), CompleteKey(tuples[i])) << "tuple " << i;
+                ASSERT_EQ(expected[i].fValue, byValueAlone[i].fValue) << "tuple " << i;
+                ASSERT_EQ(std::signbit(expected[i].fValue), std::signbit(byValueAlone[i].fValue)) << "tuple " << i;
             }
         }
     }
