@@ -9,7 +9,8 @@ begin()
     echo "== $step"
 }
 
-# Installs those of the named Debian packages that are missing, and says which. Says nothing if there are none.
+# Installs those of the named Debian packages that are missing, and says which before it does, and how to be asked first.
+# Says nothing if there are none. With NO_INSTALL set it only says which, and fails.
 install_packages()
 {
     local package missing=() as_root=()
@@ -19,6 +20,11 @@ install_packages()
     done
     [[ ${#missing[@]} -gt 0 ]] || return 0
 
+    echo "This machine lacks the Debian packages ${missing[*]}"
+    if [[ -n ${NO_INSTALL:-} ]]; then
+        echo "They are not installed, since NO_INSTALL is set. To do it: apt-get install ${missing[*]}" >&2
+        return 1
+    fi
     if ! command -v apt-get >/dev/null; then
         echo "There is no apt-get here. Needed are what Debian calls ${missing[*]}" >&2
         return 1
@@ -31,7 +37,7 @@ install_packages()
         as_root=(sudo)
     fi
 
-    begin "installing ${missing[*]}"
+    begin "installing them with apt-get; NO_INSTALL=1 in the environment keeps ./test and ./quickstart from it"
     "${as_root[@]}" apt-get update -qq
     "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive \
         apt-get install -qq --no-install-recommends -o DPkg::Lock::Timeout=300 "${missing[@]}" >/dev/null
