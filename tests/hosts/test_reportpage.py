@@ -10,8 +10,7 @@ import subprocess
 import numpy as np
 import pytest
 from matplotlib.image import imread
-
-webdriver = pytest.importorskip("selenium.webdriver")
+from selenium import webdriver
 
 # Weights, missing data, two targets of which one has three categories, and names that HTML would misread.
 COLOURS = ["red", "green", "<i>"]
@@ -39,7 +38,7 @@ INK_AND_GROUND = """const style = getComputedStyle(document.body); return [style
 def browser(tmp_path_factory):
     chromium, driver = shutil.which("chromium"), shutil.which("chromedriver")
     if not (chromium and driver):
-        pytest.skip("there are no chromium and chromedriver")
+        pytest.skip("needs chromium and chromedriver")
     options = webdriver.ChromeOptions()
     options.binary_location = chromium
     for name in ("headless", "no-sandbox", "disable-gpu", "hide-scrollbars", "disable-background-networking"):
