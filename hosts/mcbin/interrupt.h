@@ -3,8 +3,8 @@
 
 #include <mcobnqrt/mcquerycancel.h>
 
-/// From now on the first Ctrl-C, or another signal that asks for the end, only makes a note of it; the second one ends
-/// the program at once. Writing to a closed pipe, or beyond the largest file, becomes an ordinary error.
+/// From now on the first Ctrl-C, or another signal that asks for the end, only sets the flag that IsInterrupted() reads; the
+/// second one ends the program at once. Writing to a closed pipe, or beyond the largest file, becomes an ordinary error.
 void CatchSignals();
 
 bool IsInterrupted();
@@ -16,7 +16,7 @@ struct Interrupted
 
 void ThrowIfInterrupted();
 
-/// Tells the library of the note.
+/// Cancels a run of the library when IsInterrupted().
 class InterruptQuery : public MCQueryCancel
 {
 public:

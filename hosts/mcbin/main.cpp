@@ -51,7 +51,7 @@ std::string Print(const Outcome& outcome, const OutputOptions& options)
     return os.str();
 }
 
-/// All that is said on standard error, in one line each, goes through here: it quotes names and texts of the data.
+/// Prints a message on standard error, in one line. Messages quote names and texts of the data, so they are made printable.
 void Tell(const std::string& words)
 {
     std::cerr << "mcbin: " << Printable(words) << '\n';
@@ -65,7 +65,7 @@ void WriteOut(const std::string& text)
 }
 
 /// Writes the page unless a signal has asked for the end: the page of a whole run is worth more than that of a part.
-/// \return what has gone wrong, for later: a full disk is no reason to lose the tables.
+/// \return the failure, to be thrown once the tables are printed: a full disk is no reason to lose them.
 std::exception_ptr WriteReport(OutputFile& report, const Outcome& outcome)
 {
     try
@@ -87,7 +87,7 @@ std::exception_ptr WriteReport(OutputFile& report, const Outcome& outcome)
     return nullptr;
 }
 
-/// Behind a signal nothing is a success, even if the last record had been read.
+/// After a signal the exit code tells of it, even if the last record had been read.
 int GetExitCode(const Outcome& outcome, bool isStrict)
 {
     if (IsInterrupted())
@@ -114,7 +114,7 @@ int Bin(const BinOptions& options)
     const std::exception_ptr failure = report ? WriteReport(*report, outcome) : nullptr;
     WriteOut(Print(outcome, options.output));
     for (const std::string& note : outcome.notes) Tell(note);
-    // The other forms have a row or a line of their own for it.
+    // JSON and the tables hold these attributes with their status.
     if (options.output.format == Format::kSql || options.output.format == Format::kCsv)
     {
         for (const std::string& unbinned : DescribeUnbinned(outcome.bins)) Tell(unbinned);

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-// What there is to tell of the tool, apart from how its command line is parsed.
+// The texts of the help, without the parser that they are taken from.
 
 struct OptionHelp
 {

@@ -41,7 +41,7 @@ std::string DescribeWeights(double weight, long records)
                        records);
 }
 
-/// What is true of a column with texts that has no fault: either all of it or its texts don't count.
+/// A note on a column with texts that has no fault: either the column is left out, or its texts count as missing.
 std::string DescribeOrnamented(const Column& column)
 {
     return fmt::format("note: column {} {}, but looks like numbers, such as {}; {}", Quote(column.name),

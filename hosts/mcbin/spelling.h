@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-/// The first of the names that may be meant by `word`: one that begins with it, or that it is with a few letters mistyped.
+/// The first name that `word` may stand for: one that begins with it, or differs from it by a few letters.
 std::optional<std::string> FindNear(const std::string& word, const std::vector<std::string>& names);
 
 #endif

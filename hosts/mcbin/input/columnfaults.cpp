@@ -39,7 +39,7 @@ Fault FindFault(const ColumnPlan& plan, const Column& column)
     return plan.isBadMissing ? Fault::kNone : Fault::kMixed;
 }
 
-/// The way out for a single column.
+/// Advice to the user for a single column.
 std::string AdviseOn(const Column& column, Fault fault)
 {
     const bool isFree = column.isAttribute && column.kind == ColumnKind::kUnknown;

@@ -35,13 +35,13 @@ struct Column
     std::vector<double> missingNumbers;    ///< those of them, and of the texts of all columns, that are numbers
     std::optional<std::pair<double, double>> missingInterval;
 
-    bool isBelieved = false;                       ///< to hold numbers alone, by its first rows
-    long numNumbers = 0;                           ///< fields that are numbers, of those looked at
-    long numTexts = 0;                             ///< fields that are something else
-    long numOrnamented = 0;                        ///< of the latter: numbers with signs such as $ around or in them
-    std::string firstOrnamented;                   ///< the first of these
+    bool isBelieved = false; ///< its first rows hold numbers alone, so the first pass leaves the others to the second
+    long numNumbers = 0;     ///< fields that are numbers, of those looked at
+    long numTexts = 0;       ///< fields that are something else
+    long numOrnamented = 0;  ///< texts that are numbers with signs such as $ around or in them
+    std::string firstOrnamented;                   ///< the first text with such signs
     std::string firstText;                         ///< the first of numTexts, or the category that is one too many
-    long firstTextLine = 0;                        ///< its line
+    long firstTextLine = 0;                        ///< line of firstText
     std::set<std::string, std::less<>> categories; ///< the different fields, if it may be categorical
 
     bool IsUsed() const { return isAttribute || isTarget || isWeight; }
@@ -56,7 +56,7 @@ struct Column
     bool IsMissing(double number) const;
 };
 
-/// All columns of a table in their order, and what is to be done with them.
+/// All columns of a table, in their order, with their parts in the analysis.
 struct ColumnPlan
 {
     std::vector<Column> columns;

@@ -10,7 +10,8 @@
 
 // Almost every line of almost every file has no quote. Such a line is a row, and is cut at its delimiters where it
 // stands in the buffer: libcsv, which goes character by character and copies, needs six times as long. It gets the
-// lines from one with a quote on, until the row that began there has ended; so all that makes the format hard is its.
+// lines from one with a quote on, until the row that began there has ended; so libcsv deals with all that makes the format
+// hard.
 
 namespace
 {
@@ -41,7 +42,7 @@ std::string_view MakeView(const char* begin, const char* end)
     return std::string_view(begin, static_cast<std::size_t>(end - begin));
 }
 
-/// What is left without the spaces around it.
+/// The text without the spaces around it.
 inline std::string_view Trim(const char* begin, const char* end, char delimiter)
 {
     // Above a space there is nothing to be dropped, and that is nearly every character.

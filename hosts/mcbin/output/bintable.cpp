@@ -24,7 +24,7 @@ using Rows = std::vector<std::vector<std::string>>;
 constexpr std::size_t kWidestBar = 30;
 constexpr std::size_t kNarrowestBar = 10;
 constexpr std::size_t kWidestLabel = 60;
-/// So many categories have a column each where the width doesn't limit them.
+/// How many categories have a column each at most, however wide the screen.
 constexpr std::size_t kMostCategoryColumns = 12;
 
 /// What a table shows beside the bin, its weight and its share.
@@ -58,7 +58,7 @@ Extent MakeWidest(const Content& content, const Screen& screen)
             std::min(kWidestLabel, screen.width.value_or(2 * kWidestLabel) / 2)};
 }
 
-/// Gives up what is missed least: of many categories the lightest, of two the bar, as the rate says the same.
+/// Gives up what is missed least: the column of the lightest of many categories, or the bar, as the rate repeats it.
 /// \return false if there is nothing more to give up.
 bool Narrow(Extent& extent)
 {

@@ -65,7 +65,7 @@ std::string ShareBar::GetLegend() const
     return legend + "\n";
 }
 
-/// Of the whole bar: the part of each shade.
+/// The part of each shade in the bar.
 std::vector<double> ShareBar::GetParts(const Bin& bin) const
 {
     if (bin.weights.empty())

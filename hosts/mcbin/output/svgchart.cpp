@@ -16,7 +16,7 @@
 namespace
 {
 
-// In the units of the picture, which is as wide as the page or a telephone allows.
+// Lengths in units of the picture, which is scaled to the width of the page or of a telephone.
 constexpr double kWidth = 480.0;
 constexpr double kLeft = 44.0;
 constexpr double kRight = 8.0;
@@ -48,7 +48,7 @@ Layout MakeLayout(const AttributeBins& bins)
     return layout;
 }
 
-/// By category: its colour. The heaviest have their own, in the order of their codes, and all others share one.
+/// The colour of each category, by code: the heaviest have one each, and all others share one.
 std::vector<std::size_t> ChooseColours(const AttributeBins& bins)
 {
     const std::vector<double> weights = SumByCategory(bins);
