@@ -20,8 +20,8 @@ public:
         bool isBad = false;             ///< no number where one should be, or a category never seen
     };
 
-    /// `missingTexts` count as missing beside what the attribute declares; a number in them stands for all ways to write
-    /// the number, where the attribute has numbers. `bins` must outlive the object.
+    /// `missingTexts` count as missing beside what the attribute declares; a number in them stands for all ways to
+    /// write the number, where the attribute has numbers. `bins` must outlive the object.
     Binner(const AttributeBins& bins, const std::vector<std::string>& missingTexts);
 
     Found Find(std::string_view field);

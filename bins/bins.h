@@ -71,7 +71,8 @@ struct Bin
     std::vector<double> weights; ///< by category of the target; empty without a target
 };
 
-/// The bins of one attribute, against one target or none. It stands alone: whatever is said about it needs nothing else.
+/// The bins of one attribute, against one target or none. It stands alone: whatever is said about it needs nothing
+/// else.
 struct AttributeBins
 {
     std::shared_ptr<const Variable> attribute; ///< never null
@@ -85,8 +86,8 @@ struct AttributeBins
     std::optional<double> maximum;
     std::optional<double> modelEntropy; ///< of the target within the bins, in bits; nothing where there are no bins
     std::vector<double> cutPoints;      ///< ascending; of a categorical attribute between codes
-    /// The cut points as people read them, where a host knows better than FormatValue(): of timestamps that are shown in a
-    /// time zone. Otherwise empty. It is not part of the form in JSON.
+    /// The cut points as people read them, where a host knows better than FormatValue(): of timestamps that are shown
+    /// in a time zone. Otherwise empty. It is not part of the form in JSON.
     std::vector<std::string> borderTexts;
     std::vector<Bin> bins; ///< one more than cut points, or none where nothing was binned
 

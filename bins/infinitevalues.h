@@ -33,8 +33,8 @@ public:
     /// The cut point that divides the values of the data as `cutPoint` divides those of the library.
     ///
     /// One between the last finite value and an infinity is the midpoint of the value and a stand-in for the library.
-    /// As the midpoint of a number and an infinity is the infinity, it becomes the value that the closed side of the bin
-    /// allows: the finite one or the infinity.
+    /// As the midpoint of a number and an infinity is the infinity, it becomes the value that the closed side of the
+    /// bin allows: the finite one or the infinity.
     double DecodeCutPoint(double cutPoint, bool isRightClosed) const;
 
 private:

@@ -8,8 +8,8 @@
 #include <string>
 #include <vector>
 
-/// Makes a JsonValue of what a parser meets, in the order of the text. The caller sees to it that each object and array is
-/// ended, and that a key stands in front of each value in an object.
+/// Makes a JsonValue of what a parser meets, in the order of the text. The caller sees to it that each object and array
+/// is ended, and that a key stands in front of each value in an object.
 class JsonBuilder
 {
 public:

@@ -9,8 +9,8 @@
 
 // What bins and the columns of bins are called.
 
-/// The value as people read it: a number as FormatNumber writes it, "false" and "true", a date, or a timestamp. One that
-/// is shown in a time zone is followed by "+00:00", as this knows no zones.
+/// The value as people read it: a number as FormatNumber writes it, "false" and "true", a date, or a timestamp. One
+/// that is shown in a time zone is followed by "+00:00", as this knows no zones.
 std::string FormatValue(double value, const Variable& variable);
 
 /// The cut points, where one between two days or two microseconds is the nearest of these that parts the same dates or

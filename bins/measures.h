@@ -28,8 +28,8 @@ struct Evidence
 {
     /// The share of the bin's weight that has the event.
     double rate;
-    /// The weight of evidence ln(p / q): p is the bin's share of all events, and q its share of all others. Infinite where
-    /// one of them is 0, and 0 where both are.
+    /// The weight of evidence ln(p / q): p is the bin's share of all events, and q its share of all others. Infinite
+    /// where one of them is 0, and 0 where both are.
     double weightOfEvidence;
     /// (p - q) ln(p / q). The sum over the bins is the information value of the attribute.
     double informationValue;
@@ -41,7 +41,8 @@ std::vector<Evidence> ComputeEvidence(const AttributeBins& bins);
 /// Nothing where ComputeEvidence() is empty.
 std::optional<double> ComputeInformationValue(const AttributeBins& bins);
 
-/// Results with the largest gain first, those of equal gain, or without one, in their order. Only those with cut points.
+/// Results with the largest gain first, those of equal gain, or without one, in their order. Only those with cut
+/// points.
 std::vector<const AttributeBins*> SortByGain(const Bins& bins);
 
 #endif

@@ -12,7 +12,8 @@ namespace
 
 constexpr double kNaN = std::numeric_limits<double>::quiet_NaN();
 
-/// The number, or a NaN if it is too large for a double. from_chars doesn't tell that from one that is too small for it.
+/// The number, or a NaN if it is too large for a double. from_chars doesn't tell that from one that is too small for
+/// it.
 double ParseOutOfRange(std::string_view text)
 {
     std::istringstream stream{std::string(text)};

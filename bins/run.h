@@ -29,8 +29,8 @@ struct RunHost
 /// Runs the library as `bins.settings` say, and adds to `bins` what comes of it: the component's version, the status of
 /// the run, the results, and the grid of the weights.
 ///
-/// `variables` are those of `bins`, in their order. `attributes` and `targets` are lists of variable indices, or null, as
-/// IBINAlgorithm::Run() takes them. With equal frequency `targets` is not looked at.
+/// `variables` are those of `bins`, in their order. `attributes` and `targets` are lists of variable indices, or null,
+/// as IBINAlgorithm::Run() takes them. With equal frequency `targets` is not looked at.
 ///
 /// If the run fails there are no results but those that it had found before, and the status tells why. What the host's
 /// objects throw comes through.

@@ -30,7 +30,8 @@ double RoundToWhole(double weight, WeightRounding rounding)
 }
 
 /// The least whole E with n w <= 2^E. Both are split into a fraction in [0.5, 1) and a power of two, so that nothing
-/// overflows; where the rounded product of the fractions is 0.5, the fused operation tells whether the true one is more.
+/// overflows; where the rounded product of the fractions is 0.5, the fused operation tells whether the true one is
+/// more.
 int CeilLog2OfProduct(double n, double w)
 {
     int exponentOfN = 0;
@@ -95,8 +96,8 @@ double WeightGrid::Round(double weight)
     const double rounded = RoundToWhole(weight, fRounding);
     if (!(rounded > 0.0))
         return 0.0;
-    // In units of g a weight is at most 2^52, and from 2^52 on doubles are whole, so adding 2^52 rounds as nearbyint does,
-    // in a fraction of its time. Where a product is a denormal and loses digits, it is far below half a unit.
+    // In units of g a weight is at most 2^52, and from 2^52 on doubles are whole, so adding 2^52 rounds as nearbyint
+    // does, in a fraction of its time. Where a product is a denormal and loses digits, it is far below half a unit.
     constexpr double kWholeFrom = 4503599627370496.0;
     const double units = std::max(1.0, rounded * fInverses[0] * fInverses[1] + kWholeFrom - kWholeFrom);
     double onGrid = units * fFactors[0] * fFactors[1];

@@ -59,7 +59,8 @@ public:
 
 private:
     WeightRounding fRounding;
-    // g as the product of two powers of two, which are in the middle of the range of doubles, and so are their inverses.
+    // g as the product of two powers of two, which are in the middle of the range of doubles, and so are their
+    // inverses.
     double fFactors[2];
     double fInverses[2];
     bool fHasMoved = false;

@@ -12,8 +12,8 @@ write_basic_package_version_file(MCOBNQRTConfigVersion.cmake COMPATIBILITY SameM
 install(FILES ${CMAKE_CURRENT_BINARY_DIR}/MCOBNQRTConfig.cmake ${CMAKE_CURRENT_BINARY_DIR}/MCOBNQRTConfigVersion.cmake
         DESTINATION ${packageDir})
 
-# The .pc file finds the prefix from its own place, so that the tree can be moved. libdir may have more than one level, as in
-# lib/x86_64-linux-gnu, and it stays an absolute path if it was given as one.
+# The .pc file finds the prefix from its own place, so that the tree can be moved. libdir may have more than one level,
+# as in lib/x86_64-linux-gnu, and it stays an absolute path if it was given as one.
 file(RELATIVE_PATH prefixFromPkgConfig ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
 string(REGEX REPLACE "/$" "" prefixFromPkgConfig ${prefixFromPkgConfig})
 cmake_path(APPEND libdirForPkgConfig "\${prefix}" ${CMAKE_INSTALL_LIBDIR})

@@ -1,11 +1,11 @@
-# What holds for the code of this project: its warnings and the sanitizers of a test build, which are never a user's, and the
-# hardening of a release, which a project that takes in the sources has to ask for.
+# What holds for the code of this project: its warnings and the sanitizers of a test build, which are never a user's,
+# and the hardening of a release, which a project that takes in the sources has to ask for.
 include(CheckCXXSourceCompiles)
 include(CheckLinkerFlag)
 include(CheckPIESupported)
 
-# Level 3 also checks against sizes that are known at run time only. Where the compiler or the C library doesn't have it, the
-# latter warns and falls back on level 2.
+# Level 3 also checks against sizes that are known at run time only. Where the compiler or the C library doesn't have
+# it, the latter warns and falls back on level 2.
 function(mcobnqrt_find_fortify_level)
   set(CMAKE_REQUIRED_FLAGS "-O2 -Werror -U_FORTIFY_SOURCE -D_FORTIFY_SOURCE=3")
   check_cxx_source_compiles("#include <cstdio>\nint main() { return std::puts(\"\"); }" MCOBNQRT_HAS_FORTIFY_3)
@@ -16,9 +16,10 @@ function(mcobnqrt_find_linker_protections)
   check_linker_flag(CXX LINKER:-z,relro,-z,now MCOBNQRT_HAS_RELRO)
 endfunction()
 
-# Hardens the optimised builds of the target: checks of the C library's calls where the size of a buffer is known, a guard
-# value ahead of each return address that an array could overwrite, no table of addresses that can be written once the program
-# has started, and a program that can be loaded at any address. Sanitizers see the same faults and more, and don't go with it.
+# Hardens the optimised builds of the target: checks of the C library's calls where the size of a buffer is known, a
+# guard value ahead of each return address that an array could overwrite, no table of addresses that can be written once
+# the program has started, and a program that can be loaded at any address. Sanitizers see the same faults and more, and
+# don't go with it.
 function(mcobnqrt_harden target)
   if(NOT MCOBNQRT_HARDENING OR MCOBNQRT_SANITIZE)
     return()

@@ -9,8 +9,8 @@ begin()
     echo "== $step"
 }
 
-# Installs those of the named Debian packages that are missing, and says which before it does, and how to be asked first.
-# Says nothing if there are none. With NO_INSTALL set it only says which, and fails.
+# Installs those of the named Debian packages that are missing, and says which before it does, and how to be asked
+# first. Says nothing if there are none. With NO_INSTALL set it only says which, and fails.
 install_packages()
 {
     local package missing=() as_root=()

@@ -8,8 +8,8 @@ class Progress;
 struct ApplyOptions;
 
 /// Reads the table once, row by row, and writes it with the bins of every attribute that has any: a column each behind
-/// the others or, with the option, in place of the attribute's own. The field of a missing value is empty. The output is
-/// delimited as the input is; no output stays behind if it can't be completed.
+/// the others or, with the option, in place of the attribute's own. The field of a missing value is empty. The output
+/// is delimited as the input is; no output stays behind if it can't be completed.
 ///
 /// \return which attributes have no bins, and why, in words.
 /// \throw Failure if the bins or a row can't be read, a column is lacking, a field is no number or a category never

@@ -3,8 +3,9 @@
 
 #include <mcobnqrt/mcquerycancel.h>
 
-/// From now on the first Ctrl-C, or another signal that asks for the end, only sets the flag that IsInterrupted() reads; the
-/// second one ends the program at once. Writing to a closed pipe, or beyond the largest file, becomes an ordinary error.
+/// From now on the first Ctrl-C, or another signal that asks for the end, only sets the flag that IsInterrupted()
+/// reads; the second one ends the program at once. Writing to a closed pipe, or beyond the largest file, becomes an
+/// ordinary error.
 void CatchSignals();
 
 bool IsInterrupted();

@@ -51,7 +51,8 @@ std::string Print(const Outcome& outcome, const OutputOptions& options)
     return os.str();
 }
 
-/// Prints a message on standard error, in one line. Messages quote names and texts of the data, so they are made printable.
+/// Prints a message on standard error, in one line. Messages quote names and texts of the data, so they are made
+/// printable.
 void Tell(const std::string& words)
 {
     std::cerr << "mcbin: " << Printable(words) << '\n';

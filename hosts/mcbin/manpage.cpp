@@ -5,8 +5,8 @@
 namespace
 {
 
-/// Escapes text for man: a line that begins with a dot or an apostrophe would be a request, and backslashes and dashes have
-/// meanings of their own.
+/// Escapes text for man: a line that begins with a dot or an apostrophe would be a request, and backslashes and dashes
+/// have meanings of their own.
 std::string Escape(const std::string& text)
 {
     std::string escaped;

@@ -89,7 +89,8 @@ Outcome FindBins(TableReader& table, const BinOptions& options, Progress& progre
 {
     try
     {
-        // Nearly always a column that begins with numbers holds nothing else, and then every number is parsed once only.
+        // Nearly always a column that begins with numbers holds nothing else, and then every number is parsed once
+        // only.
         return FindBins(table, options, progress, Care::kHasty);
     }
     catch (const NotOnlyNumbers&)

@@ -24,7 +24,8 @@ protected:
     BINVariable(const std::string& name, const std::string& label, VariableRole role);
     BINVariable(const BINVariable& other);
 
-    /// Exchanges name, label and role with `other`. Both stay in their lists, which look their names up anew after that.
+    /// Exchanges name, label and role with `other`. Both stay in their lists, which look their names up anew after
+    /// that.
     void SwapVariable(BINVariable& other);
 
 private:

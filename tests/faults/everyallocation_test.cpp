@@ -154,8 +154,8 @@ void FailEachAllocation(Settings settings)
     EXPECT_GT(n, 300) << "valgrind takes this operator new only with --soname-synonyms=somalloc=nouserintercepts";
 }
 
-/// From each allocation on lets all of them fail, until the host is done before the first one. The host gives up at what
-/// it can't do a second time, and its objects go while there still is no memory.
+/// From each allocation on lets all of them fail, until the host is done before the first one. The host gives up at
+/// what it can't do a second time, and its objects go while there still is no memory.
 template<class Host, class Factory, class Settings>
 void FailFromEachAllocationOn(Settings settings)
 {

@@ -1,6 +1,6 @@
 // The tool in one process: the first line of the input is its command line, the rest is the table. What it finds is
-// written in every form, read back from JSON, and applied to the same table, where it has to fit every row; and the bins
-// counted there have to weigh what the run has told.
+// written in every form, read back from JSON, and applied to the same table, where it has to fit every row; and the
+// bins counted there have to weigh what the run has told.
 
 #include "tests/fuzz/check.h"
 #include "tests/fuzz/mcbin.h"

@@ -1,5 +1,5 @@
-// `mcbin apply` with a file of bins that somebody has changed. It has to end in an output of which every row is whole, or
-// in words.
+// `mcbin apply` with a file of bins that somebody has changed. It has to end in an output of which every row is whole,
+// or in words.
 
 #include "tests/fuzz/check.h"
 #include "tests/fuzz/mcbin.h"

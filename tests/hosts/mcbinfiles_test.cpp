@@ -100,8 +100,8 @@ TEST_F(McbinFiles, ALinkStaysOneAndWhatItLeadsToIsWritten)
 
 TEST_F(McbinFiles, WhatIsNoFileIsWrittenAsItStands)
 {
-    // Opened by the shell, a file keeps what stands before, and what follows finds its end. This link is as /dev/stdout,
-    // which a faulty tool might replace if root tests it.
+    // Opened by the shell, a file keeps what stands before, and what follows finds its end. This link is as
+    // /dev/stdout, which a faulty tool might replace if root tests it.
     EXPECT_EQ(
         "before\n" + std::string(kApplied) + "after\n",
         Shell("ln -s /proc/self/fd/1 stdout; echo before; mcbin apply bins.json data.csv -o stdout; echo after").out);

@@ -1,6 +1,7 @@
-# Reads from PROGRAMS and LIBRARIES, with READELF, how they were built, and fails if one of them lacks a protection that a
-# release has. That calls of the C library are checked shows in the programs alone, by the names of what they call instead:
-# the libraries hand to it memory of sizes that no compiler knows. One function in cmake/OwnCode.cmake sets all of it.
+# Reads from PROGRAMS and LIBRARIES, with READELF, how they were built, and fails if one of them lacks a protection that
+# a release has. That calls of the C library are checked shows in the programs alone, by the names of what they call
+# instead: the libraries hand to it memory of sizes that no compiler knows. One function in cmake/OwnCode.cmake sets all
+# of it.
 cmake_minimum_required(VERSION 3.25)
 
 # `facts` is what the reader says of the file.

@@ -1,4 +1,5 @@
-# Holds what LIBRARY exports against the classes that are its interface: nothing but their members, and something of each.
+# Holds what LIBRARY exports against the classes that are its interface: nothing but their members, and something of
+# each.
 cmake_minimum_required(VERSION 3.25)
 
 set(exportedClasses

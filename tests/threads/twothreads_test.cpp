@@ -5,7 +5,8 @@
 
 #include <thread>
 
-// Objects of the library share nothing: each thread may have an algorithm of its own. ThreadSanitizer looks for the rest.
+// Objects of the library share nothing: each thread may have an algorithm of its own. ThreadSanitizer looks for the
+// rest.
 
 namespace
 {

@@ -25,8 +25,8 @@ public:
     /// By code; numbers as FormatNumber writes them.
     const std::vector<std::string>& GetNames() const { return fNames; }
 
-    /// The code of a field; gMissingValue if it is a number that is declared missing, and nothing if it is not among the
-    /// column's.
+    /// The code of a field; gMissingValue if it is a number that is declared missing, and nothing if it is not among
+    /// the column's.
     std::optional<double> FindCode(std::string_view field);
 
 private:

@@ -10,8 +10,8 @@
 
 // Almost every line of almost every file has no quote. Such a line is a row, and is cut at its delimiters where it
 // stands in the buffer: libcsv, which goes character by character and copies, needs six times as long. It gets the
-// lines from one with a quote on, until the row that began there has ended; so libcsv deals with all that makes the format
-// hard.
+// lines from one with a quote on, until the row that began there has ended; so libcsv deals with all that makes the
+// format hard.
 
 namespace
 {

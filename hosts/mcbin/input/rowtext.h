@@ -23,8 +23,8 @@ public:
     /// Invalidates the rows that have been cut off.
     void Append(std::string_view text);
 
-    /// Cuts off the text up to the next line end outside of quotes, or all of it if there is none. The text is good until
-    /// the next call of Append().
+    /// Cuts off the text up to the next line end outside of quotes, or all of it if there is none. The text is good
+    /// until the next call of Append().
     RowText Cut();
 
     void Clear();

@@ -25,7 +25,8 @@ enum class Care
 /// others are missing by the plan or else a failure. A column of text is no attribute any more.
 ///
 /// \throw Failure if a row is bad, if there is no row, if a column has more categories than the library takes, if a
-///        field should be a number and isn't, if a weight is negative or infinite, or if an attribute was asked for by name and is text.
+///        field should be a number and isn't, if a weight is negative or infinite, or if an attribute was asked for by
+///        name and is text.
 void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care care);
 
 #endif

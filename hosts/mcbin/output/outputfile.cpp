@@ -70,8 +70,8 @@ void GiveMode(int descriptor, const std::string& replaced)
     fchmod(descriptor, former.st_mode & (isSameGroup ? 0777 : 0707));
 }
 
-/// Flushes the directory, so that the new name outlasts a loss of power. The name is given by now, so a system that can't
-/// flush a directory, or that lets it be written but not read, is no failure.
+/// Flushes the directory, so that the new name outlasts a loss of power. The name is given by now, so a system that
+/// can't flush a directory, or that lets it be written but not read, is no failure.
 void FlushDirectory(const std::string& path)
 {
     const fs::path directory = fs::path(path).parent_path();

@@ -99,8 +99,8 @@ void Scale(Rows& rows, int exponent)
     }
 }
 
-/// A row with a heavy cell of the first category, and 148 rows with one unit each: of two categories in turns of 37 rows,
-/// of more categories 100 of the first, and one of each other.
+/// A row with a heavy cell of the first category, and 148 rows with one unit each: of two categories in turns of 37
+/// rows, of more categories 100 of the first, and one of each other.
 Rows RowsOfUnits(int numCategories, double heavy)
 {
     const auto numCells = static_cast<std::size_t>(numCategories);
