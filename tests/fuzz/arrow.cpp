@@ -197,12 +197,12 @@ StridedArray TakeArray(Input& input, Beside& beside, std::size_t length)
     return {beside.memory.data() + first, isBackwards ? -distance : distance, length, ColumnType::Storage::kDouble};
 }
 
-/// What a variable's values should be, told one after the other.
+/// What a field's values should be, told one after the other.
 class Expectation
 {
 public:
-    Expectation(const Variable& variable, const std::vector<PlainValue>& values, bool isText)
-        : fVariable(variable), fValues(values), fIsText(isText)
+    Expectation(const Field& field, const std::vector<PlainValue>& values, bool isText)
+        : fField(field), fValues(values), fIsText(isText)
     {
     }
 
@@ -213,9 +213,9 @@ public:
         const PlainValue& value = fValues[row];
         if (IsBad(row))
             return std::nullopt;
-        if (fVariable.use == Variable::Use::kCategory)
+        if (fField.use == Field::Use::kCategory)
             return TellCode(value);
-        if (fVariable.use == Variable::Use::kWeight && !value.isMissing)
+        if (fField.use == Field::Use::kWeight && !value.isMissing)
             return TellWeight(value.number);
         return value.isMissing ? gMissingValue : value.number;
     }
@@ -225,13 +225,13 @@ public:
 
     bool IsExact(std::size_t row) const
     {
-        return fVariable.use == Variable::Use::kCategory || fValues[row].isMissing || fValues[row].isExact;
+        return fField.use == Field::Use::kCategory || fValues[row].isMissing || fValues[row].isExact;
     }
 
 private:
     std::optional<double> TellWeight(double number) const
     {
-        if (fVariable.missingNumbers.Contains(number))
+        if (fField.missingNumbers.Contains(number))
             return gMissingValue;
         return number >= 0.0 && std::isfinite(number) ? std::optional(number) : std::nullopt;
     }
@@ -239,8 +239,8 @@ private:
     std::optional<double> TellCode(const PlainValue& value)
     {
         const bool isMissing =
-            value.isMissing || (fIsText ? fVariable.missingTexts.Contains(value.text)
-                                        : std::isnan(value.number) || fVariable.missingNumbers.Contains(value.number));
+            value.isMissing || (fIsText ? fField.missingTexts.Contains(value.text)
+                                        : std::isnan(value.number) || fField.missingNumbers.Contains(value.number));
         if (isMissing)
             return kMissingCode;
         const auto isSame = [&](const PlainValue& other)
@@ -252,27 +252,27 @@ private:
         return code < 256 ? std::optional(static_cast<double>(code)) : std::nullopt;
     }
 
-    const Variable& fVariable;
+    const Field& fField;
     const std::vector<PlainValue>& fValues;
     bool fIsText;
     std::vector<PlainValue> fCategories; ///< in the order of arrival
 };
 
-Variable::Use TakeUse(Input& input, bool isText, bool isScaled)
+Field::Use TakeUse(Input& input, bool isText, bool isScaled)
 {
     if (isText)
-        return Variable::Use::kCategory;
-    const auto use = static_cast<Variable::Use>(input.ConsumeIntegralInRange(0, 3));
+        return Field::Use::kCategory;
+    const auto use = static_cast<Field::Use>(input.ConsumeIntegralInRange(0, 3));
     // Scaled numbers that differ in the last bit alone may be one category or two.
-    return isScaled && use == Variable::Use::kCategory ? Variable::Use::kAttribute : use;
+    return isScaled && use == Field::Use::kCategory ? Field::Use::kAttribute : use;
 }
 
-void DeclareMissing(Input& input, Variable& variable)
+void DeclareMissing(Input& input, Field& field)
 {
     for (int i = input.ConsumeIntegralInRange(0, 2); i > 0; --i)
     {
-        variable.missingNumbers.AddValue(input.ConsumeIntegralInRange(-5, 5), "");
-        variable.missingTexts.AddValue(input.ConsumeBool() ? "a" : "more than twelve bytes", "");
+        field.missingNumbers.AddValue(input.ConsumeIntegralInRange(-5, 5), "");
+        field.missingTexts.AddValue(input.ConsumeBool() ? "a" : "more than twelve bytes", "");
     }
 }
 
@@ -283,7 +283,7 @@ bool IsAsTold(double expected, double actual, bool isExact)
     return isExact ? expected == actual : std::fabs(expected - actual) <= 1e-15 * std::fabs(expected);
 }
 
-/// One analysis, its variables and what is expected of each.
+/// One analysis, its fields and what is expected of each.
 class Reading
 {
 public:
@@ -291,7 +291,7 @@ public:
     {
         const std::size_t numArrays = input.ConsumeIntegralInRange<std::size_t>(0, 2);
         const auto& columns = fProducer.GetColumns();
-        fVariables.resize(columns.size() + numArrays);
+        fFields.resize(columns.size() + numArrays);
         fBeside.resize(numArrays);
         for (std::size_t i = 0; i < columns.size(); ++i) AddColumn(input, i);
         const int oneMore = input.ConsumeIntegralInRange(0, 15) == 0 ? 1 : 0;
@@ -302,10 +302,10 @@ public:
 
     void Run()
     {
-        Block block(fVariables.size());
+        Block block(fFields.size());
         try
         {
-            TableBlocks blocks(&fProducer, fVariables);
+            TableBlocks blocks(&fProducer, fFields);
             while (blocks.Next(block)) Compare(block);
             Check(fNumRows == fProducer.CountRows() && fIsOfOneLength, "rows are lacking");
         }
@@ -319,29 +319,29 @@ private:
     void AddColumn(Input& input, std::size_t index)
     {
         const Column& column = *fProducer.GetColumns()[index];
-        Variable& variable = fVariables[index];
-        variable.name = std::to_string(index);
-        variable.column = static_cast<int>(index);
-        variable.use = TakeUse(input, column.maker.IsText(), column.maker.IsScaled());
-        DeclareMissing(input, variable);
-        fExpectations.emplace_back(variable, column.values, column.maker.IsText());
+        Field& field = fFields[index];
+        field.name = std::to_string(index);
+        field.column = static_cast<int>(index);
+        field.use = TakeUse(input, column.maker.IsText(), column.maker.IsScaled());
+        DeclareMissing(input, field);
+        fExpectations.emplace_back(field, column.values, column.maker.IsText());
     }
 
     void AddArray(Input& input, std::size_t index, std::size_t length)
     {
         const std::size_t place = fProducer.GetColumns().size() + index;
-        Variable& variable = fVariables[place];
-        variable.name = std::to_string(place);
-        variable.use = TakeUse(input, false, false);
-        variable.array = TakeArray(input, fBeside[index], length);
-        DeclareMissing(input, variable);
-        fExpectations.emplace_back(variable, fBeside[index].values, false);
+        Field& field = fFields[place];
+        field.name = std::to_string(place);
+        field.use = TakeUse(input, false, false);
+        field.array = TakeArray(input, fBeside[index], length);
+        DeclareMissing(input, field);
+        fExpectations.emplace_back(field, fBeside[index].values, false);
     }
 
     void Compare(Block& block)
     {
         Check(block.numRows > 0 && block.numRows <= Block::kMaxRows, "number of rows of a block");
-        for (std::size_t field = 0; field < fVariables.size(); ++field)
+        for (std::size_t field = 0; field < fFields.size(); ++field)
             for (std::size_t i = 0; i < block.numRows; ++i)
             {
                 const std::size_t row = fNumRows + i;
@@ -355,7 +355,7 @@ private:
         fNumRows += block.numRows;
     }
 
-    /// The row that the fault names is the first one of its variable that can't be used.
+    /// The row that the fault names is the first one of its field that can't be used.
     void CheckFault(const DataFault& fault)
     {
         if (!fault.GetColumn())
@@ -386,9 +386,9 @@ private:
     }
 
     Producer fProducer;
-    std::vector<Variable> fVariables;
+    std::vector<Field> fFields;
     std::vector<Beside> fBeside;
-    std::vector<Expectation> fExpectations; ///< by variable
+    std::vector<Expectation> fExpectations; ///< by field
     bool fIsOfOneLength = true;
     std::size_t fNumRows = 0; ///< read so far
 };

@@ -2,10 +2,9 @@
 
 from __future__ import annotations
 
+import mcbinning as mb
 import pyarrow as pa
 import pytest
-
-import mcbinning as mb
 
 
 @pytest.mark.parametrize("index", [-1, 2])

@@ -3,13 +3,12 @@
 from __future__ import annotations
 
 import duckdb
+import mcbinning as mb
 import numpy as np
 import pandas as pd
 import polars as pl
 import pyarrow as pa
 import pytest
-
-import mcbinning as mb
 
 SIZES = ["small", "medium", "large", "unused", "huge"]
 GRADES = ["good", "fair", "bad"]
@@ -55,7 +54,7 @@ def test_the_declared_order_is_that_of_the_codes_in_bins_tables_and_json(name):
         assert found.target_weights.tolist() == [[30, 0, 0], [0, 15, 0], [0, 0, 15]]
     frame = pd.DataFrame({"size": SIZE})
     expected = [0] * 30 + [1] * 15 + [2] * 15
-    assert result.transform(frame)["size"].tolist() == expected
+    assert result.transform(frame)["size_bin"].tolist() == expected
     assert [row[-1] for row in duckdb.sql(result.to_sql("duckdb", "frame")).fetchall()] == expected
 
 
@@ -78,7 +77,7 @@ def test_numbers_are_categories_where_their_order_is_another(categories, labels)
     for data in (frame, pa.Table.from_pandas(frame)):
         result = mb.supervised_bins(data, "y", ["x"])
         assert result["x"].labels == labels
-        assert pa.table(result.transform(data))["x"].to_pylist() == [0 if flag else 1 for flag in y]
+        assert pa.table(result.transform(data))["x_bin"].to_pylist() == [0 if flag else 1 for flag in y]
 
 
 @pytest.mark.parametrize("form", [lambda y: pd.Categorical(y, GRADES, ordered=True), lambda y: pl.Series(y, dtype=pl.Enum(GRADES))])

@@ -5,6 +5,7 @@ from __future__ import annotations
 import pickle
 import tracemalloc
 
+import mcbinning as mb
 import numpy as np
 import pandas as pd
 import polars as pl
@@ -14,8 +15,6 @@ from sklearn.compose import ColumnTransformer
 from sklearn.linear_model import LogisticRegression
 from sklearn.pipeline import make_pipeline
 from sklearn.utils.estimator_checks import parametrize_with_checks
-
-import mcbinning as mb
 
 WITH_GAP = np.array([[1.0], [2.0], [3.0], [11.0], [12.0], [13.0]] * 4)
 TWO_CLASSES = np.array(["low"] * 3 + ["up"] * 3).repeat(1)[np.arange(24) % 6]

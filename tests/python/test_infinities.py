@@ -8,13 +8,12 @@ import sqlite3
 import subprocess
 
 import duckdb
+import mcbinning as mb
 import numpy as np
 import pandas as pd
 import pytest
 from hypothesis import given, settings
 from hypothesis import strategies as st
-
-import mcbinning as mb
 
 pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
 
@@ -39,7 +38,7 @@ def test_bins_recount_to_the_table_and_every_form_places_alike(rows, closed):
     frame = pd.DataFrame(rows + [(-1.0, "a"), (2.0, "b")], columns=["x", "y"])
     for result in results(frame, closed):
         found = result["x"]
-        placed = result.transform(frame)["x"].to_numpy(dtype=int)
+        placed = result.transform(frame)["x_bin"].to_numpy(dtype=int)
 
         assert np.bincount(placed, minlength=found.n_bins).tolist() == found.weights.tolist()
         assert found.bin_numbers(frame["x"].to_numpy()).tolist() == placed.tolist()
@@ -88,7 +87,7 @@ def test_an_infinity_that_is_a_cut_point_has_a_bin_for_itself(mcbin, tmp_path):
         assert document["results"][0]["cut_points"] == ["inf" if cut > 0 else "-inf"]
         placed = [int(value == infinity) if infinity > 0 else int(value != infinity) for value in frame["x"]]
         assert duckdb.sql(f"SELECT {sql} FROM frame").df().iloc[:, 0].tolist() == placed
-        assert result.transform(frame, labels=True)["x"].tolist() == [labels[i] for i in placed]
+        assert result.transform(frame, labels=True)["x_bin"].tolist() == [labels[i] for i in placed]
         assert "-inf" in result.to_sql(labels=True)
         result.plot()
 
@@ -101,7 +100,7 @@ def test_the_most_negative_number_is_a_value_and_infinities_can_be_missing():
     assert mb.equal_frequency_bins(frame, n_bins=2, missing={"x": -LARGEST})["x"].missing_weight == 2.0
     for missing, weight in (([INF], 2.0), ([INF, -INF], 3.0), ([(2.0, INF)], 3.0), ([(-INF, 1.0)], 4.0)):
         result = mb.equal_frequency_bins(frame, n_bins=2, missing={"x": missing})
-        placed = result.transform(frame)["x"]
+        placed = result.transform(frame)["x_bin"]
         in_duckdb = duckdb.sql(result.to_sql("duckdb", table="frame")).df()["x_bin"]
 
         assert result["x"].missing_weight == weight == placed.isna().sum(), missing

@@ -8,11 +8,10 @@ import subprocess
 import sys
 import textwrap
 
+import mcbinning as mb
 import numpy as np
 import pandas as pd
 import pytest
-
-import mcbinning as mb
 
 KILLED = """
     import os, signal, sys, numpy as np, pandas as pd, mcbinning as mb

@@ -9,9 +9,8 @@ import re
 import subprocess
 import sys
 
-import pytest
-
 import mcbinning as mb
+import pytest
 
 DOCUMENTED = [
     mb.supervised_bins,

@@ -10,11 +10,10 @@ import textwrap
 import threading
 import time
 
+import mcbinning as mb
 import numpy as np
 import pyarrow as pa
 import pytest
-
-import mcbinning as mb
 
 pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
 

@@ -7,6 +7,7 @@ import subprocess
 import sys
 import textwrap
 
+import mcbinning as mb
 import numpy as np
 import pandas as pd
 import polars as pl
@@ -14,8 +15,6 @@ import pyarrow as pa
 import pyarrow.feather
 import pyarrow.parquet as pq
 import pytest
-
-import mcbinning as mb
 
 pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
 

@@ -4,9 +4,8 @@ from __future__ import annotations
 
 import threading
 
-import numpy as np
-
 import mcbinning as mb
+import numpy as np
 
 FITS = 4
 

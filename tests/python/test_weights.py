@@ -6,6 +6,7 @@ import json
 import subprocess
 
 import duckdb
+import mcbinning as mb
 import numpy as np
 import pandas as pd
 import polars as pl
@@ -13,8 +14,6 @@ import pyarrow as pa
 import pyarrow.parquet as pq
 import pytest
 from conftest import IRIS
-
-import mcbinning as mb
 
 pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
 

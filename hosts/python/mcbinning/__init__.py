@@ -3,7 +3,11 @@
 The estimators work in scikit-learn, on data in memory. The functions work on streams and files of any size.
 """
 
+from __future__ import annotations
+
 from importlib.metadata import version as _version
+from typing import TYPE_CHECKING as _TYPE_CHECKING
+from typing import Any as _Any
 
 from ._errors import (
     BadBinTableWarning,
@@ -17,10 +21,13 @@ from ._errors import (
     SingleValueWarning,
     StreamError,
 )
-from ._estimators import EqualFrequencyBinner, SupervisedBinner
+from ._features import require as _require
 from ._functions import equal_frequency_bins, supervised_bins
 from ._result import AttributeBins, BinningResult
 from ._status import Status
+
+if _TYPE_CHECKING:
+    from ._estimators import EqualFrequencyBinner, SupervisedBinner
 
 __version__ = _version("mcbinning")
 
@@ -44,3 +51,18 @@ __all__ = [
     "equal_frequency_bins",
     "supervised_bins",
 ]
+
+
+def __getattr__(name: str) -> _Any:
+    """The estimators, with which scikit-learn is loaded."""
+    if name not in ("EqualFrequencyBinner", "SupervisedBinner"):
+        raise AttributeError(f"module {__name__!r} has no attribute {name!r}")
+    for package in ("sklearn", "pandas"):
+        _require(package, "the estimators", "sklearn")
+    from . import _estimators
+
+    return getattr(_estimators, name)
+
+
+def __dir__() -> list[str]:
+    return list(__all__)

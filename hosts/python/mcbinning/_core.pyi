@@ -1,4 +1,4 @@
-"""The native part of the package: tables and arrays as the library's records, and its runs."""
+"""The native part of the package: tables and arrays as the library's records, and its runs and bins."""
 
 from collections.abc import Callable, Iterator
 from typing import Any
@@ -6,14 +6,12 @@ from typing import Any
 import numpy as np
 import numpy.typing as npt
 
-MISSING: float
-"""The double that stands for a missing value inside the library."""
-
+_Floats = npt.NDArray[np.float64]
 _Status = tuple[int, str, tuple[int, int, int], tuple[float, float, float]]
-_Outcome = tuple[_Status, list[dict[str, Any]], int, str, int | None, float | None]
-"""Status, results, records, version, records without a weight, and the grid that weights were moved to."""
 
 def temp_directory(named: str) -> str: ...
+def status_words(code: int, is_warning: bool) -> str: ...
+def describe_not_json(line: int) -> str: ...
 
 class Table:
     @staticmethod
@@ -25,16 +23,84 @@ class Table:
         """Of each column the name, the kind of its values, its time zone, whether it can be used, and whether it is a
         dictionary that declares the order of its values."""
 
+class Variable:
+    name: str
+    label: str
+    role: str
+    kind: str
+    time_zone: str
+    categories: list[str] | list[float] | None
+    rounding: str | None
+    grid: float | None
+    missing_texts: list[str]
+    """Of a variable of texts all that are missing, of others those that are no numbers."""
+    missing_numbers: list[float]
+    missing_interval: tuple[float, float] | None
+
+class AttributeBins:
+    """Each access makes a new copy. A figure that was not found is NaN."""
+
+    variable: Variable
+    target: Variable | None
+    status: _Status
+    right_closed: bool
+    cut_points: _Floats
+    borders: _Floats
+    border_texts: list[str]
+    labels: list[str]
+    weights: _Floats
+    target_weights: _Floats | None
+    n_distinct: int
+    weight: float
+    weight_with_missing: float
+    minimum: float
+    maximum: float
+    target_entropy: float
+    model_entropy: float
+    gain: float
+    rates: _Floats | None
+    woe: _Floats | None
+    iv: _Floats | None
+    information_value: float
+
+    def find_bin(self, value: float) -> int: ...
+    def alone(self) -> Bins:
+        """As the only result of a run."""
+
+class Bins:
+    component_version: str
+    method: str
+    closed: str
+    n_bins: int
+    max_distinct: int | None
+    small_bin_ratio: float | None
+    data_name: str | None
+    records: int | None
+    records_without_weight: int | None
+    missing_text: list[str]
+    variables: list[Variable]
+    status: _Status
+    results: list[AttributeBins]
+
+    @staticmethod
+    def read(document: Any, name: str) -> Bins:
+        """From the values of a JSON text, with its objects as tuples of pairs. Raises a ValueError that begins with the name of the document."""
+    def set_border_texts(self, index: int, texts: list[str]) -> None: ...
+    def columns(self, taken: list[str]) -> list[tuple[int, str]]:
+        """Of each column of bins the index of its result, and its name."""
+    def to_json(self) -> str: ...
+    def to_csv(self) -> str: ...
+    def to_sql(self, duckdb: bool, labels: bool) -> str: ...
+
 class Feed:
     def __init__(self, table: Table | None) -> None: ...
-    def add_variable(
+    def add_field(
         self,
         name: str,
         use: str,
         *,
         column: int = -1,
         array: npt.NDArray[Any] | None = None,
-        num_codes: int = 0,
         rounding: str = "none",
     ) -> None: ...
     def declare_missing(
@@ -43,30 +109,24 @@ class Feed:
     def set_categories(
         self, index: int, categories: list[str] | list[float], unseen: str = "changed"
     ) -> None: ...
+    def set_value_kind(self, index: int, kind: str) -> None: ...
     def categories(self, index: int) -> list[str] | list[float]: ...
     def learn(self) -> None: ...
     def weights(self) -> tuple[int, float]: ...
     def set_weights(self, weights: tuple[int, float]) -> None: ...
-    def read(self, max_rows: int) -> list[npt.NDArray[np.float64]]: ...
+    def read(self, max_rows: int) -> list[_Floats]: ...
     def spool(self, directory: str) -> None: ...
-    def bin_supervised(
+    def bin(
         self,
         attributes: list[int],
-        targets: list[int],
+        targets: list[int] | None = None,
         *,
+        target: int | None = None,
         n_bins: int,
-        max_distinct: int,
-        small_bin_ratio: float,
+        max_distinct: int | None = None,
+        small_bin_ratio: float | None = None,
         right_closed: bool,
+        data_name: str | None = None,
         temp_dir: str,
         progress: Callable[[str, int], None] | None,
-    ) -> _Outcome: ...
-    def bin_equal_frequency(
-        self,
-        attributes: list[int],
-        *,
-        n_bins: int,
-        right_closed: bool,
-        temp_dir: str,
-        progress: Callable[[str, int], None] | None,
-    ) -> _Outcome: ...
+    ) -> Bins: ...

@@ -17,13 +17,13 @@ from sklearn.utils.validation import _check_feature_names_in, check_consistent_l
 
 from . import _core
 from ._errors import BinningError, DataError
+from ._opening import is_table, open_source
 from ._outcome import make_result
 from ._progress import Progress, reporting
-from ._result import BinningResult, Settings, Variable
+from ._result import BinningResult
 from ._settings import check_settings, directory_of
 from ._sources import Source
-from ._opening import is_table, open_source
-from ._types import Closed, Encode, Method, MissingOutput, Rounding
+from ._types import Closed, Encode, MissingOutput, Rounding
 from ._values import Codes, Floats
 
 _ALL_ROWS = 2**62
@@ -43,7 +43,6 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
 
     result_: BinningResult
     n_features_in_: int
-    _method: Method
 
     def transform(self, X: Any) -> Any:
         """The bins of `X`, in the form that `encode` names."""
@@ -80,22 +79,22 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
             raise ValueError(f"encode must be 'ordinal', 'onehot' or 'interval', not {self.encode!r}")
         if self.missing not in ("code", "keep"):
             raise ValueError(f"missing must be 'code' or 'keep', not {self.missing!r}")
-        feed, variables, rows = self._open(X, reset=True)
+        feed, names, rows = self._open(X, reset=True)
         if rows == 0:
             raise DataError("the data have no rows")
         if codes is not None:
             if rows is not None:
                 check_consistent_length(np.empty(rows), codes)
-            feed.add_variable("y", "code", array=codes, num_codes=len(classes))
-            variables.append(_target_variable(classes))
+            feed.add_field("y", "code", array=codes)
+            _name_classes(feed, len(names), classes)
+            names = [*names, "y"]
         if sample_weight is not None:
             array = _check_weights(sample_weight, rows)
-            feed.add_variable("sample_weight", "weight", array=array, rounding=self.rounding)
-            variables.append(Variable("sample_weight", "weight", rounding=self.rounding))
-        names = [variable.name for variable in variables]
+            feed.add_field("sample_weight", "weight", array=array, rounding=self.rounding)
+            names = [*names, "sample_weight"]
         with reporting(self.progress, names, self.n_features_in_, rows) as report:
-            outcome = self._run(feed, list(range(self.n_features_in_)), report)
-        self.result_ = make_result(outcome, variables, self._settings(), self._method, stacklevel=4)
+            bins = self._run(feed, list(range(self.n_features_in_)), report)
+        self.result_ = make_result(bins, stacklevel=4)
         for found in self.result_.bins:
             if found.status.is_error:
                 raise BinningError(found.status, f"attribute {found.attribute!r}: {found.status}")
@@ -103,24 +102,25 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         self.bin_tables_ = [found.to_pandas() for found in self.result_.bins]
         self.statuses_ = [found.status for found in self.result_.bins]
 
-    def _settings(self) -> Settings:
+    def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> _core.Bins:
         raise NotImplementedError
 
-    def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> Any:
-        raise NotImplementedError
-
-    def _open(self, X: Any, reset: bool) -> tuple[_core.Feed, list[Variable], int | None]:
-        """A feed of the columns of `X`, read where they lie; and how many rows there are, if that is known."""
+    def _open(self, X: Any, reset: bool) -> tuple[_core.Feed, list[str], int | None]:
+        """A feed of the columns of `X`, read where they lie; their names; and how many rows there are, if that is
+        known."""
         if is_table(X):
             return self._open_table(X, reset)
         X = self._check(X, reset)
         if X.dtype.kind in "mM":
             return self._open_times(X)
         feed = _core.Feed(None)
-        names = getattr(self, "feature_names_in_", [f"x{i}" for i in range(X.shape[1])])
+        names = self._names(X)
         for i, name in enumerate(names):
-            feed.add_variable(str(name), "attribute", array=X[:, i])
-        return feed, [Variable(str(name)) for name in names], X.shape[0]
+            feed.add_field(name, "attribute", array=X[:, i])
+        return feed, names, X.shape[0]
+
+    def _names(self, X: npt.NDArray[Any]) -> list[str]:
+        return list(map(str, getattr(self, "feature_names_in_", [f"x{i}" for i in range(X.shape[1])])))
 
     def _check(self, X: Any, reset: bool) -> npt.NDArray[Any]:
         X = _with_nan(X)
@@ -130,15 +130,14 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         # Numbers of 128 bits or in the other byte order are the only ones that the feed can't read where they lie.
         return array if array.dtype.itemsize <= 8 and array.dtype.isnative else array.astype(np.float64)
 
-    def _open_times(self, X: npt.NDArray[Any]) -> tuple[_core.Feed, list[Variable], int | None]:
+    def _open_times(self, X: npt.NDArray[Any]) -> tuple[_core.Feed, list[str], int | None]:
         # Of the units Arrow has days and those from the second down.
         if X.dtype.kind == "M" and np.datetime_data(X.dtype)[0] in ("Y", "M", "W", "h", "m"):
             X = X.astype("M8[s]")
-        names = getattr(self, "feature_names_in_", [f"x{i}" for i in range(X.shape[1])])
         columns = [pa.array(np.ascontiguousarray(X[:, i])) for i in range(X.shape[1])]
-        return self._feed_table(open_source(pa.Table.from_arrays(columns, names=list(map(str, names)))))
+        return self._feed_table(open_source(pa.Table.from_arrays(columns, names=self._names(X))))
 
-    def _open_table(self, X: Any, reset: bool) -> tuple[_core.Feed, list[Variable], int | None]:
+    def _open_table(self, X: Any, reset: bool) -> tuple[_core.Feed, list[str], int | None]:
         source = open_source(X)
         named = X if isinstance(X, pd.DataFrame) else pd.DataFrame(columns=[column.name for column in source.columns])
         validate_data(self, named, reset=reset, skip_check_array=True)
@@ -146,14 +145,13 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
             raise DataError("there are no columns")
         return self._feed_table(source)
 
-    def _feed_table(self, source: Source) -> tuple[_core.Feed, list[Variable], int | None]:
+    def _feed_table(self, source: Source) -> tuple[_core.Feed, list[str], int | None]:
         feed = _core.Feed(source.open(None))
         for i, column in enumerate(source.columns):
             if column.is_ordered and column.kind != "text":
                 raise DataError("the column holds ordered categories, not numbers", column.name)
-            feed.add_variable(column.name, "attribute", column=i)
-        variables = [Variable(column.name, kind=column.kind, time_zone=column.time_zone) for column in source.columns]
-        return feed, variables, source.rows
+            feed.add_field(column.name, "attribute", column=i)
+        return feed, [column.name for column in source.columns], source.rows
 
     def _read_columns(self, X: Any) -> Sequence[Floats]:
         if is_table(X):
@@ -194,7 +192,7 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
 
     def _labels(self, feature: int) -> list[str]:
         labels = self.result_.bins[feature].labels
-        return labels + ["missing"] if self.missing == "code" else labels
+        return [*labels, "missing"] if self.missing == "code" else labels
 
 
 class SupervisedBinner(_Binner):
@@ -250,8 +248,6 @@ class SupervisedBinner(_Binner):
     [['(26, +inf)'], ['(-inf, 26]']]
     """
 
-    _method: Method = "supervised"
-
     def __init__(
         self,
         *,
@@ -289,15 +285,13 @@ class SupervisedBinner(_Binner):
         tags.target_tags.required = True
         return tags
 
-    def _settings(self) -> Settings:
-        return Settings(self.closed, self.n_bins, self.max_distinct, self.small_bin_ratio)
-
-    def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> Any:
-        return feed.bin_supervised(
+    def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> _core.Bins:
+        return feed.bin(
             attributes,
             [len(attributes)] * len(attributes),
+            target=len(attributes),
             n_bins=self.n_bins,
-            max_distinct=self.max_distinct or 0,
+            max_distinct=self.max_distinct,
             small_bin_ratio=self.small_bin_ratio,
             right_closed=self.closed == "right",
             temp_dir=directory_of(self.temp_dir),
@@ -350,8 +344,6 @@ class EqualFrequencyBinner(_Binner):
     [[0.0], [2.0], [1.0]]
     """
 
-    _method: Method = "equal-frequency"
-
     def __init__(
         self,
         *,
@@ -377,11 +369,8 @@ class EqualFrequencyBinner(_Binner):
         self._fit(X, None, np.empty(0), sample_weight)
         return self
 
-    def _settings(self) -> Settings:
-        return Settings(self.closed, self.n_bins)
-
-    def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> Any:
-        return feed.bin_equal_frequency(
+    def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> _core.Bins:
+        return feed.bin(
             attributes,
             n_bins=self.n_bins,
             right_closed=self.closed == "right",
@@ -421,11 +410,15 @@ def _declared_order(y: Any) -> pd.Index | None:
     return None
 
 
-def _target_variable(classes: npt.NDArray[Any]) -> Variable:
-    """With the categories as numbers where they are, so that other readers of the result know them as such."""
-    kind = {"b": "boolean", "i": "integer", "u": "integer", "f": "float"}.get(classes.dtype.kind, "text")
-    convert = str if kind == "text" else float
-    return Variable("y", "target", kind, categories=tuple(map(convert, classes.tolist())))
+def _name_classes(feed: _core.Feed, index: int, classes: npt.NDArray[Any]) -> None:
+    """Tells the categories of the target as numbers where they are, so that other readers of the result know them as
+    such."""
+    categories: Any = list(map(float if classes.dtype.kind in "biuf" else str, classes.tolist()))
+    if len(set(categories)) < len(categories):
+        raise DataError("two classes are the same as texts, or as doubles", "y")
+    feed.set_categories(index, categories)
+    if classes.dtype.kind == "b":
+        feed.set_value_kind(index, "boolean")
 
 
 def _with_nan(X: Any) -> Any:

@@ -2,6 +2,7 @@
 
 from __future__ import annotations
 
+import contextlib
 import errno
 import glob
 import numbers
@@ -13,6 +14,7 @@ from typing import Any, Literal
 
 from . import _core
 from ._errors import DataError, StreamError
+from ._features import require
 from ._sources import Source, columns_of, open_batches, open_stream
 from ._types import MemoryLimit
 
@@ -54,7 +56,7 @@ def _read(relation: Any, names: Sequence[str] | None, explain: Callable[[str], s
 
 def _guard(start: Callable[[], _core.Table], explain: Callable[[str], str] | None) -> _core.Table:
     """Starts a query, with its failures as those of a stream: some versions look far ahead for the first batch."""
-    import duckdb
+    duckdb = require("duckdb", "files", "files")
 
     try:
         return start()
@@ -116,7 +118,7 @@ def _find(path: str) -> list[str]:
 
 
 def _open_with_duckdb(paths: Sequence[str], name: str, reading: Reading, limit: int | None) -> Source:
-    import duckdb
+    duckdb = require("duckdb", "files", "files")
 
     suffixes = {_suffix(path) for path in paths}
     functions = {_FILE_FUNCTIONS.get(suffix, "read_csv") for suffix in suffixes}
@@ -159,7 +161,7 @@ def _suffix(path: str) -> str:
 
 def _connect(limit: int | None, is_local: bool) -> Any:
     """A connection that takes as little memory as the files allow."""
-    import duckdb
+    duckdb = require("duckdb", "files", "files")
 
     # The library works on one thread, and each further one of DuckDB's would hold batches in memory for it.
     connection = duckdb.connect(config={"threads": 1})
@@ -170,10 +172,9 @@ def _connect(limit: int | None, is_local: bool) -> Any:
     if limit is not None:
         settings["memory_limit"] = f"'{limit}B'"
     for setting, value in settings.items():
-        try:
+        # An older version doesn't have the setting, nor what it turns off.
+        with contextlib.suppress(duckdb.CatalogException):
             connection.execute(f"SET {setting} = {value}")
-        except duckdb.CatalogException:
-            pass  # an older version doesn't have the setting, nor what it turns off
     return connection
 
 

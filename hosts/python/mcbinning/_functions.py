@@ -11,7 +11,7 @@ from ._opening import open_source
 from ._outcome import make_result
 from ._plan import Plan, columns_left_out, name_missing, names_to_bin
 from ._progress import Progress, reporting
-from ._result import BinningResult, Settings
+from ._result import BinningResult
 from ._settings import check_settings, directory_of
 from ._sources import name_of
 from ._types import Closed, MemoryLimit, Missing, Rounding
@@ -120,7 +120,7 @@ def supervised_bins(
     ['(-inf, 26]', '(26, +inf)']
     >>> bins["age"].gain
     1.0
-    >>> bins.transform(pd.DataFrame({"age": [30, None, 18]}))["age"].tolist()
+    >>> bins.transform(pd.DataFrame({"age": [30, None, 18]}))["age_bin"].tolist()
     [1, <NA>, 0]
     """
     if (target is None) == (pairs is None):
@@ -135,21 +135,22 @@ def supervised_bins(
     else:
         wanted = [(name, target) for name in names_to_bin(source, attributes, [target, weight])]
     plan = Plan(source, wanted, target, weight, name_missing(missing), rounding)
-    settings = Settings(closed, n_bins, max_distinct, small_bin_ratio)
     feed = plan.open_feed(directory_of(temp_dir))
     with reporting(progress, plan.names, len(wanted), source.rows) as report:
-        outcome = feed.bin_supervised(
+        bins = feed.bin(
             [plan.names.index(attribute) for attribute, _ in wanted],
             [plan.names.index(category) for _, category in wanted],
+            target=None if target is None else plan.names.index(target),
             n_bins=n_bins,
-            max_distinct=max_distinct or 0,
+            max_distinct=max_distinct,
             small_bin_ratio=small_bin_ratio,
             right_closed=closed == "right",
+            data_name=source.name,
             temp_dir=directory_of(temp_dir),
             progress=report,
         )
     left_out = columns_left_out(source, plan.names) if attributes is None and pairs is None else None
-    return make_result(outcome, plan.variables(feed), settings, "supervised", source.name, left_out)
+    return make_result(bins, left_out)
 
 
 def equal_frequency_bins(
@@ -231,13 +232,12 @@ def equal_frequency_bins(
     plan = Plan(source, [(name, None) for name in names], None, weight, name_missing(missing), rounding)
     feed = plan.open_feed(directory_of(temp_dir))
     with reporting(progress, plan.names, len(names), source.rows) as report:
-        outcome = feed.bin_equal_frequency(
+        bins = feed.bin(
             [plan.names.index(name) for name in names],
             n_bins=n_bins,
             right_closed=closed == "right",
+            data_name=source.name,
             temp_dir=directory_of(temp_dir),
             progress=report,
         )
-    left_out = columns_left_out(source, plan.names) if attributes is None else None
-    settings = Settings(closed, n_bins)
-    return make_result(outcome, plan.variables(feed), settings, "equal-frequency", source.name, left_out)
+    return make_result(bins, columns_left_out(source, plan.names) if attributes is None else None)

@@ -9,8 +9,10 @@ from ._files import Reading, open_paths, open_relation
 from ._frames import open_pandas, open_polars, open_polars_lazy, open_pyarrow
 from ._sources import Source, once, open_stream
 
+_PLAIN = Reading()
 
-def open_source(data: Any, reading: Reading = Reading()) -> Source:
+
+def open_source(data: Any, reading: Reading = _PLAIN) -> Source:
     """Any object with the Arrow stream protocol, a polars LazyFrame, a path or several."""
     if is_path(data):
         return open_paths([os.fspath(data)], reading)

@@ -10,7 +10,6 @@ import numpy as np
 
 from . import _core, _values
 from ._errors import DataError
-from ._result import Variable
 from ._sources import Column, Source, check_names, name_of
 from ._types import Missing, Rounding
 
@@ -120,9 +119,6 @@ class Plan:
                 feed.set_categories(self.names.index(name), categories)
         return feed
 
-    def variables(self, feed: _core.Feed) -> list[Variable]:
-        return [self._variable(feed, index, name) for index, name in enumerate(self.names)]
-
     def _column(self, name: str) -> Column:
         return next(column for column in self.source.columns if column.name == name)
 
@@ -144,24 +140,11 @@ class Plan:
         places = [fields[0] for fields in table.columns]
         feed = _core.Feed(table)
         for index, name in enumerate(names):
-            feed.add_variable(name, self._use(name), column=places.index(name), rounding=self.rounding)
+            feed.add_field(name, self._use(name), column=places.index(name), rounding=self.rounding)
             values, interval = self._missing(name)
             is_text = self._column(name).kind == "text"
             feed.declare_missing(index, [] if is_text else list(values), interval, list(values) if is_text else [])
         return feed
-
-    def _variable(self, feed: _core.Feed, index: int, name: str) -> Variable:
-        column = self._column(name)
-        use = self._use(name)
-        return Variable(
-            name,
-            "weight" if use == "weight" else "target" if name == self.target else "attribute",
-            column.kind,
-            column.time_zone,
-            tuple(feed.categories(index)) if use == "category" else None,
-            *self._missing(name),
-            rounding=self.rounding if use == "weight" else None,
-        )
 
     def _check_categories(self, name: str, categories: list[Any]) -> None:
         if len(categories) == 0:

@@ -6,15 +6,17 @@ from typing import TYPE_CHECKING
 
 import numpy as np
 
-from ._result import AttributeBins, BinningResult
+from ._features import require
 
 if TYPE_CHECKING:
     import matplotlib.axes
     import matplotlib.figure
 
+    from ._result import AttributeBins, BinningResult
+
 
 def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
-    import matplotlib.pyplot as plt
+    plt = require("matplotlib.pyplot", "plots", "plot")
 
     if ax is None:
         ax = plt.subplots(layout="constrained")[1]
@@ -41,17 +43,18 @@ def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> m
         ax.set_ylabel(f"share of {found.target.name}")
         ax.legend(title=found.target.name, fontsize="small")
     ax.set_xlim(0.0, 1.0)
-    ax.set_xticks(lefts[1:], [found.variable.format(cut) for cut in found.borders.tolist()], rotation=45, ha="right")
+    ax.set_xticks(lefts[1:], found.border_texts, rotation=45, ha="right")
     ax.set_xlabel(f"{found.attribute}: cut points, over the share of the weight")
     return ax
 
 
 def plot_all(result: BinningResult, columns: int) -> matplotlib.figure.Figure:
-    import matplotlib.pyplot as plt
+    plt = require("matplotlib.pyplot", "plots", "plot")
 
     ordered = result.by_gain()
     columns = max(1, min(columns, len(ordered)))
     rows = max(1, -(-len(ordered) // columns))
+    figure: matplotlib.figure.Figure
     figure, axes = plt.subplots(rows, columns, figsize=(4.5 * columns, 3.5 * rows), squeeze=False, layout="constrained")
     for ax, found in zip(axes.flat, ordered):
         plot_bins(found, ax)

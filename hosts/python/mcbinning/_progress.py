@@ -4,9 +4,11 @@ from __future__ import annotations
 
 from collections.abc import Callable, Iterator
 from contextlib import contextmanager
-from typing import Any, Union
+from typing import Any
 
-Progress = Union[bool, Callable[[str, int], None]]
+from ._features import require
+
+Progress = bool | Callable[[str, int], None]
 """Whether to show progress bars, or a function that is called with the phase, `"records"` or `"attributes"`, and the
 number of records read or the place of the attribute just done among the variables."""
 
@@ -15,8 +17,7 @@ class _Bars:
     """A bar for the rows, then one for the attributes."""
 
     def __init__(self, names: list[str], total: int, rows: int | None) -> None:
-        from tqdm.auto import tqdm
-
+        tqdm = require("tqdm.auto", "progress bars", "progress").tqdm
         self._tqdm: Any = tqdm
         self._names = names
         self._total = total

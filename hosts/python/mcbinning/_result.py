@@ -2,16 +2,18 @@
 
 from __future__ import annotations
 
+import datetime
 import os
 from collections.abc import Iterator, Mapping
-from dataclasses import dataclass, field
+from dataclasses import dataclass
 from functools import cached_property
-from typing import TYPE_CHECKING, Any
+from typing import TYPE_CHECKING, Any, cast
 
 import numpy as np
-import pandas as pd
 
-from . import _values
+from . import _core, _values
+from ._features import require
+from ._json import read_bins
 from ._sources import name_of
 from ._status import Status
 from ._types import Closed, MemoryLimit, Method, Role, Unseen
@@ -20,9 +22,8 @@ from ._values import Codes, Floats
 if TYPE_CHECKING:
     import matplotlib.axes
     import matplotlib.figure
+    import pandas as pd
     import pyarrow as pa
-
-_ROUNDING = 1e-12
 
 
 @dataclass(frozen=True)
@@ -30,21 +31,39 @@ class Variable:
     """A column of the analysis."""
 
     name: str
-    role: Role = "attribute"
-    kind: str = "float"
-    """What its values are: `"float"`, `"integer"`, `"decimal"`, `"boolean"`, `"date"`, `"timestamp"`, `"text"`."""
-    time_zone: str = ""
-    categories: tuple[Any, ...] | None = None
+    role: Role
+    kind: str
+    """What its values are: `"float"`, `"integer"`, `"boolean"`, `"date"`, `"timestamp"`, `"text"`. Numbers that are
+    measured are `"float"`, and those that are categories `"integer"` if all of them are whole."""
+    time_zone: str
+    categories: tuple[Any, ...] | None
     """As texts or numbers, by code; None for a column that is measured."""
-    missing_values: tuple[Any, ...] = ()
-    missing_interval: tuple[float, float] | None = None
-    label: str = ""
-    rounding: str | None = None
+    missing_values: tuple[Any, ...]
+    missing_interval: tuple[float, float] | None
+    label: str
+    rounding: str | None
     """Of a weight: `"none"`, `"truncate"` or `"closest"`."""
-    missing_texts: tuple[str, ...] = ()
+    missing_texts: tuple[str, ...]
     """What stands for a missing value in a text file, where `missing_values` are numbers."""
-    grid: float | None = None
+    grid: float | None
     """Of a weight: of what its values were made multiples, so that all sums are exact; None if none had to move."""
+
+    @classmethod
+    def from_core(cls, core: _core.Variable) -> Variable:
+        is_text = core.kind == "text"
+        return cls(
+            core.name,
+            cast(Role, core.role),
+            core.kind,
+            core.time_zone,
+            None if core.categories is None else tuple(core.categories),
+            tuple(core.missing_texts if is_text else core.missing_numbers),
+            core.missing_interval,
+            core.label,
+            core.rounding,
+            () if is_text else tuple(core.missing_texts),
+            core.grid,
+        )
 
     @property
     def is_categorical(self) -> bool:
@@ -54,48 +73,57 @@ class Variable:
         """The categories as the user knows them."""
         if self.kind == "text":
             return list(self.categories or ())
-        return [_values.decode(float(number), self.kind, self.time_zone) for number in self.categories or ()]
-
-    def category_label(self, code: int) -> str:
-        """The category in words."""
-        if self.kind in ("float", "decimal") and self.categories is not None:
-            return self.format(float(self.categories[code]))
-        return str(self.category_names()[code])
-
-    def format(self, value: float) -> str:
-        return _values.format_value(value, self.kind, self.time_zone)
+        return [_values.decode(number, self.kind, self.time_zone) for number in self.categories or ()]
 
 
 @dataclass(frozen=True)
 class Settings:
-    closed: Closed = "right"
-    n_bins: int = 10
-    max_distinct: int | None = None
-    small_bin_ratio: float | None = None
+    closed: Closed
+    n_bins: int
+    max_distinct: int | None
+    small_bin_ratio: float | None
 
 
-@dataclass(frozen=True)
 class AttributeBins:
     """The bins of one attribute, against one target or none."""
 
-    variable: Variable
-    target: Variable | None
-    status: Status
-    closed: Closed
-    cut_points: Floats
-    """In ascending order. Dates are days and timestamps microseconds since 1970; categories are codes."""
-    weights: Floats
-    """By bin; one bin more than there are cut points, or none where nothing was binned."""
-    target_weights: Floats | None
-    """By bin and category of the target."""
-    n_distinct: int
-    weight: float
-    """Of the records with a valid value, and a valid target if there is one."""
-    weight_with_missing: float
-    minimum: float
-    maximum: float
-    model_entropy: float
-    """What is left of the target's entropy within the bins, in bits; NaN without a target."""
+    def __init__(self, core: _core.AttributeBins) -> None:
+        self._core = core
+        self.variable = Variable.from_core(core.variable)
+        self.target = None if core.target is None else Variable.from_core(core.target)
+        self.status = Status.from_core(core.status)
+        self.closed: Closed = "right" if core.right_closed else "left"
+        self.cut_points = core.cut_points
+        """In ascending order. Dates are days and timestamps microseconds since 1970; categories are codes."""
+        self.weights = core.weights
+        """By bin; one bin more than there are cut points, or none where nothing was binned."""
+        self.target_weights = core.target_weights
+        """By bin and category of the target."""
+        self.n_distinct = core.n_distinct
+        self.weight = core.weight
+        """Of the records with a valid value, and a valid target if there is one."""
+        self.weight_with_missing = core.weight_with_missing
+        self.minimum = core.minimum
+        """NaN where there is no valid value, as with the maximum."""
+        self.maximum = core.maximum
+        self.target_entropy = core.target_entropy
+        """The target's entropy over the records that `weight` counts, in bits; NaN without a target."""
+        self.model_entropy = core.model_entropy
+        """What is left of the target's entropy within the bins, in bits; NaN without a target."""
+        self.gain = core.gain
+        """By how many bits the bins lower the target's entropy; NaN without a target."""
+        self.rates = core.rates
+        """By bin: the share of the target's second category, the event; None unless the target has two categories."""
+        self.woe = core.woe
+        """By bin: the weight of evidence ln(p / q), where p is the bin's share of all events, and q of all others; None
+        unless the target has two categories."""
+        self.iv = core.iv
+        """By bin: its part of the information value, (p - q) ln(p / q); None unless the target has two categories."""
+        self.information_value = core.information_value
+        """The sum over the bins; NaN unless the target has two categories."""
+
+    def __reduce__(self) -> tuple[Any, ...]:
+        return _restore_bins, (self._core.alone().to_json(),)
 
     @property
     def attribute(self) -> str:
@@ -109,41 +137,26 @@ class AttributeBins:
     def missing_weight(self) -> float:
         return self.weight_with_missing - self.weight
 
-    @cached_property
-    def target_entropy(self) -> float:
-        """The target's entropy over the records that `weight` counts, in bits; NaN without a target."""
-        if self.target_weights is None or len(self.target_weights) == 0:
-            return float("nan")
-        return _values.entropy(self.target_weights.sum(axis=0))
-
-    @property
-    def gain(self) -> float:
-        """By how many bits the bins lower the target's entropy; NaN without a target."""
-        difference = self.target_entropy - self.model_entropy
-        # No cut raises the entropy, and none at all leaves it: below this the difference is what rounding has left.
-        is_nothing = difference < _ROUNDING * max(1.0, self.target_entropy) or len(self.cut_points) == 0
-        return 0.0 if is_nothing and not np.isnan(difference) else difference
-
     @property
     def borders(self) -> Floats:
         """The cut points as people read them. One between two days or two microseconds is shown as the nearest of these
         that parts the same dates or timestamps."""
-        if self.variable.kind not in ("date", "timestamp"):
-            return self.cut_points
-        shown: Floats = np.floor(self.cut_points) if self.closed == "right" else np.ceil(self.cut_points)
-        return shown
+        return self._core.borders
+
+    @property
+    def border_texts(self) -> list[str]:
+        """The borders in words."""
+        return self._core.border_texts
 
     @cached_property
     def labels(self) -> list[str]:
         """The bins in words: an interval, or the categories that are in it."""
-        if not self.variable.is_categorical:
-            return _values.intervals(self.borders, self.closed, self.variable.format)
-        names = np.array([self.variable.category_label(code) for code in range(len(self.variable.categories or ()))])
-        bins = _values.bin_numbers(np.arange(len(names), dtype=np.float64), self.cut_points, self.closed)
-        return ["{" + ", ".join(names[bins == bin]) + "}" for bin in range(len(self.cut_points) + 1)]
+        return self._core.labels
 
     def to_pandas(self) -> pd.DataFrame:
-        """A row for each bin: its ends, its weight and share, and its weight in each category of the target."""
+        """A row for each bin: its ends, its weight and share, and its weight in each category of the target; of a target
+        of two categories `rate`, `woe` and `iv`, too."""
+        pandas = require("pandas", "data frames", "pandas")
         ends = [-np.inf, *self.cut_points, np.inf]
         n = self.n_bins
         with np.errstate(invalid="ignore", divide="ignore"):
@@ -152,7 +165,7 @@ class AttributeBins:
             "attribute": [self.attribute] * n,
             "target": [self.target.name if self.target else None] * n,
             "bin": np.arange(n),
-            "interval": self.labels[:n],
+            "interval": self.labels,
             "left": ends[:n],
             "right": ends[1 : n + 1],
             "weight": self.weights,
@@ -161,7 +174,10 @@ class AttributeBins:
         if self.target is not None and self.target_weights is not None:
             for code, name in enumerate(self.target.category_names()):
                 columns[f"weight[{name}]"] = self.target_weights[:, code]
-        return pd.DataFrame(columns)
+        if self.rates is not None:
+            columns |= {"rate": self.rates, "woe": self.woe, "iv": self.iv}
+        frame: pd.DataFrame = pandas.DataFrame(columns)
+        return frame
 
     def bin_numbers(self, values: Floats) -> Codes:
         """The bin of each value, from 0; one past the last bin for a NaN. A value outside the range seen falls into an
@@ -174,28 +190,40 @@ class AttributeBins:
 
         return plot_bins(self, ax)
 
+    def __repr__(self) -> str:
+        against = f" against {self.target.name!r}" if self.target else ""
+        return f"<AttributeBins of {self.attribute!r}{against}: {self.labels if self.n_bins else self.status}>"
 
-@dataclass(frozen=True, eq=False)
+
 class BinningResult(Mapping[Any, AttributeBins]):
     """The bins of all attributes, by the attribute's name; with several targets, by attribute and target.
 
     In a notebook it shows itself as its `summary()`.
     """
 
-    method: Method
-    settings: Settings
-    variables: tuple[Variable, ...]
-    status: Status
-    bins: tuple[AttributeBins, ...]
-    left_out: Mapping[str, str] = field(default_factory=dict)
-    """What each column holds that was not named, and is not of a kind that is binned unless it is: text, durations."""
-    data_name: str | None = None
-    records: int | None = None
-    """How many were read, whatever their weight."""
-    component_version: str = ""
-    missing_text: tuple[str, ...] = ()
-    records_without_weight: int | None = None
-    """How many were left out since their weight is missing; None without a weight."""
+    def __init__(self, core: _core.Bins, left_out: Mapping[str, str] | None = None) -> None:
+        for index, found in enumerate(core.results):
+            if found.variable.time_zone:
+                core.set_border_texts(index, _tell_in_time_zone(found))
+        self._core = core
+        self.method = cast(Method, core.method)
+        self.settings = Settings(cast(Closed, core.closed), core.n_bins, core.max_distinct, core.small_bin_ratio)
+        self.variables = tuple(map(Variable.from_core, core.variables))
+        self.status = Status.from_core(core.status)
+        self.bins = tuple(map(AttributeBins, core.results))
+        self.left_out = dict(left_out or {})
+        """What each column holds that was not named, and is not of a kind that is binned unless it is: text, durations."""
+        self.data_name = core.data_name
+        self.records = core.records
+        """How many were read, whatever their weight."""
+        self.records_without_weight = core.records_without_weight
+        """How many were left out since their weight is missing; None without a weight."""
+        self.component_version = core.component_version
+        self.missing_text = tuple(core.missing_text)
+        """What stands for a missing value in every column of a text file."""
+
+    def __reduce__(self) -> tuple[Any, ...]:
+        return _restore, (self.to_json(), self.left_out)
 
     @property
     def weight_grid(self) -> float | None:
@@ -235,6 +263,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
                 "gain": found.gain,
                 "target_entropy": found.target_entropy,
                 "model_entropy": found.model_entropy,
+                "information_value": found.information_value,
                 "bins": found.n_bins,
                 "distinct_values": found.n_distinct,
                 "weight": found.weight,
@@ -248,15 +277,19 @@ class BinningResult(Mapping[Any, AttributeBins]):
         rows += [
             {"attribute": name, "bins": 0, "status": f"left out: {kind}"} for name, kind in self.left_out.items()
         ]
-        frame = pd.DataFrame(rows).astype({"distinct_values": "Int64"} if rows else {})
+        pandas = require("pandas", "data frames", "pandas")
+        frame: pd.DataFrame = pandas.DataFrame(rows).astype({"distinct_values": "Int64"} if rows else {})
         if self.method != "supervised":
-            frame = frame.drop(columns=["target", "gain", "target_entropy", "model_entropy"], errors="ignore")
+            of_targets = ["target", "gain", "target_entropy", "model_entropy", "information_value"]
+            frame = frame.drop(columns=of_targets, errors="ignore")
         return frame
 
     def to_pandas(self) -> pd.DataFrame:
         """A row for each bin of each attribute."""
         frames = [found.to_pandas() for found in self.bins if found.n_bins]
-        return pd.concat(frames, ignore_index=True) if frames else pd.DataFrame()
+        pandas = require("pandas", "data frames", "pandas")
+        frame: pd.DataFrame = pandas.concat(frames, ignore_index=True) if frames else pandas.DataFrame()
+        return frame
 
     def to_arrow(self) -> pa.Table:
         """`to_pandas()` as an Arrow table."""
@@ -285,13 +318,30 @@ class BinningResult(Mapping[Any, AttributeBins]):
         >>> mb.BinningResult.from_json(bins.to_json())["income"].labels
         ['(-inf, 49.5]', '(49.5, +inf)']
         """
-        from ._json import dump
+        return _write(self._core.to_json(), path)
 
-        text = dump(self)
-        if path is not None:
-            with open(path, "w", encoding="utf-8") as file:
-                file.write(text)
-        return text
+    def to_csv(self, path: str | os.PathLike[str] | None = None) -> str:
+        """Writes a row for each bin as CSV, as `mcbin --format csv` does.
+
+        Parameters
+        ----------
+        path : path, default=None
+            The file that the text goes into as well. None: into none.
+
+        Returns
+        -------
+        str
+            The text.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2)
+        >>> len(bins.to_csv().splitlines())
+        3
+        """
+        return _write(self._core.to_csv(), path)
 
     @classmethod
     def from_json(cls, source: str | os.PathLike[str]) -> BinningResult:
@@ -310,7 +360,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         Raises
         ------
         ValueError
-            The text is no JSON of bins, or of a newer version.
+            The text is no JSON of bins, or of a newer version. The message names the file, and the place in it.
 
         Examples
         --------
@@ -320,13 +370,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         >>> mb.BinningResult.from_json(text).method
         'equal-frequency'
         """
-        from ._json import load
-
-        text = os.fspath(source)
-        if not text.lstrip().startswith("{"):
-            with open(text, encoding="utf-8") as file:
-                text = file.read()
-        return load(text)
+        return cls(read_bins(source))
 
     def to_sql(self, dialect: str = "", table: str | None = None, labels: bool = False) -> str:
         """Writes SQL that finds the bins of each row: a CASE expression for each attribute.
@@ -336,14 +380,15 @@ class BinningResult(Mapping[Any, AttributeBins]):
         dialect : str, default=""
             One of sqlglot's, such as "duckdb", "postgres" or "bigquery"; standard SQL without one.
         table : str, default=None
-            The table of the SELECT around the expressions. None: the expressions alone.
+            The table of the SELECT around the expressions, as it stands in SQL. None: the expressions alone.
         labels : bool, default=False
             Whether the bins are told in words; otherwise by their numbers from 0.
 
         Returns
         -------
         str
-            The SQL. It gives NULL for a missing value, and for a category that the bins were made without.
+            The SQL. It gives NULL for a missing value, and for a category that the bins were made without. Its columns
+            are named as those of `transform`.
 
         Raises
         ------
@@ -355,12 +400,16 @@ class BinningResult(Mapping[Any, AttributeBins]):
         >>> import mcbinning as mb
         >>> import pandas as pd
         >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2)
-        >>> print(bins.to_sql("duckdb"))
-        CASE WHEN "income" IS NULL THEN NULL WHEN "income" <= 49.5 THEN 0 ELSE 1 END AS "income_bin"
+        >>> print(bins.to_sql("duckdb"), end="")
+        CASE
+          WHEN "income" IS NULL OR isnan("income") THEN NULL
+          WHEN "income" <= 49.5 THEN 0
+          ELSE 1
+        END AS "income_bin"
         """
         from ._sql import write
 
-        return write(self, dialect, table, labels)
+        return write(self._core, dialect, table, labels)
 
     def transform(
         self, data: Any, labels: bool = False, *, unseen: Unseen = "error", memory_limit: MemoryLimit | None = None
@@ -381,26 +430,32 @@ class BinningResult(Mapping[Any, AttributeBins]):
         Returns
         -------
         pandas.DataFrame, polars.DataFrame, pyarrow.Table or pyarrow.RecordBatchReader
-            A column for each attribute. A pandas or polars frame gives one of its kind, an Arrow table gives a table;
-            a path, a LazyFrame or any other stream gives a reader, which takes the data batch by batch. A missing value
-            has no bin.
+            A column for each attribute, such as "age_bin", or "age_by_bought_bin" where there are several targets; "_2"
+            and so on follow where the data have such a column. A pandas or polars frame gives one of its kind, an Arrow
+            table gives a table; a path, a LazyFrame or any other stream gives a reader, which takes the data batch by
+            batch. A missing value has no bin.
 
         Raises
         ------
         DataError
             A column is missing or of another type, or a category unseen; `column` and `row` tell where.
 
+        Warns
+        -----
+        BinningWarning
+            An attribute has no bins, and so no column.
+
         Examples
         --------
         >>> import mcbinning as mb
         >>> import pandas as pd
         >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2)
-        >>> bins.transform(pd.DataFrame({"income": [12, None, 70]}), labels=True)["income"].tolist()
+        >>> bins.transform(pd.DataFrame({"income": [12, None, 70]}), labels=True)["income_bin"].tolist()
         ['(-inf, 49.5]', nan, '(49.5, +inf)']
         """
         from ._transform import transform
 
-        return transform(self, data, labels, unseen, memory_limit)
+        return transform(self, self._core.columns, data, labels, unseen, memory_limit)
 
     def plot(self, attribute: Any = None, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
         """Draws one attribute; the one of the largest gain if none is named."""
@@ -413,7 +468,11 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return plot_all(self, columns)
 
     def __repr__(self) -> str:
-        return f"<BinningResult: {self.method}, {self._count()}>\n{self._shown().to_string(index=False, na_rep='')}"
+        head = f"<BinningResult: {self.method}, {self._count()}>"
+        try:
+            return f"{head}\n{self._shown().to_string(index=False, na_rep='')}"
+        except ImportError:  # without pandas
+            return head
 
     def _repr_html_(self) -> str:
         figures = self._shown().to_html(index=False, float_format=lambda value: f"{value:.4g}", na_rep="")
@@ -429,3 +488,27 @@ class BinningResult(Mapping[Any, AttributeBins]):
 
     def _count(self) -> str:
         return f"{len(self)} results" + (f", {len(self.left_out)} columns left out" if self.left_out else "")
+
+
+def _tell_in_time_zone(found: _core.AttributeBins) -> list[str]:
+    """The borders in words, as people in the time zone read them. Those beyond all calendars stay numbers."""
+    stamps = [_values.decode(border, "timestamp", found.variable.time_zone) for border in found.borders.tolist()]
+    return [
+        str(stamp) if isinstance(stamp, datetime.datetime) else text
+        for stamp, text in zip(stamps, found.border_texts)
+    ]
+
+
+def _write(text: str, path: str | os.PathLike[str] | None) -> str:
+    if path is not None:
+        with open(path, "w", encoding="utf-8", newline="") as file:
+            file.write(text)
+    return text
+
+
+def _restore(text: str, left_out: Mapping[str, str]) -> BinningResult:
+    return BinningResult(read_bins(text), left_out)
+
+
+def _restore_bins(text: str) -> AttributeBins:
+    return _restore(text, {}).bins[0]

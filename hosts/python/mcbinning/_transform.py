@@ -2,33 +2,47 @@
 
 from __future__ import annotations
 
-from collections.abc import Iterator, Sequence
-from typing import Any
+import warnings
+from collections.abc import Callable, Iterator, Sequence
+from typing import TYPE_CHECKING, Any
 
 import numpy as np
 import pyarrow as pa
 
 from . import _core
-from ._errors import DataError
-from ._result import AttributeBins, BinningResult, Variable
+from ._errors import DataError, warning_of
 from ._files import Reading
 from ._opening import open_source
 from ._sources import Source, check_names, columns_of
 from ._types import MemoryLimit, Unseen
 
+if TYPE_CHECKING:
+    from ._result import AttributeBins, BinningResult, Variable
+
 _ROWS_AT_ONCE = 1 << 17
 
 
 def transform(
-    result: BinningResult, data: Any, labels: bool, unseen: Unseen, memory_limit: MemoryLimit | None
+    result: BinningResult,
+    name_columns: Callable[[list[str]], list[tuple[int, str]]],
+    data: Any,
+    labels: bool,
+    unseen: Unseen,
+    memory_limit: MemoryLimit | None,
 ) -> Any:
+    r"""\param name_columns gives the index of the result and the name of each column of bins, by the names that are taken."""
     if unseen not in ("error", "missing"):
         raise ValueError(f"unseen must be 'error' or 'missing', not {unseen!r}")
-    chosen = _one_for_each_attribute(result.bins)
-    texts = {found.attribute: found.variable.missing_texts for found in chosen if found.variable.missing_texts}
+    variables = {found.attribute: found.variable for found in result.bins if found.n_bins}
+    texts = {name: variable.missing_texts for name, variable in variables.items() if variable.missing_texts}
     source = open_source(data, Reading(result.missing_text, texts, memory_limit))
-    feed = open_values(source, [found.variable for found in chosen], result.missing_text, unseen)
-    schema = pa.schema([(found.attribute, pa.utf8() if labels else pa.int32()) for found in chosen])
+    feed = open_values(source, list(variables.values()), result.missing_text, unseen)
+    named = name_columns([column.name for column in source.columns])
+    schema = pa.schema([(name, pa.utf8() if labels else pa.int32()) for _, name in named])
+    chosen = [(result.bins[index], list(variables).index(result.bins[index].attribute)) for index, _ in named]
+    for found in result.bins:
+        if not found.n_bins:
+            warnings.warn(warning_of(found.attribute, found.status), stacklevel=3)
     batches = _batches(feed, chosen, schema, labels)
     if source.rows is None:
         return pa.RecordBatchReader.from_batches(schema, batches)
@@ -47,18 +61,23 @@ def open_values(
     feed = _core.Feed(table)
     for index, variable in enumerate(variables):
         place = places.index(variable.name)
-        feed.add_variable(variable.name, "category" if variable.is_categorical else "attribute", column=place)
+        feed.add_field(variable.name, "category" if variable.is_categorical else "attribute", column=place)
         values = list(variable.missing_values)
         if columns[place].kind == "text":
             feed.declare_missing(index, [], None, [*map(str, values), *missing_text])
         else:
             feed.declare_missing(index, _as_numbers(values, variable), variable.missing_interval, [])
         if variable.categories is not None:
-            categories = list(variable.categories)
-            feed.set_categories(
-                index, categories if columns[place].kind == "text" else _as_numbers(categories, variable), unseen
-            )
+            feed.set_categories(index, _as_in_column(list(variable.categories), variable, columns[place].kind), unseen)
     return feed
+
+
+def _as_in_column(categories: list[Any], variable: Variable, kind: str) -> list[Any]:
+    if kind != "text":
+        return _as_numbers(categories, variable)
+    if variable.kind != "text":
+        raise DataError("the column holds texts, but its categories are numbers", variable.name)
+    return categories
 
 
 def _as_numbers(values: list[Any], variable: Variable) -> list[float]:
@@ -69,23 +88,17 @@ def _as_numbers(values: list[Any], variable: Variable) -> list[float]:
         raise DataError(f"the column holds no texts, but its categories are texts: {error}", variable.name) from error
 
 
-def _one_for_each_attribute(bins: Sequence[AttributeBins]) -> list[AttributeBins]:
-    chosen = {found.attribute: found for found in bins if not found.status.is_error}
-    if len(chosen) < sum(not found.status.is_error for found in bins):
-        raise ValueError("there are bins of one attribute against several targets: transform a result of one target")
-    return list(chosen.values())
-
-
 def _batches(
-    feed: _core.Feed, chosen: Sequence[AttributeBins], schema: pa.Schema, labels: bool
+    feed: _core.Feed, chosen: Sequence[tuple[AttributeBins, int]], schema: pa.Schema, labels: bool
 ) -> Iterator[pa.RecordBatch]:
+    """`chosen` are bins, and the position of their attribute in the feed."""
     while True:
         columns = feed.read(_ROWS_AT_ONCE)
         if not columns or len(columns[0]) == 0:
             return
         arrays = []
-        for found, values in zip(chosen, columns):
-            bins = found.bin_numbers(values).astype(np.int32)
+        for found, position in chosen:
+            bins = found.bin_numbers(columns[position]).astype(np.int32)
             array = pa.array(bins, mask=bins > len(found.cut_points))
             arrays.append(pa.array(found.labels, pa.utf8()).take(array) if labels else array)
         yield pa.RecordBatch.from_arrays(arrays, schema=schema)

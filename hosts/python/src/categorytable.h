@@ -91,11 +91,11 @@ public:
         return ranks;
     }
 
-    std::vector<Key> GetKeys() const { return {fKeys.begin(), fKeys.end()}; }
-
-    /// The categories in the declared or else in the ascending order.
-    std::vector<Key> GetSorted() const
+    /// The categories: by code if `areComplete`, and otherwise in the declared or else in the ascending order.
+    std::vector<Key> GetKeys(bool areComplete) const
     {
+        if (areComplete)
+            return {fKeys.begin(), fKeys.end()};
         std::vector<Key> sorted;
         for (const std::size_t code : SortCodes()) sorted.push_back(fKeys[code]);
         return sorted;

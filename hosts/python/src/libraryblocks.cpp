@@ -7,35 +7,35 @@ using MCMV::gMissingValue;
 namespace
 {
 
-void ConvertValues(const Variable& variable, InfiniteValues& encoder, double* values, std::size_t count)
+void ConvertValues(const Field& field, InfiniteValues& encoder, double* values, std::size_t count)
 {
-    const bool hasMissing = variable.HasMissingNumbers();
+    const bool hasMissing = field.HasMissingNumbers();
     for (std::size_t i = 0; i < count; ++i)
     {
         if (values[i] == gMissingValue)
             continue;
-        const bool isMissing = hasMissing && variable.missingNumbers.Contains(values[i]);
+        const bool isMissing = hasMissing && field.missingNumbers.Contains(values[i]);
         values[i] = isMissing ? gMissingValue : encoder.Encode(values[i]);
     }
 }
 
 } // namespace
 
-std::optional<std::size_t> FindWeight(const std::vector<Variable>& variables)
+std::optional<std::size_t> FindWeight(const std::vector<Field>& fields)
 {
-    for (std::size_t i = 0; i < variables.size(); ++i)
+    for (std::size_t i = 0; i < fields.size(); ++i)
     {
-        if (variables[i].use == Variable::Use::kWeight)
+        if (fields[i].use == Field::Use::kWeight)
             return i;
     }
     return std::nullopt;
 }
 
-TalliedBlocks::TalliedBlocks(BlockSource& source, const std::vector<Variable>& variables)
-    : fSource(source), fWeight(FindWeight(variables))
+TalliedBlocks::TalliedBlocks(BlockSource& source, const std::vector<Field>& fields)
+    : fSource(source), fWeight(FindWeight(fields))
 {
     if (fWeight)
-        fTally.rounding = variables[*fWeight].rounding;
+        fTally.rounding = fields[*fWeight].rounding;
 }
 
 bool TalliedBlocks::Next(Block& block)
@@ -53,8 +53,8 @@ bool TalliedBlocks::Next(Block& block)
     return true;
 }
 
-LibraryBlocks::LibraryBlocks(BlockSource& source, const std::vector<Variable>& variables, const WeightTally& tally)
-    : fSource(source), fVariables(variables), fWeightGrid(tally), fValues(variables.size())
+LibraryBlocks::LibraryBlocks(BlockSource& source, const std::vector<Field>& fields, const WeightTally& tally)
+    : fSource(source), fFields(fields), fWeightGrid(tally), fValues(fields.size())
 {
 }
 
@@ -62,19 +62,19 @@ bool LibraryBlocks::Next(Block& block)
 {
     if (!fSource.Next(block))
         return false;
-    for (std::size_t i = 0; i < fVariables.size(); ++i)
+    for (std::size_t i = 0; i < fFields.size(); ++i)
     {
-        if (fVariables[i].use == Variable::Use::kWeight)
+        if (fFields[i].use == Field::Use::kWeight)
             ConvertWeights(block.GetField(i), block.numRows);
-        else if (fVariables[i].use == Variable::Use::kAttribute)
-            ConvertValues(fVariables[i], fValues[i], block.GetField(i), block.numRows);
+        else if (fFields[i].use == Field::Use::kAttribute)
+            ConvertValues(fFields[i], fValues[i], block.GetField(i), block.numRows);
     }
     return true;
 }
 
 std::optional<std::int64_t> LibraryBlocks::GetNumWithoutWeight() const
 {
-    return FindWeight(fVariables) ? std::optional(fNumWithoutWeight) : std::nullopt;
+    return FindWeight(fFields) ? std::optional(fNumWithoutWeight) : std::nullopt;
 }
 
 void LibraryBlocks::ConvertWeights(double* weights, std::size_t count)

@@ -4,7 +4,7 @@
 #include "bins/infinitevalues.h"
 #include "bins/weightgrid.h"
 #include "hosts/python/src/blocks.h"
-#include "hosts/python/src/variable.h"
+#include "hosts/python/src/field.h"
 
 #include <cstddef>
 #include <cstdint>
@@ -12,14 +12,14 @@
 #include <vector>
 
 /// The index of the weight, if there is one.
-std::optional<std::size_t> FindWeight(const std::vector<Variable>& variables);
+std::optional<std::size_t> FindWeight(const std::vector<Field>& fields);
 
 /// Passes blocks on as they are, and tallies their weights.
 class TalliedBlocks : public BlockSource
 {
 public:
     /// Both stay the caller's.
-    TalliedBlocks(BlockSource& source, const std::vector<Variable>& variables);
+    TalliedBlocks(BlockSource& source, const std::vector<Field>& fields);
 
     bool Next(Block& block) override;
 
@@ -37,23 +37,23 @@ class LibraryBlocks : public BlockSource
 {
 public:
     /// `tally` is of all weights that will come. The others stay the caller's.
-    LibraryBlocks(BlockSource& source, const std::vector<Variable>& variables, const WeightTally& tally);
+    LibraryBlocks(BlockSource& source, const std::vector<Field>& fields, const WeightTally& tally);
 
     bool Next(Block& block) override;
 
     const WeightGrid& GetWeightGrid() const { return fWeightGrid; }
 
-    /// How many records had no weight; nothing if no variable holds weights.
+    /// How many records had no weight; nothing if no field holds weights.
     std::optional<std::int64_t> GetNumWithoutWeight() const;
 
-    /// The values that have passed, by variable.
+    /// The values that have passed, by field.
     const std::vector<InfiniteValues>& GetValues() const { return fValues; }
 
 private:
     void ConvertWeights(double* weights, std::size_t count);
 
     BlockSource& fSource;
-    const std::vector<Variable>& fVariables;
+    const std::vector<Field>& fFields;
     WeightGrid fWeightGrid;
     std::int64_t fNumWithoutWeight = 0;
     std::vector<InfiniteValues> fValues;

@@ -1,9 +1,9 @@
 #include "hosts/python/src/runs.h"
 
-#include <mcobnqrt/mcobnqrt.h>
+#include "bins/numbers.h"
+#include "bins/run.h"
 
-#include <memory>
-#include <optional>
+#include <mcobnqrt/mcobnqrt.h>
 
 namespace
 {
@@ -13,24 +13,24 @@ constexpr auto kUnrounded = static_cast<IBINVariable::BINWRoundingOption>(2);
 
 /// The list wants names that differ, and a table may have two alike or an empty one: here each is its number. What is
 /// missing comes as a number that says so already.
-BINVarList MakeList(const std::vector<Variable>& variables)
+BINVarList MakeList(const std::vector<Field>& fields)
 {
     BINVarList list;
-    for (std::size_t i = 0; i < variables.size(); ++i)
+    for (std::size_t i = 0; i < fields.size(); ++i)
     {
-        const Variable& variable = variables[i];
+        const Field& field = fields[i];
         const std::string name = std::to_string(i);
-        switch (variable.use)
+        switch (field.use)
         {
-        case Variable::Use::kAttribute:
-            list.AddContVar(name, variable.name, IBINVariable::RoleAttribute);
+        case Field::Use::kAttribute:
+            list.AddContVar(name, field.name, IBINVariable::RoleAttribute);
             break;
-        case Variable::Use::kWeight:
-            list.AddWeightVar(name, variable.name, kUnrounded);
+        case Field::Use::kWeight:
+            list.AddWeightVar(name, field.name, kUnrounded);
             break;
-        case Variable::Use::kCategory:
-        case Variable::Use::kCode:
-            list.AddCatVar(name, variable.name, static_cast<int>(variable.GetNumCategories()),
+        case Field::Use::kCategory:
+        case Field::Use::kCode:
+            list.AddCatVar(name, field.name, static_cast<int>(field.GetNumCategories()),
                            IBINVariable::MeasureNumericCategorical, IBINVariable::RoleAttribute);
             break;
         }
@@ -38,80 +38,57 @@ BINVarList MakeList(const std::vector<Variable>& variables)
     return list;
 }
 
-/// The host's objects that an algorithm points to; they outlive it.
-class Host
+VariableKind GetKind(const Field& field)
 {
-public:
-    Host(BlockSource& blocks, std::size_t numFields, const nanobind::object& progress, Interrupts& interrupts)
-        : fRecords(blocks, numFields, interrupts), fCancel(fRecords, interrupts)
-    {
-        if (!progress.is_none())
-            fListener.emplace(fRecords, progress);
-    }
+    if (field.use == Field::Use::kWeight)
+        return VariableKind::kWeight;
+    if (field.use == Field::Use::kAttribute)
+        return VariableKind::kContinuous;
+    return field.texts.GetSize() > 0 ? VariableKind::kStringCategorical : VariableKind::kNumericCategorical;
+}
 
-    template<class Settings>
-    Settings MakeSettings(const RunOptions& options)
-    {
-        Settings settings;
-        settings.SetNumberOfBins(options.numBins);
-        settings.SetRightBorderClosed(options.isRightClosed);
-        if (!options.tempDir.empty())
-            settings.SetTempDirName(options.tempDir);
-        settings.SetCancelPointer(&fCancel);
-        if (fListener)
-            settings.SetProgressListener(&*fListener);
-        return settings;
-    }
-
-    /// Runs the algorithm, on further arguments for its Run, and takes all that it has to tell.
-    template<class Result, class Algorithm, class... Arguments>
-    Outcome<Result> Run(Algorithm& algorithm, Arguments... arguments)
-    {
-        Outcome<Result> outcome;
-        outcome.status = algorithm.Run(&fRecords, arguments...);
-        algorithm.GetOutput()->GetAllCutPoints(outcome.results); // its only complaint is that there are none
-        outcome.numRecords = fRecords.GetNumRecords();
-        outcome.version = algorithm.GetVersionString();
-        return outcome;
-    }
-
-private:
-    BlockRecords fRecords;
-    CancelOnInterrupt fCancel;
-    std::optional<ProgressToPython> fListener;
-};
+std::shared_ptr<Variable> MakeVariable(const Field& field, bool isTarget)
+{
+    auto variable = std::make_shared<Variable>();
+    variable->name = field.name;
+    variable->kind = GetKind(field);
+    if (variable->kind == VariableKind::kWeight)
+        variable->role = VariableRole::kWeight;
+    else if (isTarget)
+        variable->role = VariableRole::kTarget;
+    variable->valueKind = field.valueKind;
+    variable->timeZone = field.timeZone;
+    variable->categories = field.texts.GetKeys(field.isComplete);
+    for (const double number : field.numbers.GetKeys(field.isComplete))
+        variable->categories.push_back(FormatNumber(number));
+    variable->rounding = field.rounding;
+    variable->missingTexts = field.missingTexts.GetDiscreteValues();
+    variable->missingNumbers = field.missingNumbers.GetDiscreteValues();
+    variable->missingInterval = field.missingInterval;
+    return variable;
+}
 
 } // namespace
 
-Outcome<BINAttributeTargetResults> RunSupervised(BlockSource& blocks, const std::vector<Variable>& variables,
-                                                 const std::vector<int>& attributes, const std::vector<int>& targets,
-                                                 const RunOptions& options, const nanobind::object& progress,
-                                                 Interrupts& interrupts)
+void BinFields(Bins& bins, const std::vector<Field>& fields, LibraryBlocks& blocks, const RunRequest& request,
+               const nanobind::object& progress, Interrupts& interrupts)
 {
-    Host host(blocks, variables.size(), progress, interrupts);
-    auto settings = host.MakeSettings<BINSettings>(options);
-    settings.SetNumDistinctValueThreshold(options.maxDistinct);
-    settings.SetSmallBinDetectionThreshold(options.smallBinRatio);
-    BINVarList list = MakeList(variables);
-
-    BINFactory factory;
-    const std::unique_ptr<IBINAlgorithm> algorithm(factory.CreateBINAlgorithm(settings, list));
-    if (!algorithm)
-        return {factory.GetStatus(), {}, 0, {}};
-    return host.Run<BINAttributeTargetResults>(*algorithm, &attributes, &targets);
-}
-
-Outcome<BINAttributeResults> RunEqualFrequency(BlockSource& blocks, const std::vector<Variable>& variables,
-                                               const std::vector<int>& attributes, const RunOptions& options,
-                                               const nanobind::object& progress, Interrupts& interrupts)
-{
-    Host host(blocks, variables.size(), progress, interrupts);
-    auto settings = host.MakeSettings<EFBINSettings>(options);
-    BINVarList list = MakeList(variables);
-
-    EFBINFactory factory;
-    const std::unique_ptr<IEFBINAlgorithm> algorithm(factory.CreateEFBINAlgorithm(settings, list));
-    if (!algorithm)
-        return {factory.GetStatus(), {}, 0, {}};
-    return host.Run<BINAttributeResults>(*algorithm, &attributes);
+    for (std::size_t i = 0; i < fields.size(); ++i)
+        bins.variables.push_back(MakeVariable(fields[i], request.target == static_cast<int>(i)));
+    BlockRecords records(blocks, fields.size(), interrupts);
+    CancelOnInterrupt cancel(records, interrupts);
+    std::optional<ProgressToPython> listener;
+    if (!progress.is_none())
+        listener.emplace(records, progress);
+    RunHost host;
+    host.records = &records;
+    host.values = &blocks.GetValues();
+    host.weightGrid = &blocks.GetWeightGrid();
+    host.cancel = &cancel;
+    host.listener = listener ? &*listener : nullptr;
+    host.tempDirectory = request.tempDir;
+    BINVarList list = MakeList(fields);
+    RunBinning(bins, list, &request.attributes, &request.targets, host);
+    bins.numRecords = records.GetNumRecords();
+    bins.numRecordsWithoutWeight = blocks.GetNumWithoutWeight();
 }

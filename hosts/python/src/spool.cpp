@@ -32,8 +32,8 @@ std::FILE* OpenNameless(const std::string& directory)
 
 } // namespace
 
-Spool::Spool(BlockSource& source, const std::vector<Variable>& variables, const std::string& directory)
-    : fNumFields(variables.size()), fFile(OpenNameless(directory))
+Spool::Spool(BlockSource& source, const std::vector<Field>& fields, const std::string& directory)
+    : fNumFields(fields.size()), fFile(OpenNameless(directory))
 {
     Block block(fNumFields);
     while (source.Next(block))
@@ -48,11 +48,11 @@ Spool::Spool(BlockSource& source, const std::vector<Variable>& variables, const 
         ThrowSystemError("can't write a temporary file in " + directory);
     std::rewind(fFile.get());
 
-    for (const Variable& variable : variables)
+    for (const Field& field : fields)
     {
         std::vector<double> newCodes;
-        if (variable.use == Variable::Use::kCategory)
-            for (const std::size_t rank : variable.GetRanks()) newCodes.push_back(static_cast<double>(rank));
+        if (field.use == Field::Use::kCategory)
+            for (const std::size_t rank : field.GetRanks()) newCodes.push_back(static_cast<double>(rank));
         fNewCodes.push_back(newCodes);
     }
 }

@@ -2,7 +2,7 @@
 #define MCBINNING_SPOOL_H
 
 #include "hosts/python/src/blocks.h"
-#include "hosts/python/src/variable.h"
+#include "hosts/python/src/field.h"
 
 #include <cstdio>
 #include <memory>
@@ -16,7 +16,7 @@ class Spool : public BlockSource
 {
 public:
     /// Reads `source` to its end. \throw std::system_error if the file can't be made in `directory`, or written.
-    Spool(BlockSource& source, const std::vector<Variable>& variables, const std::string& directory);
+    Spool(BlockSource& source, const std::vector<Field>& fields, const std::string& directory);
 
     /// \throw std::system_error if the file can't be read.
     bool Next(Block& block) override;

@@ -34,31 +34,31 @@ std::string Describe(double number)
     return "the category " + std::string(text.data(), end.ptr);
 }
 
-double EncodeUnseen(const Variable& variable, const std::string& category, std::int64_t row)
+double EncodeUnseen(const Field& field, const std::string& category, std::int64_t row)
 {
-    switch (variable.unseen)
+    switch (field.unseen)
     {
-    case Variable::Unseen::kMissing:
+    case Field::Unseen::kMissing:
         return kMissingCode;
-    case Variable::Unseen::kError:
+    case Field::Unseen::kError:
         throw DataFault(category + " is not among those that the bins were made of; unseen=\"missing\" gives it no bin",
-                        variable.name, row);
-    case Variable::Unseen::kChanged:
+                        field.name, row);
+    case Field::Unseen::kChanged:
         break;
     }
-    throw DataFault(category + " was not there when the data were read for the first time", variable.name, row);
+    throw DataFault(category + " was not there when the data were read for the first time", field.name, row);
 }
 
 /// The code of a category, which becomes one of `table` where that may still grow.
 template<class Table, class View>
-double EncodeCategory(Variable& variable, Table& table, const View& category, std::int64_t row)
+double EncodeCategory(Field& field, Table& table, const View& category, std::int64_t row)
 {
     if (const std::optional<std::size_t> code = table.Find(category))
         return static_cast<double>(*code);
-    if (variable.isComplete)
-        return EncodeUnseen(variable, Describe(category), row);
+    if (field.isComplete)
+        return EncodeUnseen(field, Describe(category), row);
     if (table.GetSize() >= kMaxCategories)
-        throw DataFault("there are more than 256 categories", variable.name, row);
+        throw DataFault("there are more than 256 categories", field.name, row);
     return static_cast<double>(table.Encode(category));
 }
 
@@ -81,8 +81,8 @@ private:
 class WeightField : public FieldReader
 {
 public:
-    WeightField(std::unique_ptr<ColumnReader> reader, const Variable& variable)
-        : fReader(std::move(reader)), fVariable(variable), fHasMissing(variable.HasMissingNumbers())
+    WeightField(std::unique_ptr<ColumnReader> reader, const Field& field)
+        : fReader(std::move(reader)), fField(field), fHasMissing(field.HasMissingNumbers())
     {
     }
 
@@ -91,10 +91,10 @@ public:
         fReader->Read(first, count, values);
         for (std::size_t i = 0; i < count; ++i)
         {
-            if (fHasMissing && fVariable.missingNumbers.Contains(values[i]))
+            if (fHasMissing && fField.missingNumbers.Contains(values[i]))
                 values[i] = gMissingValue;
             if (!(values[i] >= 0.0 && values[i] < HUGE_VAL) && values[i] != gMissingValue)
-                throw DataFault(Describe(values[i]), fVariable.name, row + static_cast<std::int64_t>(i));
+                throw DataFault(Describe(values[i]), fField.name, row + static_cast<std::int64_t>(i));
         }
     }
 
@@ -107,15 +107,14 @@ private:
     }
 
     std::unique_ptr<ColumnReader> fReader;
-    const Variable& fVariable;
+    const Field& fField;
     bool fHasMissing;
 };
 
 class NumberCategoryField : public FieldReader
 {
 public:
-    NumberCategoryField(std::unique_ptr<ColumnReader> reader, Variable& variable)
-        : fReader(std::move(reader)), fVariable(variable)
+    NumberCategoryField(std::unique_ptr<ColumnReader> reader, Field& field) : fReader(std::move(reader)), fField(field)
     {
     }
 
@@ -128,47 +127,46 @@ public:
 private:
     double Encode(double value, std::int64_t row)
     {
-        if (value == gMissingValue || std::isnan(value) || fVariable.missingNumbers.Contains(value))
+        if (value == gMissingValue || std::isnan(value) || fField.missingNumbers.Contains(value))
             return kMissingCode;
-        return EncodeCategory(fVariable, fVariable.numbers, value, row);
+        return EncodeCategory(fField, fField.numbers, value, row);
     }
 
     std::unique_ptr<ColumnReader> fReader;
-    Variable& fVariable;
+    Field& fField;
 };
 
-double EncodeText(Variable& variable, std::optional<std::string_view> text, std::int64_t row)
+double EncodeText(Field& field, std::optional<std::string_view> text, std::int64_t row)
 {
     if (!text)
         return kMissingCode;
-    if (variable.missingTexts.GetNDiscreteValues() > 0 && variable.missingTexts.Contains(std::string(*text)))
+    if (field.missingTexts.GetNDiscreteValues() > 0 && field.missingTexts.Contains(std::string(*text)))
         return kMissingCode;
-    return EncodeCategory(variable, variable.texts, *text, row);
+    return EncodeCategory(field, field.texts, *text, row);
 }
 
 class TextCategoryField : public FieldReader
 {
 public:
-    TextCategoryField(TextReader reader, Variable& variable) : fReader(reader), fVariable(variable) {}
+    TextCategoryField(TextReader reader, Field& field) : fReader(reader), fField(field) {}
 
     void Read(std::size_t first, std::size_t count, std::int64_t row, double* values) override
     {
         for (std::size_t i = 0; i < count; ++i)
-            values[i] = EncodeText(fVariable, fReader.At(first + i), row + static_cast<std::int64_t>(i));
+            values[i] = EncodeText(fField, fReader.At(first + i), row + static_cast<std::int64_t>(i));
     }
 
 private:
     TextReader fReader;
-    Variable& fVariable;
+    Field& fField;
 };
 
 /// A text of a dictionary is looked up once for each batch. What stands in the dictionary alone is no category.
 class DictionaryCategoryField : public FieldReader
 {
 public:
-    DictionaryCategoryField(std::unique_ptr<ColumnReader> places, TextReader texts, std::size_t size,
-                            Variable& variable)
-        : fPlaces(std::move(places)), fTexts(texts), fCodes(size, gMissingValue), fVariable(variable)
+    DictionaryCategoryField(std::unique_ptr<ColumnReader> places, TextReader texts, std::size_t size, Field& field)
+        : fPlaces(std::move(places)), fTexts(texts), fCodes(size, gMissingValue), fField(field)
     {
     }
 
@@ -188,14 +186,14 @@ private:
     {
         double& code = fCodes[place];
         if (code == gMissingValue)
-            code = EncodeText(fVariable, fTexts.At(place), row);
+            code = EncodeText(fField, fTexts.At(place), row);
         return code;
     }
 
     std::unique_ptr<ColumnReader> fPlaces;
     TextReader fTexts;
     std::vector<double> fCodes; ///< by place; gMissingValue where not looked up yet
-    Variable& fVariable;
+    Field& fField;
 };
 
 std::vector<std::string> ReadTexts(const ArrowArray& dictionary, const ColumnType& type)
@@ -220,51 +218,50 @@ std::vector<double> ReadNumbers(const ArrowArray& dictionary, ColumnType type)
     return numbers;
 }
 
-/// Tells the variable the order of the categories that an ordered dictionary declares. Once all categories are known
+/// Tells the field the order of the categories that an ordered dictionary declares. Once all categories are known
 /// they have their codes, and the order says no more.
-void DeclareOrder(Variable& variable, const ColumnType& type, const ArrowArray& column)
+void DeclareOrder(Field& field, const ColumnType& type, const ArrowArray& column)
 {
-    if (!type.isDictionary || !type.isOrdered || variable.use != Variable::Use::kCategory || variable.isComplete)
+    if (!type.isDictionary || !type.isOrdered || field.use != Field::Use::kCategory || field.isComplete)
         return;
-    const bool isMerged = type.IsText()
-                              ? variable.texts.GetDeclaredOrder().Merge(ReadTexts(*column.dictionary, type))
-                              : variable.numbers.GetDeclaredOrder().Merge(ReadNumbers(*column.dictionary, type));
+    const bool isMerged = type.IsText() ? field.texts.GetDeclaredOrder().Merge(ReadTexts(*column.dictionary, type))
+                                        : field.numbers.GetDeclaredOrder().Merge(ReadNumbers(*column.dictionary, type));
     if (!isMerged)
-        throw DataFault("two batches declare the categories in different orders", variable.name);
+        throw DataFault("two batches declare the categories in different orders", field.name);
 }
 
-/// The type of the variable's column, if it is one for the variable's use.
-ColumnType CheckType(const ArrowSchema& schema, const Variable& variable)
+/// The type of the field's column, if it is one for the field's use.
+ColumnType CheckType(const ArrowSchema& schema, const Field& field)
 {
-    if (variable.column >= schema.n_children)
-        throw DataFault("there is no such column", variable.name);
-    ColumnType type = ReadColumnType(*schema.children[variable.column]);
+    if (field.column >= schema.n_children)
+        throw DataFault("there is no such column", field.name);
+    ColumnType type = ReadColumnType(*schema.children[field.column]);
     if (type.storage == ColumnType::Storage::kNone)
-        throw DataFault("a column of this type can't be used: " + type.kind, variable.name);
-    if (type.IsText() && variable.use != Variable::Use::kCategory)
-        throw DataFault("the column holds texts, not numbers", variable.name);
+        throw DataFault("a column of this type can't be used: " + type.kind, field.name);
+    if (type.IsText() && field.use != Field::Use::kCategory)
+        throw DataFault("the column holds texts, not numbers", field.name);
     return type;
 }
 
 } // namespace
 
-TableBlocks::TableBlocks(Batches* batches, std::vector<Variable>& variables)
-    : fBatches(batches), fVariables(variables), fTypes(variables.size())
+TableBlocks::TableBlocks(Batches* batches, std::vector<Field>& fields)
+    : fBatches(batches), fFields(fields), fTypes(fields.size())
 {
-    for (std::size_t i = 0; i < variables.size(); ++i)
+    for (std::size_t i = 0; i < fields.size(); ++i)
     {
-        if (variables[i].column >= 0)
+        if (fields[i].column >= 0)
         {
             if (batches == nullptr)
-                throw DataFault("there is no table with the column", variables[i].name);
-            fTypes[i] = CheckType(batches->GetSchema(), variables[i]);
+                throw DataFault("there is no table with the column", fields[i].name);
+            fTypes[i] = CheckType(batches->GetSchema(), fields[i]);
             continue;
         }
-        const auto length = static_cast<std::int64_t>(variables[i].array.length);
+        const auto length = static_cast<std::int64_t>(fields[i].array.length);
         if (fNumArrayRows >= 0 && length != fNumArrayRows)
             throw DataFault("there are " + std::to_string(length) + " values for " + std::to_string(fNumArrayRows) +
                                 " rows",
-                            variables[i].name);
+                            fields[i].name);
         fNumArrayRows = length;
     }
 }
@@ -314,40 +311,40 @@ bool TableBlocks::NextBatch()
 void TableBlocks::OpenBatch(const ArrowArray* batch)
 {
     fReaders.clear();
-    for (std::size_t i = 0; i < fVariables.size(); ++i) fReaders.push_back(MakeFieldReader(i, batch));
+    for (std::size_t i = 0; i < fFields.size(); ++i) fReaders.push_back(MakeFieldReader(i, batch));
 }
 
 std::unique_ptr<FieldReader> TableBlocks::MakeFieldReader(std::size_t index, const ArrowArray* batch)
 {
-    Variable& variable = fVariables[index];
+    Field& field = fFields[index];
     const ColumnType& type = fTypes[index];
     std::unique_ptr<ColumnReader> reader;
-    if (batch == nullptr || variable.column < 0) // without batches all variables have arrays
+    if (batch == nullptr || field.column < 0) // without batches all fields have arrays
     {
-        StridedArray rest = variable.array;
+        StridedArray rest = field.array;
         rest.data = static_cast<const char*>(rest.data) + static_cast<std::ptrdiff_t>(fFirstRow) * rest.stride;
         reader = MakeReader(rest);
     }
     else
     {
-        const ArrowArray& column = *batch->children[variable.column];
-        DeclareOrder(variable, type, column);
+        const ArrowArray& column = *batch->children[field.column];
+        DeclareOrder(field, type, column);
         if (type.IsText() && type.isDictionary)
             return std::make_unique<DictionaryCategoryField>(
                 MakePlaceReader(column, type, batch->offset), TextReader(*column.dictionary, type.storage, 0),
-                static_cast<std::size_t>(column.dictionary->length), variable);
+                static_cast<std::size_t>(column.dictionary->length), field);
         if (type.IsText())
-            return std::make_unique<TextCategoryField>(TextReader(column, type.storage, batch->offset), variable);
+            return std::make_unique<TextCategoryField>(TextReader(column, type.storage, batch->offset), field);
         reader = MakeReader(column, type, batch->offset);
     }
-    switch (variable.use)
+    switch (field.use)
     {
-    case Variable::Use::kCategory:
-        return std::make_unique<NumberCategoryField>(std::move(reader), variable);
-    case Variable::Use::kWeight:
-        return std::make_unique<WeightField>(std::move(reader), variable);
-    case Variable::Use::kAttribute:
-    case Variable::Use::kCode:
+    case Field::Use::kCategory:
+        return std::make_unique<NumberCategoryField>(std::move(reader), field);
+    case Field::Use::kWeight:
+        return std::make_unique<WeightField>(std::move(reader), field);
+    case Field::Use::kAttribute:
+    case Field::Use::kCode:
         break;
     }
     return std::make_unique<ValueField>(std::move(reader));

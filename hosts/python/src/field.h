@@ -1,7 +1,7 @@
-#ifndef MCBINNING_VARIABLE_H
-#define MCBINNING_VARIABLE_H
+#ifndef MCBINNING_FIELD_H
+#define MCBINNING_FIELD_H
 
-#include "bins/weightgrid.h"
+#include "bins/bins.h"
 #include "hosts/python/src/categorytable.h"
 #include "hosts/python/src/columnreader.h"
 
@@ -14,13 +14,13 @@
 #include <vector>
 
 /// One field of the records: what it is for the analysis, where its values are, and which of them are missing.
-struct Variable
+struct Field
 {
     enum class Use
     {
         kAttribute, ///< a number
         kCategory,  ///< a number or a text, which gets a code here
-        kCode,      ///< a code already: 0, 1, 2, ... below `numCodes`
+        kCode,      ///< a code already: that of one of the categories, which are all known
         kWeight
     };
 
@@ -34,14 +34,16 @@ struct Variable
 
     std::string name;
     Use use = Use::kAttribute;
+    /// What its numbers stand for, and of timestamps the zone that they are shown in.
+    ValueKind valueKind = ValueKind::kNumber;
+    std::string timeZone;
 
     /// The place of its column in the stream; -1 where it has an array.
     int column = -1;
     /// One value for each record of the whole data; borrowed.
     StridedArray array{};
 
-    int numCodes = 0;
-    NumberCategories numbers;
+    NumberCategories numbers; ///< by code where all categories are known
     TextCategories texts;
     /// All categories are known, and `unseen` tells what another one is.
     bool isComplete = false;
@@ -51,14 +53,13 @@ struct Variable
     WeightRounding rounding = WeightRounding::kNone;
 
     BINNumericUserMissing missingNumbers;
+    /// That of `missingNumbers` as it was declared: the library has the largest double for an infinite end.
+    std::optional<std::pair<double, double>> missingInterval;
     BINStringUserMissing missingTexts;
 
     bool HasMissingNumbers() const { return missingNumbers.GetNDiscreteValues() > 0 || missingNumbers.HasInterval(); }
 
-    std::size_t GetNumCategories() const
-    {
-        return use == Use::kCode ? static_cast<std::size_t>(numCodes) : numbers.GetSize() + texts.GetSize();
-    }
+    std::size_t GetNumCategories() const { return numbers.GetSize() + texts.GetSize(); }
 
     std::vector<std::size_t> GetRanks() const { return texts.GetSize() > 0 ? texts.GetRanks() : numbers.GetRanks(); }
 };

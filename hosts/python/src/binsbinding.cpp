@@ -1,0 +1,270 @@
+#include "hosts/python/src/binsbinding.h"
+
+#include "bins/bins.h"
+#include "bins/csv.h"
+#include "bins/json.h"
+#include "bins/jsonbuilder.h"
+#include "bins/jsonnames.h"
+#include "bins/labels.h"
+#include "bins/lookup.h"
+#include "bins/measures.h"
+#include "bins/numbers.h"
+#include "bins/sql.h"
+#include "bins/words.h"
+#include "hosts/python/src/arrays.h"
+
+#include <nanobind/ndarray.h>
+#include <nanobind/stl/optional.h>
+#include <nanobind/stl/pair.h>
+#include <nanobind/stl/string.h>
+#include <nanobind/stl/vector.h>
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace nb = nanobind;
+using namespace nb::literals;
+
+namespace
+{
+
+/// NaN stands for a figure that was not found.
+double ToNumber(const std::optional<double>& figure)
+{
+    return figure.value_or(std::numeric_limits<double>::quiet_NaN());
+}
+
+nb::tuple ToTuple(const MCBinning::MCStatus& status)
+{
+    return nb::make_tuple(
+        status.GetErrorCode(), GetSeverity(status),
+        nb::make_tuple(status.GetDiscreteDatum(0), status.GetDiscreteDatum(1), status.GetDiscreteDatum(2)),
+        nb::make_tuple(status.GetScaleDatum(0), status.GetScaleDatum(1), status.GetScaleDatum(2)));
+}
+
+std::vector<double> GetCategoryNumbers(const Variable& variable)
+{
+    std::vector<double> numbers;
+    for (const std::string& category : variable.categories) numbers.push_back(ParseNumberOrNaN(category));
+    return numbers;
+}
+
+/// A list of texts or numbers, or None.
+nb::object GetCategories(const Variable& variable)
+{
+    if (!variable.IsCategorical())
+        return nb::none();
+    return variable.kind == VariableKind::kStringCategorical ? nb::cast(variable.categories)
+                                                             : nb::cast(GetCategoryNumbers(variable));
+}
+
+/// What the values are: numbers that are categories are of type "integer" if all are whole.
+const char* GetKind(const Variable& variable)
+{
+    if (variable.kind == VariableKind::kStringCategorical)
+        return "text";
+    if (const char* const kind = GetName(kValueKindNames, variable.valueKind))
+        return kind;
+    const std::vector<double> numbers = GetCategoryNumbers(variable);
+    const auto isWhole = [](double number) { return number == std::floor(number) && std::isfinite(number); };
+    return !numbers.empty() && std::all_of(numbers.begin(), numbers.end(), isWhole) ? "integer" : "float";
+}
+
+/// Of each bin the figure that `get` gives.
+template<class Element, class Get>
+nb::object Collect(const std::vector<Element>& elements, Get get)
+{
+    std::vector<double> numbers;
+    for (const Element& element : elements) numbers.push_back(get(element));
+    return ToArray(std::move(numbers));
+}
+
+/// Of each bin a row with a weight for each category, or None without a target.
+nb::object GetTargetWeights(const AttributeBins& bins)
+{
+    if (!bins.target)
+        return nb::none();
+    std::vector<double> flat;
+    for (const Bin& bin : bins.bins) flat.insert(flat.end(), bin.weights.begin(), bin.weights.end());
+    return ToArray(std::move(flat), std::max<std::size_t>(bins.target->categories.size(), 1));
+}
+
+/// None unless the target has two categories.
+nb::object GetEvidence(const AttributeBins& bins, double Evidence::*figure)
+{
+    const std::vector<Evidence> evidence = ComputeEvidence(bins);
+    if (evidence.empty())
+        return nb::none();
+    return Collect(evidence, [figure](const Evidence& ofBin) { return ofBin.*figure; });
+}
+
+/// The bins as the only result of a run, of which nothing else is known.
+Bins MakeAlone(const AttributeBins& bins)
+{
+    Bins alone;
+    alone.settings.isRightClosed = bins.isRightClosed;
+    alone.variables.push_back(bins.attribute);
+    if (bins.target)
+        alone.variables.push_back(bins.target);
+    else
+        alone.settings.method = Method::kEqualFrequency;
+    alone.results.push_back(bins);
+    return alone;
+}
+
+/// Objects come as tuples of pairs, as a text may name a member twice.
+void Build(JsonBuilder& builder, nb::handle value)
+{
+    std::int64_t whole = 0;
+    if (value.is_none())
+        builder.AddNull();
+    else if (nb::isinstance<nb::bool_>(value))
+        builder.AddBoolean(nb::cast<bool>(value));
+    else if (nb::isinstance<nb::int_>(value) && nb::try_cast(value, whole))
+        builder.AddInteger(whole);
+    else if (nb::isinstance<nb::int_>(value) || nb::isinstance<nb::float_>(value))
+        builder.AddNumber(nb::cast<double>(nb::float_(value)));
+    else if (nb::isinstance<nb::str>(value))
+        builder.AddString(nb::cast<std::string>(value));
+    else if (nb::isinstance<nb::list>(value))
+    {
+        builder.BeginArray();
+        for (nb::handle element : value) Build(builder, element);
+        builder.End();
+    }
+    else
+    {
+        builder.BeginObject();
+        for (nb::handle member : nb::cast<nb::tuple>(value))
+        {
+            builder.AddKey(nb::cast<std::string>(member[0]));
+            Build(builder, member[1]);
+        }
+        builder.End();
+    }
+}
+
+/// \throw nb::value_error which tells what is wrong with the document of this name.
+Bins ReadDocument(nb::handle document, const std::string& name)
+{
+    try
+    {
+        JsonBuilder builder;
+        Build(builder, document);
+        return ReadBins(builder.GetValue());
+    }
+    catch (const JsonFault& fault)
+    {
+        throw nb::value_error((name + ": " + fault.what()).c_str());
+    }
+}
+
+std::string WriteSql(const Bins& bins, bool isDuckDb, bool areLabels)
+{
+    return ToSql(bins, {isDuckDb ? SqlDialect::kDuckDb : SqlDialect::kStandard, areLabels});
+}
+
+/// Of each column of bins the index of its result, and its name.
+std::vector<std::pair<std::size_t, std::string>> GetBinColumns(const Bins& bins, const std::vector<std::string>& taken)
+{
+    std::vector<std::pair<std::size_t, std::string>> columns;
+    for (const BinColumn& column : MakeBinColumns(bins, taken))
+        columns.emplace_back(static_cast<std::size_t>(column.bins - bins.results.data()), column.name);
+    return columns;
+}
+
+std::vector<Variable> GetVariables(const Bins& bins)
+{
+    std::vector<Variable> variables;
+    for (const auto& variable : bins.variables) variables.push_back(*variable);
+    return variables;
+}
+
+void BindVariable(nb::module_& module)
+{
+    nb::class_<Variable>(module, "Variable")
+        .def_ro("name", &Variable::name)
+        .def_ro("label", &Variable::label)
+        .def_prop_ro("role", [](const Variable& self) { return GetName(kRoleNames, self.role); })
+        .def_prop_ro("kind", &GetKind)
+        .def_ro("time_zone", &Variable::timeZone)
+        .def_prop_ro("categories", &GetCategories)
+        .def_prop_ro("rounding",
+                     [](const Variable& self) {
+                         return self.role == VariableRole::kWeight ? std::optional<std::string>(GetName(self.rounding))
+                                                                   : std::nullopt;
+                     })
+        .def_ro("grid", &Variable::weightGrid)
+        .def_ro("missing_texts", &Variable::missingTexts)
+        .def_ro("missing_numbers", &Variable::missingNumbers)
+        .def_ro("missing_interval", &Variable::missingInterval);
+}
+
+void BindAttributeBins(nb::module_& module)
+{
+    using Self = const AttributeBins&;
+    nb::class_<AttributeBins>(module, "AttributeBins")
+        .def_prop_ro("variable", [](Self self) { return *self.attribute; })
+        .def_prop_ro("target",
+                     [](Self self) { return self.target ? std::optional<Variable>(*self.target) : std::nullopt; })
+        .def_prop_ro("status", [](Self self) { return ToTuple(self.status); })
+        .def_ro("right_closed", &AttributeBins::isRightClosed)
+        .def_prop_ro("cut_points", [](Self self) { return ToArray(self.cutPoints); })
+        .def_prop_ro("borders", [](Self self) { return ToArray(MakeBorders(self)); })
+        .def_prop_ro("border_texts", &FormatBorders)
+        .def_prop_ro("labels", &MakeLabels)
+        .def_prop_ro("weights", [](Self self) { return Collect(self.bins, [](const Bin& bin) { return bin.weight; }); })
+        .def_prop_ro("target_weights", &GetTargetWeights)
+        .def_ro("n_distinct", &AttributeBins::numDistinct)
+        .def_ro("weight", &AttributeBins::weight)
+        .def_ro("weight_with_missing", &AttributeBins::weightWithMissing)
+        .def_prop_ro("minimum", [](Self self) { return ToNumber(self.minimum); })
+        .def_prop_ro("maximum", [](Self self) { return ToNumber(self.maximum); })
+        .def_prop_ro("target_entropy", [](Self self) { return ToNumber(ComputeTargetEntropy(self)); })
+        .def_prop_ro("model_entropy", [](Self self) { return ToNumber(self.modelEntropy); })
+        .def_prop_ro("gain", [](Self self) { return ToNumber(ComputeGain(self)); })
+        .def_prop_ro("rates", [](Self self) { return GetEvidence(self, &Evidence::rate); })
+        .def_prop_ro("woe", [](Self self) { return GetEvidence(self, &Evidence::weightOfEvidence); })
+        .def_prop_ro("iv", [](Self self) { return GetEvidence(self, &Evidence::informationValue); })
+        .def_prop_ro("information_value", [](Self self) { return ToNumber(ComputeInformationValue(self)); })
+        .def("find_bin", [](Self self, double value) { return FindBin(self.cutPoints, self.isRightClosed, value); })
+        .def("alone", &MakeAlone);
+}
+
+} // namespace
+
+void BindBins(nb::module_& module)
+{
+    BindVariable(module);
+    BindAttributeBins(module);
+    using Self = const Bins&;
+    nb::class_<Bins>(module, "Bins")
+        .def_static("read", &ReadDocument, "document"_a.none(), "name"_a)
+        .def_ro("component_version", &Bins::componentVersion)
+        .def_prop_ro("method", [](Self self) { return GetName(kMethodNames, self.settings.method); })
+        .def_prop_ro("closed", [](Self self) { return GetName(kClosedNames, self.settings.isRightClosed); })
+        .def_prop_ro("n_bins", [](Self self) { return self.settings.numBins; })
+        .def_prop_ro("max_distinct", [](Self self) { return self.settings.maxDistinct; })
+        .def_prop_ro("small_bin_ratio", [](Self self) { return self.settings.smallBinRatio; })
+        .def_ro("data_name", &Bins::dataName)
+        .def_ro("records", &Bins::numRecords)
+        .def_ro("records_without_weight", &Bins::numRecordsWithoutWeight)
+        .def_ro("missing_text", &Bins::missingTexts)
+        .def_prop_ro("variables", &GetVariables)
+        .def_prop_ro("status", [](Self self) { return ToTuple(self.status); })
+        .def_ro("results", &Bins::results, nb::rv_policy::copy)
+        .def("set_border_texts", [](Bins& self, std::size_t index, std::vector<std::string> texts)
+             { self.results.at(index).borderTexts = std::move(texts); })
+        .def("columns", &GetBinColumns, "taken"_a)
+        .def("to_json", &ToJson)
+        .def("to_csv", &ToCsv)
+        .def("to_sql", &WriteSql, "duckdb"_a, "labels"_a);
+    module.def("describe_not_json", [](long line) { return std::string(MakeNotJson(line).what()); });
+    module.def("status_words",
+               [](int code, bool isWarning) { return GetStatusWords(MCBinning::MCStatus(code, isWarning)); });
+}

@@ -1,0 +1,84 @@
+#ifndef MCBINNING_FEED_H
+#define MCBINNING_FEED_H
+
+#include "bins/bins.h"
+#include "bins/weightgrid.h"
+#include "hosts/python/src/arrays.h"
+#include "hosts/python/src/batches.h"
+#include "hosts/python/src/field.h"
+#include "hosts/python/src/runs.h"
+#include "hosts/python/src/spool.h"
+#include "hosts/python/src/tableblocks.h"
+
+#include <nanobind/nanobind.h>
+
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
+
+/// A stream of batches, for Python to hold.
+struct Table
+{
+    std::unique_ptr<Batches> batches;
+};
+
+/// The records of one analysis: a table, arrays, or both side by side. A table can be read once, by one of the
+/// operations that read records.
+class Feed
+{
+public:
+    /// \param table a Table, or None.
+    explicit Feed(nanobind::object table) : fTable(std::move(table)) {}
+
+    /// Its values are in a column of the table or in the array, which has one for each record.
+    void AddField(const std::string& name, const std::string& use, int column, const std::optional<Array>& array,
+                  const std::string& rounding);
+
+    void DeclareMissing(std::size_t index, const std::vector<double>& values,
+                        std::optional<std::pair<double, double>> interval, const std::vector<std::string>& texts);
+
+    /// Tells all categories that there will be, by code, and what another one is: "changed", "error" or "missing".
+    void SetCategories(std::size_t index, const nanobind::list& categories, const std::string& unseen);
+
+    /// Tells what the numbers of a field without a column stand for.
+    void SetValueKind(std::size_t index, const std::string& kind);
+
+    /// The categories: by code where all have been told, else those known by now, in the order that their column
+    /// declares or else in ascending order.
+    nanobind::list GetCategories(std::size_t index) const;
+
+    /// How many weights are above 0, and the largest. Known once the records have been read for it, and where they
+    /// were read by another feed, from there.
+    std::pair<std::int64_t, double> GetWeights() const;
+    void SetWeights(const std::pair<std::int64_t, double>& weights);
+
+    /// Reads the records for their categories and weights alone.
+    void Learn();
+
+    /// Reads the records for their categories and weights, and keeps them in a nameless file for the run.
+    void SpoolRecords(const std::string& directory);
+
+    /// The next records, `maxRows` or a few more: for each field an array with its numbers or codes, NaN for what is
+    /// missing. The arrays are empty at the end.
+    nanobind::list Read(std::size_t maxRows);
+
+    /// \param progress is called with a phase and an index, or None.
+    Bins Bin(const Settings& settings, const RunRequest& request, const std::optional<std::string>& dataName,
+             const nanobind::object& progress);
+
+private:
+    Batches* GetBatches() const;
+    void TallyArray();
+
+    nanobind::object fTable;
+    std::vector<Field> fFields;
+    std::vector<std::optional<Array>> fArrays; ///< keep alive what the fields borrow
+    std::optional<WeightTally> fWeights;
+    std::unique_ptr<Spool> fSpool;
+    std::optional<TableBlocks> fReading; ///< where Read has got to
+};
+
+#endif
