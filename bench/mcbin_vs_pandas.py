@@ -45,7 +45,9 @@ def time_mcbin(program, path):
 
 def time_pandas(path):
     environment = dict(os.environ, OMP_NUM_THREADS="1", OPENBLAS_NUM_THREADS="1")
-    return float(subprocess.run([sys.executable, "-c", READ, path], check=True, env=environment, capture_output=True).stdout)
+    return float(
+        subprocess.run([sys.executable, "-c", READ, path], check=True, env=environment, capture_output=True).stdout
+    )
 
 
 def main():

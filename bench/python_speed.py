@@ -2,10 +2,10 @@
 
     python bench/python_speed.py [--rawrun build/bench/rawrun] [--rows 1000000] [--turns 5]
 
-The first table: what `fit` takes from an array and from an Arrow table, over what the library takes for the same data in a
-C++ host. The second: equal-frequency bins and their use, beside KBinsDiscretizer(strategy="quantile"). The seconds are those
-of the processor. Each measurement is a process of its own on one thread, and the turns alternate, so that a busy machine hits
-all alike.
+The first table: what `fit` takes from an array and from an Arrow table, over what the library takes for the same data
+in a C++ host. The second: equal-frequency bins and their use, beside KBinsDiscretizer(strategy="quantile"). The seconds
+are those of the processor. Each measurement is a process of its own on one thread, and the turns alternate, so that a
+busy machine hits all alike.
 """
 
 from __future__ import annotations
@@ -46,11 +46,10 @@ def measure(what: str, path: Path, rows: int) -> None:
     """Prints the seconds of fit and of transform, and the peak of memory above where it stood."""
     import warnings
 
+    import mcbinning as mb
     import numpy as np
     import pyarrow as pa
     from sklearn.preprocessing import KBinsDiscretizer
-
-    import mcbinning as mb
 
     warnings.simplefilter("ignore")
     columns = np.fromfile(path).reshape(COLUMNS + 1, rows)
@@ -100,7 +99,8 @@ def compare_with_native(rawrun: str, path: Path, rows: int, turns: int) -> None:
         ratios = [statistics.median(a / b for a, b in zip(times, native)) for times in (array, arrow)]
         medians = [statistics.median(times) for times in (native, array, arrow)]
         print(
-            f"| {method} | {medians[0]:.2f} | {medians[1]:.2f} | {ratios[0]:.2f} | {medians[2]:.2f} | {ratios[1]:.2f} |",
+            f"| {method} | {medians[0]:.2f} | {medians[1]:.2f} | {ratios[0]:.2f} | {medians[2]:.2f} "
+            f"| {ratios[1]:.2f} |",
             flush=True,
         )
 

@@ -5,8 +5,8 @@
     cmake --build build/release --target rawrun
     bench/quantiles.py build/release/bench/rawrun [RECORDS [TURNS]]
 
-The column is an attribute of workload W1 in README.md. Seconds are those of the processor, medians of all turns, which take
-one way after the other; memory is the peak above the column. Needs NumPy and scikit-learn.
+The column is an attribute of workload W1 in README.md. Seconds are those of the processor, medians of all turns, which
+take one way after the other; memory is the peak above the column. Needs NumPy and scikit-learn.
 """
 
 import os

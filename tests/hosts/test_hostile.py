@@ -10,10 +10,9 @@ import sqlite3
 import subprocess
 import unicodedata
 
+import mcbinning as mb
 import pandas as pd
 import pytest
-
-import mcbinning as mb
 
 NAMES = [
     'quoted "name"',
@@ -78,7 +77,9 @@ def test_a_browser_gets_text(run, table, tmp_path):
 
 def test_json_and_csv_give_the_names_back(run):
     found = json.loads(run("supervised", "t.csv", "--target", "kind", "--format", "json"))
-    rows = list(csv.DictReader(io.StringIO(run("supervised", "t.csv", "--target", "kind", "--format", "csv"), newline="")))
+    rows = list(
+        csv.DictReader(io.StringIO(run("supervised", "t.csv", "--target", "kind", "--format", "csv"), newline=""))
+    )
 
     assert {variable["name"] for variable in found["variables"]} == {*NAMES, "kind"}
     assert {row["attribute"] for row in rows} == set(NAMES)

@@ -1,4 +1,4 @@
-"""Under a locale that writes 1.234,5 all is read and written as ever: the numbers of data and of JSON are no country's."""
+"""Under a locale that writes 1.234,5 all is read and written as ever: numbers of data and of JSON are no country's."""
 
 from __future__ import annotations
 
@@ -110,9 +110,7 @@ def german_streams(tmp_path_factory) -> str:
     source = directory / "streams.cpp"
     source.write_text(textwrap.dedent(STREAMS))
     library = directory / "libstreams.so"
-    subprocess.run(
-        [compiler, "-std=c++17", "-shared", "-fPIC", f"-I{ROOT}", source, "-o", library], check=True
-    )
+    subprocess.run([compiler, "-std=c++17", "-shared", "-fPIC", f"-I{ROOT}", source, "-o", library], check=True)
     return str(library)
 
 

@@ -50,7 +50,9 @@ def test_the_declared_order_is_that_of_the_codes_in_bins_tables_and_json(name):
     for found in (result["size"], mb.BinningResult.from_json(result.to_json())["size"]):
         assert found.variable.categories == ("small", "medium", "large", "huge")
         assert found.labels == ["{small, medium}", "{large}", "{huge}"]
-        assert [column for column in found.to_pandas() if column.startswith("weight[")] == [f"weight[{g}]" for g in GRADES]
+        assert [column for column in found.to_pandas() if column.startswith("weight[")] == [
+            f"weight[{g}]" for g in GRADES
+        ]
         assert found.target_weights.tolist() == [[30, 0, 0], [0, 15, 0], [0, 0, 15]]
     frame = pd.DataFrame({"size": SIZE})
     expected = [0] * 30 + [1] * 15 + [2] * 15
@@ -80,7 +82,9 @@ def test_numbers_are_categories_where_their_order_is_another(categories, labels)
         assert pa.table(result.transform(data))["x_bin"].to_pylist() == [0 if flag else 1 for flag in y]
 
 
-@pytest.mark.parametrize("form", [lambda y: pd.Categorical(y, GRADES, ordered=True), lambda y: pl.Series(y, dtype=pl.Enum(GRADES))])
+@pytest.mark.parametrize(
+    "form", [lambda y: pd.Categorical(y, GRADES, ordered=True), lambda y: pl.Series(y, dtype=pl.Enum(GRADES))]
+)
 def test_classes_of_a_binner_have_the_declared_order(form):
     binner = mb.SupervisedBinner().fit(np.arange(60.0)[:, None], form(GRADE))
 

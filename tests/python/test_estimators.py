@@ -21,7 +21,9 @@ TWO_CLASSES = np.array(["low"] * 3 + ["up"] * 3).repeat(1)[np.arange(24) % 6]
 
 
 @pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
-@parametrize_with_checks([mb.SupervisedBinner(), mb.SupervisedBinner(max_distinct=5, n_bins=4), mb.EqualFrequencyBinner()])
+@parametrize_with_checks(
+    [mb.SupervisedBinner(), mb.SupervisedBinner(max_distinct=5, n_bins=4), mb.EqualFrequencyBinner()]
+)
 def test_keeps_the_rules_of_scikit_learn(estimator, check):
     check(estimator)
 
@@ -85,12 +87,17 @@ def test_fractional_weights_are_used_as_they_are():
     weights = np.linspace(0.1, 0.9, len(WITH_GAP))
     table = mb.SupervisedBinner().fit(WITH_GAP, TWO_CLASSES, sample_weight=weights).bin_tables_[0]
 
-    assert table["weight"].tolist() == pytest.approx([weights[TWO_CLASSES == "low"].sum(), weights[TWO_CLASSES == "up"].sum()])
+    assert table["weight"].tolist() == pytest.approx(
+        [weights[TWO_CLASSES == "low"].sum(), weights[TWO_CLASSES == "up"].sum()]
+    )
 
 
 def test_works_inside_a_pipeline_and_survives_pickling(mixed):
     columns = ColumnTransformer(
-        [("cut", mb.SupervisedBinner(encode="onehot"), ["x", "whole"]), ("split", mb.EqualFrequencyBinner(n_bins=4), ["single"])]
+        [
+            ("cut", mb.SupervisedBinner(encode="onehot"), ["x", "whole"]),
+            ("split", mb.EqualFrequencyBinner(n_bins=4), ["single"]),
+        ]
     )
     model = make_pipeline(columns, LogisticRegression()).fit(mixed, mixed["y"])
 
@@ -117,12 +124,24 @@ def test_polars_output_has_the_names_of_the_columns(mixed):
         (dict(X=WITH_GAP, y=[*[1.0, 2.0] * 11, 1.0, np.nan]), "column 'y', row 23: the target is missing"),
         (dict(X=pd.DataFrame(index=range(24)), y=TWO_CLASSES), "there are no columns"),
         (dict(X=pd.DataFrame({"x": []}), y=[]), "the data have no rows"),
-        (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [-1.0]), "'sample_weight', row 23: the weight is neg"),
-        (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [np.nan]), "'sample_weight', row 23: the weight is NaN"),
-        (dict(X=pa.table({"x": WITH_GAP[:, 0]}).to_reader(), y=TWO_CLASSES[:-1]), "has at least 24 rows, but there are 23"),
+        (
+            dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [-1.0]),
+            "'sample_weight', row 23: the weight is neg",
+        ),
+        (
+            dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [np.nan]),
+            "'sample_weight', row 23: the weight is NaN",
+        ),
+        (
+            dict(X=pa.table({"x": WITH_GAP[:, 0]}).to_reader(), y=TWO_CLASSES[:-1]),
+            "has at least 24 rows, but there are 23",
+        ),
         (dict(X=pd.DataFrame({"t": ["a", "b"] * 12}), y=TWO_CLASSES), "column 't': the column holds texts"),
         (dict(X=np.arange(24).astype("m8[s]")[:, None], y=TWO_CLASSES), "column 'x0': .*duration"),
-        (dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [pd.NA]), "'sample_weight', row 23: the weight is NaN"),
+        (
+            dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [pd.NA]),
+            "'sample_weight', row 23: the weight is NaN",
+        ),
     ],
 )
 def test_bad_data_are_refused_with_column_and_row(arguments, message):
@@ -133,7 +152,9 @@ def test_bad_data_are_refused_with_column_and_row(arguments, message):
 @pytest.mark.parametrize("unit", ["Y", "M", "W", "D", "h", "m", "s", "ms", "us", "ns"])
 def test_a_matrix_of_dates_is_cut_at_dates_and_nat_is_missing(unit):
     stamps = np.array(["2010", "2011", "2012", "2020", "2021", "2022", "NaT"] * 4, f"M8[{unit}]")
-    binner = mb.SupervisedBinner(encode="interval").fit(stamps[:, None], ["low"] * 3 + ["up"] * 4 + (["low"] * 3 + ["up"] * 4) * 3)
+    binner = mb.SupervisedBinner(encode="interval").fit(
+        stamps[:, None], ["low"] * 3 + ["up"] * 4 + (["low"] * 3 + ["up"] * 4) * 3
+    )
 
     assert binner.result_["x0"].labels[0].startswith("(-inf, 201") and len(binner.cut_points_[0]) == 1
     assert [label == "missing" for label in binner.transform(stamps[:7, None])[:, 0]] == [False] * 6 + [True]
@@ -172,7 +193,16 @@ def test_json_of_a_fitted_binner_has_its_classes_as_they_are(y, kind):
 
 
 @pytest.mark.parametrize(
-    "parameters", [{"closed": "both"}, {"encode": "x"}, {"missing": "x"}, {"n_bins": 1}, {"n_bins": 2.5}, {"max_distinct": 0}, {"small_bin_ratio": 2}]
+    "parameters",
+    [
+        {"closed": "both"},
+        {"encode": "x"},
+        {"missing": "x"},
+        {"n_bins": 1},
+        {"n_bins": 2.5},
+        {"max_distinct": 0},
+        {"small_bin_ratio": 2},
+    ],
 )
 def test_bad_parameters_are_refused_by_name(parameters):
     with pytest.raises(ValueError, match=next(iter(parameters))):

@@ -53,15 +53,33 @@ def test_the_tool_puts_every_row_where_the_package_does(mcbin, people, closed):
 
     expected = result.transform(people).read_all().to_pandas()
     for name in names:
-        assert result[name].n_bins > 1 and result[name].missing_weight == (0.0 if name == "grade" else expected[f"{name}_bin"].isna().sum())
+        assert result[name].n_bins > 1 and result[name].missing_weight == (
+            0.0 if name == "grade" else expected[f"{name}_bin"].isna().sum()
+        )
         name = f"{name}_bin"
         assert applied[name].equals(expected[name].astype(applied[name].dtype)), name
 
 
 def test_the_package_puts_every_row_where_the_tool_does(mcbin, people):
     text = subprocess.run(
-        [mcbin, "supervised", people, "--target", "y", "--attributes", "age,paid,kind,grade", "--format", "json", "--quiet"]
-        + ["--categorical", "kind,grade", "--missing", "age=3,95:99", "--missing-text", "?,k'1"],
+        [
+            mcbin,
+            "supervised",
+            people,
+            "--target",
+            "y",
+            "--attributes",
+            "age,paid,kind,grade",
+            "--format",
+            "json",
+            "--quiet",
+            "--categorical",
+            "kind,grade",
+            "--missing",
+            "age=3,95:99",
+            "--missing-text",
+            "?,k'1",
+        ],
         capture_output=True,
         check=True,
     ).stdout.decode()
@@ -120,13 +138,19 @@ ODD_TABLES = {
         },
         {"target": "y"},
     ),
-    "pairs": ({"x": ROWS, "v": -ROWS, "y": Y, "z": np.where(ROWS < 9, "q", "p")}, {"pairs": [("x", "y"), ("x", "z"), ("v", "z")]}),
+    "pairs": (
+        {"x": ROWS, "v": -ROWS, "y": Y, "z": np.where(ROWS < 9, "q", "p")},
+        {"pairs": [("x", "y"), ("x", "z"), ("v", "z")]},
+    ),
     "texts that look like numbers": (
         {"x": np.array(NUMBERS_AS_TEXTS)[ROWS // 10], "y": np.array(["1e1", "1e0"])[ROWS // 40]},
         {"target": "y", "attributes": ["x"]},
     ),
     "exponents": ({"x": 10.0 ** (ROWS * 7 - 280), "v": -(10.0 ** (ROWS - 320)), "y": Y}, {"target": "y"}),
-    "odd names": ({name: ROWS + i for i, name in enumerate(NAMES)} | {"y": np.where(ROWS < 40, 'a"', "\\ü\n")}, {"target": "y"}),
+    "odd names": (
+        {name: ROWS + i for i, name in enumerate(NAMES)} | {"y": np.where(ROWS < 40, 'a"', "\\ü\n")},
+        {"target": "y"},
+    ),
 }
 
 
@@ -136,7 +160,9 @@ def run_tool(mcbin: str, path: Path, options: dict, *form: str) -> str:
     for name, missing in options.get("missing", {}).items():
         ranges = [":".join(map(str, value)) if isinstance(value, tuple) else str(value) for value in missing]
         arguments.append(f"--missing={name}={','.join(ranges)}")
-    arguments += [f"--{what}={name}" for name in options.get("attributes", []) for what in ("attributes", "categorical")]
+    arguments += [
+        f"--{what}={name}" for name in options.get("attributes", []) for what in ("attributes", "categorical")
+    ]
     call = [mcbin, "supervised", path, *arguments, "--format", *form, "--quiet"]
     return subprocess.run(call, capture_output=True, check=True).stdout.decode()
 
@@ -164,7 +190,9 @@ def test_what_is_missing_in_one_column_is_a_category_of_another(mcbin, tmp_path)
     path = tmp_path / "data.csv"
     frame.to_csv(path, index=False)
     call = [mcbin, "supervised", path, "--target=y", "--attributes=x,kind", "--categorical=kind", "--missing=x=unknown"]
-    text = subprocess.run([*call, "--missing-text=-9", "--format=json"], capture_output=True, check=True).stdout.decode()
+    text = subprocess.run(
+        [*call, "--missing-text=-9", "--format=json"], capture_output=True, check=True
+    ).stdout.decode()
     result = mb.BinningResult.from_json(text)
 
     applied = apply(mcbin, text, path)[["x_bin", "kind_bin"]].astype("Int32")
@@ -173,7 +201,9 @@ def test_what_is_missing_in_one_column_is_a_category_of_another(mcbin, tmp_path)
     numbers = frame.assign(x=pd.to_numeric(frame["x"], errors="coerce"))
     database = sqlite3.connect(":memory:")
     numbers.to_sql("t", database)
-    by_tool = subprocess.run([*call, "--missing-text=-9", "--format=sql"], capture_output=True, check=True).stdout.decode()
+    by_tool = subprocess.run(
+        [*call, "--missing-text=-9", "--format=sql"], capture_output=True, check=True
+    ).stdout.decode()
     for bins in (
         result.transform(path).read_all().to_pandas(),
         result.transform(numbers),
@@ -191,7 +221,10 @@ def test_what_is_missing_in_one_column_is_a_category_of_another(mcbin, tmp_path)
 BYTES = {
     "numbers": ({"x": ROWS % 37 / 4, "v": ROWS * 0.1, "y": Y}, {"target": "y"}),
     "weights": ({"x": ROWS, "w": ROWS % 7 + 0.3, "y": Y}, {"target": "y", "weight": "w"}),
-    "a weight that is missing": ({"x": ROWS, "w": np.where(ROWS % 9, 0.1, np.nan), "y": Y}, {"target": "y", "weight": "w"}),
+    "a weight that is missing": (
+        {"x": ROWS, "w": np.where(ROWS % 9, 0.1, np.nan), "y": Y},
+        {"target": "y", "weight": "w"},
+    ),
     "missing values": ({"x": np.where(ROWS % 5, ROWS, 999), "y": Y}, {"target": "y", "missing": {"x": [999, (3, 7)]}}),
     "a target of numbers": ({"x": ROWS, "y": ROWS // 27}, {"target": "y"}),
     "three categories": ({"x": ROWS, "y": np.array(["ü", "b", "a"])[ROWS // 30]}, {"target": "y"}),

@@ -21,7 +21,9 @@ INF = math.inf
 LARGEST = float(np.finfo(np.float64).max)
 SECOND = math.nextafter(LARGEST, 0.0)
 THIRD = math.nextafter(SECOND, 0.0)
-VALUES = st.sampled_from([-INF, -LARGEST, -SECOND, -THIRD, -9e307, -1.0, 0.0, 2.0, 3.0, 9e307, THIRD, SECOND, LARGEST, INF])
+VALUES = st.sampled_from(
+    [-INF, -LARGEST, -SECOND, -THIRD, -9e307, -1.0, 0.0, 2.0, 3.0, 9e307, THIRD, SECOND, LARGEST, INF]
+)
 
 
 def results(frame: pd.DataFrame, closed: str) -> list[mb.BinningResult]:
@@ -33,9 +35,12 @@ def results(frame: pd.DataFrame, closed: str) -> list[mb.BinningResult]:
 
 
 @settings(max_examples=150, deadline=None)
-@given(rows=st.lists(st.tuples(VALUES, st.sampled_from("ab")), min_size=4, max_size=40), closed=st.sampled_from(["right", "left"]))
+@given(
+    rows=st.lists(st.tuples(VALUES, st.sampled_from("ab")), min_size=4, max_size=40),
+    closed=st.sampled_from(["right", "left"]),
+)
 def test_bins_recount_to_the_table_and_every_form_places_alike(rows, closed):
-    frame = pd.DataFrame(rows + [(-1.0, "a"), (2.0, "b")], columns=["x", "y"])
+    frame = pd.DataFrame([*rows, (-1.0, "a"), (2.0, "b")], columns=["x", "y"])
     for result in results(frame, closed):
         found = result["x"]
         placed = result.transform(frame)["x_bin"].to_numpy(dtype=int)
@@ -72,7 +77,10 @@ def test_one_infinity_costs_a_column_nothing():
 
 
 def test_an_infinity_that_is_a_cut_point_has_a_bin_for_itself(mcbin, tmp_path):
-    cases = [("right", -INF, ["[-inf, -inf]", "(-inf, +inf)"], -INF), ("left", INF, ["(-inf, +inf)", "[+inf, +inf]"], INF)]
+    cases = [
+        ("right", -INF, ["[-inf, -inf]", "(-inf, +inf)"], -INF),
+        ("left", INF, ["(-inf, +inf)", "[+inf, +inf]"], INF),
+    ]
     for closed, infinity, labels, cut in cases:
         frame = pd.DataFrame({"x": [1.0, infinity] * 10, "y": ["finite", "infinite"] * 10})
         path = tmp_path / "data.csv"

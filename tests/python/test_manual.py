@@ -46,7 +46,9 @@ def test_help_is_a_manual_whose_example_runs(thing):
 PROGRAM = """
 import mcbinning as mb
 
-bins: mb.BinningResult = mb.supervised_bins("a.parquet", target="y", closed="left", memory_limit="1GB", missing={"x": [9, (1, 2)]})
+bins: mb.BinningResult = mb.supervised_bins(
+    "a.parquet", target="y", closed="left", memory_limit="1GB", missing={"x": [9, (1, 2)]}
+)
 names: list[str] = bins["x"].labels
 gain: float = bins[0].gain
 text: str = bins.to_sql("duckdb", table="t") + mb.__version__

@@ -24,7 +24,9 @@ from mcbinning._sql import WITHOUT_NAN
 pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
 
 VALUES = st.one_of(st.none(), st.integers(-20, 20).map(lambda n: n / 4), st.floats(-1e6, 1e6))
-ROWS = st.lists(st.tuples(VALUES, st.sampled_from("abc"), st.sampled_from([0.0, 0.5, 1.0, 3.0])), min_size=1, max_size=60)
+ROWS = st.lists(
+    st.tuples(VALUES, st.sampled_from("abc"), st.sampled_from([0.0, 0.5, 1.0, 3.0])), min_size=1, max_size=60
+)
 
 
 def table_of(rows: list[tuple[float | None, str, float]]) -> pa.Table:
@@ -35,7 +37,7 @@ def table_of(rows: list[tuple[float | None, str, float]]) -> pa.Table:
 @settings(max_examples=150, deadline=None)
 @given(rows=ROWS, closed=st.sampled_from(["right", "left"]), bins=st.integers(2, 6))
 def test_bins_of_the_same_data_recount_to_the_table(rows, closed, bins):
-    table = table_of(rows + [(0.25, "a", 1.0), (0.75, "b", 1.0)])
+    table = table_of([*rows, (0.25, "a", 1.0), (0.75, "b", 1.0)])
     for result in (
         mb.supervised_bins(table, "y", ["x"], weight="w", closed=closed, max_distinct=bins, n_bins=bins),
         mb.equal_frequency_bins(table, ["x"], weight="w", closed=closed, n_bins=bins),
@@ -49,13 +51,15 @@ def test_bins_of_the_same_data_recount_to_the_table(rows, closed, bins):
         if found.target is not None:
             for code, category in enumerate(found.target.category_names()):
                 part = placed[placed["y"] == category].groupby("bin")["w"].sum()
-                assert part.reindex(range(found.n_bins), fill_value=0.0).tolist() == found.target_weights[:, code].tolist()
+                assert (
+                    part.reindex(range(found.n_bins), fill_value=0.0).tolist() == found.target_weights[:, code].tolist()
+                )
 
 
 @settings(max_examples=60, deadline=None)
 @given(rows=ROWS, closed=st.sampled_from(["right", "left"]))
 def test_json_keeps_every_bit(rows, closed):
-    result = mb.equal_frequency_bins(table_of(rows + [(0.1, "a", 0.3)]), ["x"], weight="w", closed=closed, n_bins=4)
+    result = mb.equal_frequency_bins(table_of([*rows, (0.1, "a", 0.3)]), ["x"], weight="w", closed=closed, n_bins=4)
     again = mb.BinningResult.from_json(result.to_json())
 
     assert again["x"].cut_points.tobytes() == result["x"].cut_points.tobytes()
@@ -66,7 +70,7 @@ def test_json_keeps_every_bit(rows, closed):
 @settings(max_examples=60, deadline=None)
 @given(rows=ROWS, closed=st.sampled_from(["right", "left"]))
 def test_sql_puts_every_row_where_transform_does(rows, closed):
-    table = table_of(rows + [(0.25, "a", 1.0)])
+    table = table_of([*rows, (0.25, "a", 1.0)])
     result = mb.equal_frequency_bins(table, ["x"], closed=closed, n_bins=4, missing={"x": [-1.5, (2.0, 3.0)]})
     expected = result.transform(table)["x_bin"].to_pylist()
     table_of_rows = table  # DuckDB finds it by this name
@@ -147,13 +151,13 @@ def test_sql_asks_each_dialect_for_nan_and_flags_in_its_own_words():
     result = mb.supervised_bins(table, "flag", ["x"])
     flags = mb.equal_frequency_bins(table, ["flag"], n_bins=2)
     conditions = {
-        "duckdb, normalization_strategy=case_sensitive": "ISNAN(\"x\")",
+        "duckdb, normalization_strategy=case_sensitive": 'ISNAN("x")',
         "spark2": "ISNAN(`x`)",
-        "athena": "IS_NAN(\"x\")",
-        "oracle": "\"x\" IS NAN",
+        "athena": 'IS_NAN("x")',
+        "oracle": '"x" IS NAN',
         "redshift": "\"x\" = CAST('NaN' AS DOUBLE PRECISION)",
         "hive": "`x` <> `x` OR `x` = CAST('NaN' AS DOUBLE)",
-        "duckdb": "isnan(\"x\")",
+        "duckdb": 'isnan("x")',
         "postgres": "\"x\" = CAST('NaN' AS DOUBLE PRECISION)",
         "snowflake": "\"x\" = CAST('NaN' AS DOUBLE)",
         "bigquery": "IS_NAN(`x`)",
@@ -246,15 +250,20 @@ def test_plots_draw_shares_over_the_weight_of_the_bins(iris):
 
 def test_what_bins_say_about_an_event_is_in_every_table():
     x = [1, 1, 1, 1, 2, 2, 2, 2]
-    frame = pd.DataFrame({"x": x * 20, "y": [False, False, False, True, True, True, True, False] * 20, "z": list("abcdabcd") * 20})
+    frame = pd.DataFrame(
+        {"x": x * 20, "y": [False, False, False, True, True, True, True, False] * 20, "z": list("abcdabcd") * 20}
+    )
     result = mb.supervised_bins(frame, pairs=[("x", "y"), ("x", "z")])
     found = result["x", "y"]
 
-    # Of the events a quarter is in the first bin and three quarters are in the second one; of the others it is the reverse.
+    # A quarter of the events is in the first bin and three quarters are in the second; of the others it is the reverse.
     woe = [math.log(1 / 3), math.log(3)]
     assert found.rates.tolist() == [0.25, 0.75] and found.woe == pytest.approx(woe)
     assert found.iv == pytest.approx([math.log(3) / 2] * 2) and found.information_value == found.iv.sum()
-    assert found.to_pandas()[["rate", "woe", "iv"]].to_numpy().T.tolist() == [[0.25, 0.75], *map(list, (found.woe, found.iv))]
+    assert found.to_pandas()[["rate", "woe", "iv"]].to_numpy().T.tolist() == [
+        [0.25, 0.75],
+        *map(list, (found.woe, found.iv)),
+    ]
     of_four = result["x", "z"]
     assert of_four.rates is None and of_four.woe is None and "woe" not in of_four.to_pandas()
     values = dict(zip(result.summary()["target"], result.summary()["information_value"]))
@@ -278,7 +287,9 @@ def test_copies_and_pickles_are_equal_to_the_last_bit(mixed):
 
 
 def test_columns_of_bins_get_names_that_are_free_and_bins_that_lack_are_told_of(tmp_path):
-    frame = pd.DataFrame({"x": np.arange(20.0), "x_bin": np.arange(20.0), "void": np.full(20, np.nan), "y": ["a", "b"] * 10})
+    frame = pd.DataFrame(
+        {"x": np.arange(20.0), "x_bin": np.arange(20.0), "void": np.full(20, np.nan), "y": ["a", "b"] * 10}
+    )
     result = mb.supervised_bins(frame, "y")
 
     with pytest.warns(mb.NoValidValuesWarning, match="attribute 'void'"):

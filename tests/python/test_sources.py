@@ -54,8 +54,13 @@ def test_memory_limit_bounds_the_reading_and_says_so(tmp_path):
     bins = mb.equal_frequency_bins(frame, ["x0"], n_bins=2)
 
     for path in paths.values():
-        for call in (lambda limit: mb.equal_frequency_bins(path, memory_limit=limit), lambda limit: bins.transform(path, memory_limit=limit).read_all()):
-            with pytest.raises((mb.StreamError, mb.DataError), match="memory_limit is too small .*: 1000 bytes") as caught:
+        for call in (
+            lambda limit, path=path: mb.equal_frequency_bins(path, memory_limit=limit),
+            lambda limit, path=path: bins.transform(path, memory_limit=limit).read_all(),
+        ):
+            with pytest.raises(
+                (mb.StreamError, mb.DataError), match=r"memory_limit is too small .*: 1000 bytes"
+            ) as caught:
                 call("1kB")
             assert "SET " not in str(caught.value)
             call(1_000_000_000)
@@ -67,7 +72,8 @@ def test_memory_limit_bounds_the_reading_and_says_so(tmp_path):
 
 
 @pytest.mark.parametrize(
-    ("limit", "number"), [("512MB", 512_000_000), ("2GiB", 2 << 30), (" 1.5 kb", 1500), ("7 B", 7), ("8", 8), (9, 9), ("1TiB", 1 << 40)]
+    ("limit", "number"),
+    [("512MB", 512_000_000), ("2GiB", 2 << 30), (" 1.5 kb", 1500), ("7 B", 7), ("8", 8), (9, 9), ("1TiB", 1 << 40)],
 )
 def test_a_limit_is_a_number_of_bytes(limit, number):
     from mcbinning._files import parse_memory
@@ -103,9 +109,15 @@ def test_files_one_behind_the_other_are_the_whole_data(halves, mixed, tmp_path, 
 
     for data in (halves[name], tuple(map(str, halves[name])), [tmp_path / f"part*.{name}"]):
         result = mb.supervised_bins(data, "y", ["x", "whole"])
-        assert [found.cut_points.tolist() for found in result.bins] == [found.cut_points.tolist() for found in expected.bins]
+        assert [found.cut_points.tolist() for found in result.bins] == [
+            found.cut_points.tolist() for found in expected.bins
+        ]
         assert result.records == 1500
-        assert result.transform(data).read_all().equals(pa.Table.from_pandas(expected.transform(mixed)).replace_schema_metadata())
+        assert (
+            result.transform(data)
+            .read_all()
+            .equals(pa.Table.from_pandas(expected.transform(mixed)).replace_schema_metadata())
+        )
 
 
 def test_a_lazy_frame_is_read_as_it_comes(mixed):
@@ -114,7 +126,9 @@ def test_a_lazy_frame_is_read_as_it_comes(mixed):
 
     expected = mb.supervised_bins(query.collect(), "y")
     assert list(result) == list(expected) and "twice" in result
-    assert [found.cut_points.tolist() for found in result.bins] == [found.cut_points.tolist() for found in expected.bins]
+    assert [found.cut_points.tolist() for found in result.bins] == [
+        found.cut_points.tolist() for found in expected.bins
+    ]
     assert pl.DataFrame(result.transform(query).read_all()).equals(expected.transform(query.collect()))
 
 
@@ -148,7 +162,11 @@ UNUSUAL = {
     "things": [object(), object()] * 10,
     "cut": pd.cut(np.arange(20.0), 4),
 }
-PLAIN = {"x": np.arange(20.0), "month": pd.period_range("2020-01", periods=20, freq="M"), "sparse": pd.arrays.SparseArray([0.0, 1.0] * 10)}
+PLAIN = {
+    "x": np.arange(20.0),
+    "month": pd.period_range("2020-01", periods=20, freq="M"),
+    "sparse": pd.arrays.SparseArray([0.0, 1.0] * 10),
+}
 
 
 @pytest.mark.parametrize("form", ["pandas", "arrow", "polars", "lazy", "parquet"])

@@ -1,4 +1,4 @@
-"""Fractional weights: on a grid on which all sums are exact, the order of the rows and the batches make no difference."""
+"""Fractional weights: on a grid on which all sums are exact, the order of the rows and batches makes no difference."""
 
 from __future__ import annotations
 
@@ -68,14 +68,17 @@ def test_the_command_line_tool_finds_the_same_bits(mcbin, tmp_path, rounding):
         path = tmp_path / "rows.csv"
         duckdb.from_arrow(weighted(seed)).write_csv(str(path))
         expected = []
-        for method, options in (("supervised", ["--target", "y"]), ("equal-frequency", ["--exclude", "y", "--bins", "7"])):
+        for method, options in (
+            ("supervised", ["--target", "y"]),
+            ("equal-frequency", ["--exclude", "y", "--bins", "7"]),
+        ):
             call = [mcbin, method, path, "--weight", "w", "--round", rounding, "--format", "json", *options]
             document = json.loads(subprocess.run(call, capture_output=True, check=True).stdout)
             [weight] = [variable for variable in document["variables"] if variable["name"] == "w"]
             assert weight["rounding"] == rounding
             expected += [document["results"], weight["grid"], document["data"]["records_without_weight"]]
 
-        assert json.loads(json.dumps(answers(lambda: path, rounding=rounding))) == expected
+        assert json.loads(json.dumps(answers(lambda path=path: path, rounding=rounding))) == expected
         assert (expected[1] is None) == (rounding != "none")
 
 
@@ -83,7 +86,9 @@ def test_a_constant_weight_leaves_nothing_of_a_category_that_is_gone(iris):
     for closed in ("left", "right"):
         plain = mb.supervised_bins(iris, "species", ["petal_length"], closed=closed)["petal_length"]
         found = mb.supervised_bins(iris.assign(w=0.7), "species", ["petal_length"], weight="w", closed=closed)
-        fitted = mb.SupervisedBinner(closed=closed).fit(iris[["petal_length"]], iris["species"], np.full(len(iris), 0.7))
+        fitted = mb.SupervisedBinner(closed=closed).fit(
+            iris[["petal_length"]], iris["species"], np.full(len(iris), 0.7)
+        )
 
         assert found["petal_length"].cut_points.tolist() == plain.cut_points.tolist()
         assert fitted.cut_points_[0].tolist() == plain.cut_points.tolist()
@@ -96,7 +101,9 @@ def test_the_estimators_weigh_by_the_same_grid():
     expected = mb.supervised_bins(frame, "y", ["x"], weight="w")["x"]
     order = np.random.default_rng(1).permutation(len(frame))
     for X in (frame[["x"]], frame[["x"]].to_numpy()):
-        fitted = mb.SupervisedBinner().fit(X[order] if isinstance(X, np.ndarray) else X.iloc[order], frame["y"][order], frame["w"][order])
+        fitted = mb.SupervisedBinner().fit(
+            X[order] if isinstance(X, np.ndarray) else X.iloc[order], frame["y"][order], frame["w"][order]
+        )
         assert fitted.result_.bins[0].target_weights.tolist() == expected.target_weights.tolist()
         assert fitted.result_.bins[0].model_entropy == expected.model_entropy
     rounded = mb.EqualFrequencyBinner(rounding="closest").fit([[1.0], [2.0], [3.0]], sample_weight=[0.5, 1.4, 0.2])

@@ -72,9 +72,7 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         tags.input_tags.allow_nan = True
         return tags
 
-    def _fit(
-        self, X: Any, codes: npt.NDArray[np.uint8] | None, classes: npt.NDArray[Any], sample_weight: Any
-    ) -> None:
+    def _fit(self, X: Any, codes: npt.NDArray[np.uint8] | None, classes: npt.NDArray[Any], sample_weight: Any) -> None:
         if self.encode not in ("ordinal", "onehot", "interval"):
             raise ValueError(f"encode must be 'ordinal', 'onehot' or 'interval', not {self.encode!r}")
         if self.missing not in ("code", "keep"):
@@ -382,9 +380,7 @@ class EqualFrequencyBinner(_Binner):
 def _code_target(y: Any) -> tuple[npt.NDArray[Any], npt.NDArray[np.uint8]]:
     """The categories in the order that `y` declares or else in ascending order, and the code of each row."""
     declared = _declared_order(y)
-    y = check_array(
-        y, ensure_2d=False, dtype=None, ensure_all_finite="allow-nan", ensure_min_samples=0, input_name="y"
-    )
+    y = check_array(y, ensure_2d=False, dtype=None, ensure_all_finite="allow-nan", ensure_min_samples=0, input_name="y")
     y = column_or_1d(y, warn=True)
     codes, classes = pd.factorize(y, sort=declared is None)
     if declared is not None:

@@ -143,8 +143,8 @@ def _open_with_duckdb(paths: Sequence[str], name: str, reading: Reading, limit: 
 
 
 def _blank_texts(relation: Any, missing_texts: Mapping[str, Sequence[str]]) -> Any:
-    """Makes numbers of the columns with missing texts, which have been read as texts: DuckDB itself knows such texts only
-    for all columns."""
+    """Makes numbers of the columns with missing texts, which have been read as texts: DuckDB itself knows such texts
+    only for all columns."""
 
     def select(name: str) -> str:
         column = _quote(name)

@@ -42,9 +42,7 @@ def _parse(content: bytes, name: str) -> Any:
 
 def _load(text: str) -> Any:
     """\\raise ValueError at what Python reads, but is no JSON, or no number or text that the core can hold."""
-    document = json.loads(
-        text, parse_constant=_refuse, parse_float=_number, parse_int=_number, object_pairs_hook=tuple
-    )
+    document = json.loads(text, parse_constant=_refuse, parse_float=_number, parse_int=_number, object_pairs_hook=tuple)
     if "\\u" in text:
         json.dumps(document, ensure_ascii=False).encode("utf-8")  # refuses half a surrogate pair
     return document

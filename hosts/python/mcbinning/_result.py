@@ -154,8 +154,8 @@ class AttributeBins:
         return self._core.labels
 
     def to_pandas(self) -> pd.DataFrame:
-        """A row for each bin: its ends, its weight and share, and its weight in each category of the target; of a target
-        of two categories `rate`, `woe` and `iv`, too."""
+        """A row for each bin: its ends, its weight and share, and its weight in each category of the target; of a
+        target of two categories `rate`, `woe` and `iv`, too."""
         pandas = require("pandas", "data frames", "pandas")
         ends = [-np.inf, *self.cut_points, np.inf]
         n = self.n_bins
@@ -212,7 +212,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         self.status = Status.from_core(core.status)
         self.bins = tuple(map(AttributeBins, core.results))
         self.left_out = dict(left_out or {})
-        """What each column holds that was not named, and is not of a kind that is binned unless it is: text, durations."""
+        """What each column holds that was not named, and is not of a kind that is binned unless it is, such as text."""
         self.data_name = core.data_name
         self.records = core.records
         """How many were read, whatever their weight."""
@@ -255,7 +255,8 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return sorted(self.bins, key=lambda found: -found.gain if found.gain == found.gain else np.inf)
 
     def summary(self) -> pd.DataFrame:
-        """A row for each attribute, with the largest gain first, and for each column that was left out."""
+        """A row for each attribute, with the largest gain first, and for each column that was left out. Targets of two
+        categories have an `information_value`."""
         rows = [
             {
                 "attribute": found.attribute,
@@ -274,14 +275,14 @@ class BinningResult(Mapping[Any, AttributeBins]):
             }
             for found in self.by_gain()
         ]
-        rows += [
-            {"attribute": name, "bins": 0, "status": f"left out: {kind}"} for name, kind in self.left_out.items()
-        ]
+        rows += [{"attribute": name, "bins": 0, "status": f"left out: {kind}"} for name, kind in self.left_out.items()]
         pandas = require("pandas", "data frames", "pandas")
         frame: pd.DataFrame = pandas.DataFrame(rows).astype({"distinct_values": "Int64"} if rows else {})
         if self.method != "supervised":
             of_targets = ["target", "gain", "target_entropy", "model_entropy", "information_value"]
             frame = frame.drop(columns=of_targets, errors="ignore")
+        elif rows and frame["information_value"].isna().all():
+            frame = frame.drop(columns="information_value")
         return frame
 
     def to_pandas(self) -> pd.DataFrame:
@@ -494,8 +495,7 @@ def _tell_in_time_zone(found: _core.AttributeBins) -> list[str]:
     """The borders in words, as people in the time zone read them. Those beyond all calendars stay numbers."""
     stamps = [_values.decode(border, "timestamp", found.variable.time_zone) for border in found.borders.tolist()]
     return [
-        str(stamp) if isinstance(stamp, datetime.datetime) else text
-        for stamp, text in zip(stamps, found.border_texts)
+        str(stamp) if isinstance(stamp, datetime.datetime) else text for stamp, text in zip(stamps, found.border_texts)
     ]
 
 

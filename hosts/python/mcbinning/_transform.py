@@ -30,7 +30,8 @@ def transform(
     unseen: Unseen,
     memory_limit: MemoryLimit | None,
 ) -> Any:
-    r"""\param name_columns gives the index of the result and the name of each column of bins, by the names that are taken."""
+    """`name_columns` takes the names of the data's columns, and gives the index of the result and the name of each
+    column of bins."""
     if unseen not in ("error", "missing"):
         raise ValueError(f"unseen must be 'error' or 'missing', not {unseen!r}")
     variables = {found.attribute: found.variable for found in result.bins if found.n_bins}
