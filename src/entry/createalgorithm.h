@@ -19,23 +19,11 @@ inline MCBinning::MCStatus CheckVarList(const BINVarList& varList)
     const bool isValid = varList.IsValidList(oneCategory, noCategories);
     int culprit = -1;
     if (isValid)
-    {
-        {
-            culprit = FindVariableWithoutPosition(varList);
-        }
-    }
+        culprit = FindVariableWithoutPosition(varList);
     else if (!noCategories.empty())
-    {
-        {
-            culprit = noCategories.front();
-        }
-    }
+        culprit = noCategories.front();
     else if (!oneCategory.empty())
-    {
-        {
-            culprit = oneCategory.front();
-        }
-    }
+        culprit = oneCategory.front();
     if (isValid && culprit < 0)
         return MCBinning::MCStatus();
     MCBinning::MCStatus status = MakeError(MCBinning::BINStatusInvalidVarList);
@@ -49,7 +37,7 @@ template<class Algorithm, class Interface, class Settings>
 Interface* CreateAlgorithm(const Settings& settings, const BINVarList& varList, MCBinning::MCStatus& status,
                            std::unique_ptr<Interface>& underConstruction)
 {
-    status = MCBinning::MCStatus();
+    status = MCBinning::MCStatus(); // CheckVarList may throw, and the status of an earlier call must not stay then
     status = CheckVarList(varList);
     if (status.IsError())
         return nullptr;

@@ -78,15 +78,11 @@ void ExpectSound(const Outcome<Results>& undisturbed, const Outcome<Results>& di
         ASSERT_NE(undisturbed.fResults.end(), twin);
         if (result.GetStatus().IsOK())
         {
-            {
-                ExpectSame(*twin, result);
-            }
+            ExpectSame(*twin, result);
         }
         else
         {
-            {
-                EXPECT_TRUE(!isAllOK && CodeOf(result) == failure) << CodeOf(result);
-            }
+            EXPECT_TRUE(!isAllOK && CodeOf(result) == failure) << CodeOf(result);
         }
     }
 }

@@ -36,8 +36,8 @@ constexpr double kMissingCode = -1.0;
 struct Column
 {
     ValueMaker maker;
-    std::optional<ValueMaker> places; ///< of a dictionary, which has its values in `maker`
-    std::vector<PlainValue> values;   ///< of all batches made so far
+    std::optional<ValueMaker> indices; ///< into a dictionary, whose values `maker` makes; none without a dictionary
+    std::vector<PlainValue> values;    ///< of all batches made so far
     ArrowSchema schema{};
     ArrowSchema dictionary{};
 };
@@ -58,11 +58,11 @@ std::unique_ptr<Column> TakeColumn(Input& input)
                                            "d:9,2",     "d:38,37",
                                            "d:7,-2",    "d:9,3,32",
                                            "d:18,4,64", "d:38,0,128"};
-    static const char* const kPlaces[] = {"c", "C", "s", "S", "i", "I", "l", "L"};
+    static const char* const kIndexFormats[] = {"c", "C", "s", "S", "i", "I", "l", "L"};
     auto column =
         std::make_unique<Column>(Column{ValueMaker(input.PickValueInArray(kFormats)), std::nullopt, {}, {}, {}});
     if (input.ConsumeIntegralInRange(0, 3) == 0)
-        column->places = ValueMaker(input.PickValueInArray(kPlaces));
+        column->indices = ValueMaker(input.PickValueInArray(kIndexFormats));
     return column;
 }
 
@@ -83,8 +83,10 @@ public:
         fSchema.children = fSchemas.data();
         fBatchSizes.resize(input.ConsumeIntegralInRange<std::size_t>(0, 4));
         for (std::size_t& size : fBatchSizes)
+        {
             size = input.ConsumeIntegralInRange(0, 15) == 0 ? input.ConsumeIntegralInRange<std::size_t>(0, 2500)
                                                             : input.ConsumeIntegralInRange<std::size_t>(0, 20);
+        }
     }
 
     const std::vector<std::unique_ptr<Column>>& GetColumns() const { return fColumns; }
@@ -109,9 +111,9 @@ private:
     void DescribeColumn(Column& column)
     {
         column.dictionary.format = column.maker.GetFormat().c_str();
-        column.schema.format = (column.places ? *column.places : column.maker).GetFormat().c_str();
-        column.schema.dictionary = column.places ? &column.dictionary : nullptr;
-        column.schema.flags = column.places && fInput.ConsumeBool() ? 1 : 0; // the dictionary is ordered, or not
+        column.schema.format = (column.indices ? *column.indices : column.maker).GetFormat().c_str();
+        column.schema.dictionary = column.indices ? &column.dictionary : nullptr;
+        column.schema.flags = column.indices && fInput.ConsumeBool() ? 1 : 0; // the dictionary is ordered, or not
         fSchemas.push_back(&column.schema);
     }
 
@@ -139,18 +141,20 @@ private:
     {
         PlainArray& child = AddArray();
         const auto offset = fInput.ConsumeIntegralInRange<std::size_t>(0, 9);
-        if (!column.places)
+        if (!column.indices)
             child.Make(fInput, column.maker, offset, batchOffset + numRows);
         else
         {
             PlainArray& dictionary = AddArray();
             const auto size = fInput.ConsumeIntegralInRange<std::size_t>(1, 20);
             dictionary.Make(fInput, column.maker, fInput.ConsumeIntegralInRange<std::size_t>(0, 3), size);
-            child.MakePlaces(fInput, *column.places, offset, batchOffset + numRows, size);
+            child.MakeIndices(fInput, *column.indices, offset, batchOffset + numRows, size);
             child.array.dictionary = &dictionary.array;
             for (PlainValue& value : child.values)
+            {
                 if (!value.isMissing && !value.isBad)
                     value = dictionary.values[static_cast<std::size_t>(value.number)];
+            }
         }
         fChildren.push_back(&child.array);
         column.values.insert(column.values.end(), child.values.begin() + static_cast<std::ptrdiff_t>(batchOffset),
@@ -188,8 +192,8 @@ StridedArray TakeArray(Input& input, Beside& beside, std::size_t length)
     for (std::size_t row = 0; row < length; ++row)
     {
         const StoredValue& value = pool[row * 7 % 11 % pool.size()];
-        const std::size_t place = isBackwards ? length - 1 - row : row;
-        std::memcpy(beside.memory.data() + place * static_cast<std::size_t>(distance), value.bytes.data(),
+        const std::size_t slot = isBackwards ? length - 1 - row : row;
+        std::memcpy(beside.memory.data() + slot * static_cast<std::size_t>(distance), value.bytes.data(),
                     sizeof(double));
         beside.values.push_back(value.plain);
     }
@@ -220,7 +224,8 @@ public:
         return value.isMissing ? gMissingValue : value.number;
     }
 
-    /// Whether the place of the value is none of the dictionary, which no fault is told of by its row.
+    /// Whether the row holds an index that is not in its dictionary. The reader refuses such a column without naming the
+    /// row.
     bool IsBad(std::size_t row) const { return row < fValues.size() && fValues[row].isBad && !fValues[row].isMissing; }
 
     bool IsExact(std::size_t row) const
@@ -329,9 +334,9 @@ private:
 
     void AddArray(Input& input, std::size_t index, std::size_t length)
     {
-        const std::size_t place = fProducer.GetColumns().size() + index;
-        Field& field = fFields[place];
-        field.name = std::to_string(place);
+        const std::size_t fieldIndex = fProducer.GetColumns().size() + index;
+        Field& field = fFields[fieldIndex];
+        field.name = std::to_string(fieldIndex);
         field.use = TakeUse(input, false, false);
         field.array = TakeArray(input, fBeside[index], length);
         DeclareMissing(input, field);
@@ -342,6 +347,7 @@ private:
     {
         Check(block.numRows > 0 && block.numRows <= Block::kMaxRows, "number of rows of a block");
         for (std::size_t field = 0; field < fFields.size(); ++field)
+        {
             for (std::size_t i = 0; i < block.numRows; ++i)
             {
                 const std::size_t row = fNumRows + i;
@@ -349,9 +355,12 @@ private:
                 Check(expected.has_value(), "a value that can't be used was read");
                 const double actual = block.At(field, i);
                 if (!IsAsTold(*expected, actual, fExpectations[field].IsExact(row)))
+                {
                     Fail("row " + std::to_string(row) + " of " + std::to_string(field) + ": " +
                          std::to_string(*expected) + " was written, " + std::to_string(actual) + " read");
+                }
             }
+        }
         fNumRows += block.numRows;
     }
 
@@ -379,9 +388,13 @@ private:
     bool HasBadPlace() const
     {
         for (const Expectation& expectation : fExpectations)
+        {
             for (std::size_t row = fNumRows; row < fNumRows + Block::kMaxRows; ++row)
+            {
                 if (expectation.IsBad(row))
                     return true;
+            }
+        }
         return false;
     }
 

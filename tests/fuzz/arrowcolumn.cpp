@@ -213,15 +213,15 @@ void PlainArray::Make(FuzzedDataProvider& input, const ValueMaker& maker, std::s
     Fill(input, maker, pool, offset, length);
 }
 
-void PlainArray::MakePlaces(FuzzedDataProvider& input, const ValueMaker& maker, std::size_t offset, std::size_t length,
-                            std::size_t size)
+void PlainArray::MakeIndices(FuzzedDataProvider& input, const ValueMaker& maker, std::size_t offset, std::size_t length,
+                             std::size_t size)
 {
     std::vector<StoredValue> pool;
-    for (std::size_t place = 0; place < size; ++place)
+    for (std::size_t index = 0; index < size; ++index)
     {
         StoredValue value;
-        value.plain.number = static_cast<double>(place);
-        value.bytes = BytesOf(static_cast<std::uint64_t>(place)); // its first bytes stand for the smaller types
+        value.plain.number = static_cast<double>(index);
+        value.bytes = BytesOf(static_cast<std::uint64_t>(index)); // its first bytes stand for the smaller types
         value.bytes.resize(maker.GetSize());
         pool.push_back(value);
     }
@@ -276,8 +276,10 @@ void PlainArray::AddValidity(FuzzedDataProvider& input, const std::vector<bool>&
 {
     std::vector<std::uint8_t> bits(isValid.size() / 8 + 1);
     for (std::size_t i = 0; i < isValid.size(); ++i)
+    {
         if (isValid[i])
             SetBit(bits, i);
+    }
     bits.resize((isValid.size() + 7) / 8);
     const auto numNulls = std::count(isValid.begin() + static_cast<std::ptrdiff_t>(offset), isValid.end(), false);
     array.null_count = input.ConsumeBool() ? numNulls : -1;
@@ -292,11 +294,15 @@ void PlainArray::AddFixed(const ValueMaker& maker, const std::vector<const Store
     {
         bytes.resize((slots.size() + 7) / 8);
         for (std::size_t i = 0; i < slots.size(); ++i)
+        {
             if (slots[i]->plain.number != 0.0)
                 SetBit(bytes, i);
+        }
     }
     else
+    {
         for (const StoredValue* const slot : slots) bytes.insert(bytes.end(), slot->bytes.begin(), slot->bytes.end());
+    }
     AddBuffer(bytes);
 }
 
@@ -338,9 +344,9 @@ void PlainArray::AddTextViews(const std::vector<const StoredValue*>& slots)
         if (text.size() > 12)
         {
             const auto buffer = static_cast<std::int32_t>(numLong++ % 2);
-            const auto place = static_cast<std::int32_t>(texts[buffer].size());
+            const auto position = static_cast<std::int32_t>(texts[buffer].size());
             std::memcpy(view + 8, &buffer, 4);
-            std::memcpy(view + 12, &place, 4);
+            std::memcpy(view + 12, &position, 4);
             texts[buffer].insert(texts[buffer].end(), text.begin(), text.end());
         }
         views.insert(views.end(), view, view + sizeof(view));

@@ -17,7 +17,7 @@ struct PlainValue
     bool isMissing = false;
     double number = 0.0;
     bool isExact = true; ///< or the last bits of `number` depend on how it is worked out
-    bool isBad = false;  ///< a place that its dictionary doesn't have
+    bool isBad = false;  ///< an index that its dictionary doesn't have
     std::string text;    ///< of a column of texts
 };
 
@@ -61,9 +61,9 @@ public:
     /// Makes `length` values behind `offset` others that nobody should look at.
     void Make(FuzzedDataProvider& input, const ValueMaker& maker, std::size_t offset, std::size_t length);
 
-    /// Makes places in a dictionary of `size` values, and now and then one that it doesn't have.
-    void MakePlaces(FuzzedDataProvider& input, const ValueMaker& maker, std::size_t offset, std::size_t length,
-                    std::size_t size);
+    /// Makes indices into a dictionary of `size` values, and now and then one that is out of range.
+    void MakeIndices(FuzzedDataProvider& input, const ValueMaker& maker, std::size_t offset, std::size_t length,
+                     std::size_t size);
 
     ArrowArray array{};
     std::vector<PlainValue> values; ///< without the others

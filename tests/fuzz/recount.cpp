@@ -60,8 +60,10 @@ bool IsUserMissing(const BINVarList& list, int variable, double value)
     if (missing == nullptr)
         return false;
     for (const double declared : missing->GetDiscreteValues())
+    {
         if (value == declared)
             return true;
+    }
     const BINNumericInterval* const interval = missing->GetInterval();
     return interval != nullptr && value >= interval->GetLeftEnd() && value <= interval->GetRightEnd();
 }
@@ -208,8 +210,10 @@ double PlainEntropy(const std::vector<double>& weights)
     for (const double weight : weights) total += weight;
     double entropy = 0.0;
     for (const double weight : weights)
+    {
         if (weight > 0.0)
             entropy -= weight / total * std::log2(weight / total);
+    }
     return entropy;
 }
 

@@ -91,9 +91,13 @@ private:
     void Scale(double* values, std::size_t count) const
     {
         if (fFactor != 1.0)
+        {
             for (std::size_t i = 0; i < count; ++i) values[i] *= fFactor;
+        }
         if (fDivisor != 1.0)
+        {
             for (std::size_t i = 0; i < count; ++i) values[i] /= fDivisor;
+        }
     }
 
     const char* fData;

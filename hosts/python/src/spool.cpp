@@ -52,7 +52,9 @@ Spool::Spool(BlockSource& source, const std::vector<Field>& fields, const std::s
     {
         std::vector<double> newCodes;
         if (field.use == Field::Use::kCategory)
+        {
             for (const std::size_t rank : field.GetRanks()) newCodes.push_back(static_cast<double>(rank));
+        }
         fNewCodes.push_back(newCodes);
     }
 }

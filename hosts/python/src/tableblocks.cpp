@@ -259,9 +259,11 @@ TableBlocks::TableBlocks(Batches* batches, std::vector<Field>& fields)
         }
         const auto length = static_cast<std::int64_t>(fields[i].array.length);
         if (fNumArrayRows >= 0 && length != fNumArrayRows)
+        {
             throw DataFault("there are " + std::to_string(length) + " values for " + std::to_string(fNumArrayRows) +
                                 " rows",
                             fields[i].name);
+        }
         fNumArrayRows = length;
     }
 }
@@ -297,8 +299,10 @@ bool TableBlocks::NextBatch()
         }
         const std::int64_t numSeen = fFirstRow + fNumRows;
         if (fNumArrayRows >= 0 && (numSeen > fNumArrayRows || (fIsAtEnd && numSeen < fNumArrayRows)))
+        {
             throw DataFault("the table has " + std::string(fIsAtEnd ? "" : "at least ") + std::to_string(numSeen) +
                             " rows, but there are " + std::to_string(fNumArrayRows) + " values beside it");
+        }
         if (fNumRows > 0)
         {
             OpenBatch(batch);
@@ -330,9 +334,11 @@ std::unique_ptr<FieldReader> TableBlocks::MakeFieldReader(std::size_t index, con
         const ArrowArray& column = *batch->children[field.column];
         DeclareOrder(field, type, column);
         if (type.IsText() && type.isDictionary)
+        {
             return std::make_unique<DictionaryCategoryField>(
                 MakePlaceReader(column, type, batch->offset), TextReader(*column.dictionary, type.storage, 0),
                 static_cast<std::size_t>(column.dictionary->length), field);
+        }
         if (type.IsText())
             return std::make_unique<TextCategoryField>(TextReader(column, type.storage, batch->offset), field);
         reader = MakeReader(column, type, batch->offset);
