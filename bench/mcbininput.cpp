@@ -34,7 +34,7 @@ void Time(const char* file, const char* target)
     TableReader table(tableOptions);
     ColumnPlan plan = PlanColumns(table, columns);
     ProfileTable(table, plan, progress, Care::kHasty);
-    const Variables variables = MakeVariables(plan);
+    Variables variables = MakeVariables(plan);
     const double profile = GetSeconds(begin);
     TableRecordSource source(table, plan, variables, progress);
     while (source.HasNext()) source.Next();

@@ -5,10 +5,10 @@ The estimators work in scikit-learn, on data in memory. The functions work on st
 
 from __future__ import annotations
 
-from importlib.metadata import version as _version
 from typing import TYPE_CHECKING as _TYPE_CHECKING
 from typing import Any as _Any
 
+from ._core import __version__
 from ._errors import (
     BadBinTableWarning,
     BinningError,
@@ -28,8 +28,6 @@ from ._status import Status
 
 if _TYPE_CHECKING:
     from ._estimators import EqualFrequencyBinner, SupervisedBinner
-
-__version__ = _version("mcbinning")
 
 __all__ = [
     "AttributeBins",

@@ -7,6 +7,8 @@ import numpy as np
 import numpy.typing as npt
 
 _Floats = npt.NDArray[np.float64]
+__version__: str
+
 _Status = tuple[int, str, tuple[int, int, int], tuple[float, float, float]]
 
 def temp_directory(named: str) -> str: ...

@@ -90,6 +90,8 @@ void TranslateFaults(const std::exception_ptr& exception, void*)
 NB_MODULE(_core, module)
 {
     nb::register_exception_translator(TranslateFaults);
+    // To ask for that of the installed package would take as long as to import the module.
+    module.attr("__version__") = MCBINNING_VERSION;
     // Raises a RuntimeError, with words for the user, where TMPDIR is set and can't be used.
     module.def("temp_directory", [](const std::string& named) { return ChooseTempDirectory(named, "temp_dir="); });
     BindBins(module);
