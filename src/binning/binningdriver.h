@@ -83,7 +83,7 @@ protected:
         return fPreparationStatus;
     }
 
-    /// The end of the work on one attribute or pair: its status reaches the algorithm's.
+    /// Ends the work on one attribute or pair: a status of it that is not OK becomes the algorithm's.
     MCBinning::MCStatus CloseStep(MCBinning::MCStatus status)
     {
         if (!status.IsOK())
@@ -92,7 +92,7 @@ protected:
         return status;
     }
 
-    /// The end of a run that wasn't stopped before its first attribute.
+    /// Ends a run that wasn't stopped before its first attribute. \return the status of the run.
     MCBinning::MCStatus CloseRun(MCBinning::MCStatus status)
     {
         if (!fStatus.IsOK())

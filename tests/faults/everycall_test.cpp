@@ -38,6 +38,7 @@ void FailEachCall(Settings settings, const RecordTable& records, bool fromThenOn
 
         hasFired = platform.fHasFired;
         ExpectSound(undisturbed, disturbed, MCBinning::BINStatusCannotOpenTempFile);
+        EXPECT_EQ(platform.fNumOpened, platform.fNumClosed);
         EXPECT_TRUE(dir.IsEmpty());
     }
     EXPECT_GT(call, 50) << "some calls don't go through the platform";

@@ -159,6 +159,7 @@ TEST(SupervisedRun, SettingsOfTheAlgorithmReachLaterRunsAndThoseOfTheHostDont)
 
     EXPECT_EQ(std::vector<double>{3}, run.All()[0].GetCutPoints());
     EXPECT_EQ(std::vector<double>{3}, run.All()[1].GetCutPoints());
+    EXPECT_EQ((std::vector<std::vector<double>>{{6, 6, 0}, {6, 0, 6}}), run.All()[0].GetCellCounts());
 }
 
 TEST(SupervisedRun, ListsWithoutATarget)

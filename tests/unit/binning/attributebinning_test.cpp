@@ -31,20 +31,6 @@ using Table = std::vector<std::vector<double>>;
 
 } // namespace
 
-TEST(DirectBinning, CutIsTheBorderOnTheClosedSide)
-{
-    const std::vector<std::pair<double, int>> data{{1, 0}, {2, 0}, {3, 1}, {4, 1}};
-
-    const BINAttributeTargetResults right = Bin(data, Closed(true));
-    const BINAttributeTargetResults left = Bin(data, Closed(false));
-
-    EXPECT_EQ(std::vector<double>{2}, right.GetCutPoints());
-    EXPECT_EQ(std::vector<double>{3}, left.GetCutPoints());
-    EXPECT_EQ((Table{{2, 2, 0}, {2, 0, 2}}), right.GetCellCounts());
-    EXPECT_EQ((Table{{2, 2, 0}, {2, 0, 2}}), left.GetCellCounts());
-    EXPECT_EQ(0.0, right.GetModelEntropy());
-}
-
 TEST(DirectBinning, WithoutACutThereIsOneBinWithItsEntropy)
 {
     const BINAttributeTargetResults result = Bin({{1, 0}, {1, 1}, {2, 0}, {2, 1}}, Closed(true));

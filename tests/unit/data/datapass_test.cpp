@@ -236,7 +236,7 @@ TEST(DataPass, CancelKeepsWhatWasReadButGivesNoData)
     EXPECT_EQ(kNoRecords, other->PrepareData(&source));
 }
 
-TEST(DataPass, ListsWithoutAPlaceForEachVariableAreRefused)
+TEST(DataPass, ListsWithAVariableThatHasNoPositionAreRefused)
 {
     BINVarList list = AVarList().WithAttribute("x").WithAttribute("y");
     list.SetVariableRole(1, IBINVariable::RoleUndefined);

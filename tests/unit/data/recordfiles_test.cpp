@@ -179,19 +179,3 @@ TEST(RecordFiles, EachFlushAppendsAndTheFilesGoWithTheObject)
     }
     EXPECT_TRUE(directory.IsEmpty());
 }
-
-TEST(RecordFiles, FileThatDoesNotTakeAllIsAnErrorAndIsClosed)
-{
-    // Calls that can fail: two probes, then creation, write and close of each file.
-    for (const int failingCall : {3, 4, 5, 6, 7, 8})
-    {
-        TestFiles t;
-        t.fPlatform.fFailingCall = failingCall;
-        ASSERT_TRUE(t.fFiles.Init(2).IsOK());
-        for (const int position : {0, 0, 1, 1}) t.fFiles.Append(position, 1.0);
-
-        EXPECT_EQ(MCBinning::MCStatus(MCBinning::BINStatusCannotOpenTempFile, false), t.fFiles.Flush()) << failingCall;
-
-        EXPECT_EQ(t.fPlatform.fNumOpened, t.fPlatform.fNumClosed) << failingCall;
-    }
-}
