@@ -20,5 +20,5 @@ def test_code_of_the_guide_runs(code, tmp_path, monkeypatch):
     plt.close("all")
 
 
-def test_the_guide_has_its_four_walks():
-    assert len(BLOCKS) == 4 and len(BLOCKS[0].splitlines()) == 10
+def test_the_guide_has_its_five_walks():
+    assert len(BLOCKS) == 5 and len(BLOCKS[0].splitlines()) == 10

@@ -8,6 +8,7 @@ from __future__ import annotations
 from typing import TYPE_CHECKING as _TYPE_CHECKING
 from typing import Any as _Any
 
+from ._bins import AttributeBins
 from ._core import __version__
 from ._errors import (
     BadBinTableWarning,
@@ -23,7 +24,7 @@ from ._errors import (
 )
 from ._features import require as _require
 from ._functions import equal_frequency_bins, supervised_bins
-from ._result import AttributeBins, BinningResult
+from ._result import BinningResult
 from ._status import Status
 
 if _TYPE_CHECKING:

@@ -12,7 +12,8 @@ if TYPE_CHECKING:
     import matplotlib.axes
     import matplotlib.figure
 
-    from ._result import AttributeBins, BinningResult
+    from ._bins import AttributeBins
+    from ._result import BinningResult
 
 
 def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:

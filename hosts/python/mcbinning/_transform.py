@@ -17,7 +17,8 @@ from ._sources import Source, check_names, columns_of
 from ._types import MemoryLimit, Unseen
 
 if TYPE_CHECKING:
-    from ._result import AttributeBins, BinningResult, Variable
+    from ._bins import AttributeBins, Variable
+    from ._result import BinningResult
 
 _ROWS_AT_ONCE = 1 << 17
 

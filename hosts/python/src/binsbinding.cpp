@@ -80,6 +80,7 @@ template<class Element, class Get>
 nb::object Collect(const std::vector<Element>& elements, Get get)
 {
     std::vector<double> numbers;
+    numbers.reserve(elements.size());
     for (const Element& element : elements) numbers.push_back(get(element));
     return ToArray(std::move(numbers));
 }

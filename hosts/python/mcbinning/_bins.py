@@ -1,0 +1,203 @@
+"""The bins of one attribute."""
+
+from __future__ import annotations
+
+import datetime
+from dataclasses import dataclass
+from functools import cached_property
+from typing import TYPE_CHECKING, Any, cast
+
+import numpy as np
+
+from . import _core, _values
+from ._features import require
+from ._json import read_bins
+from ._status import Status
+from ._types import Closed, Role
+from ._values import Codes, Floats
+
+if TYPE_CHECKING:
+    import matplotlib.axes
+    import pandas as pd
+
+
+@dataclass(frozen=True)
+class Variable:
+    """A column of the analysis."""
+
+    name: str
+    role: Role
+    kind: str
+    """What its values are: `"float"`, `"integer"`, `"boolean"`, `"date"`, `"timestamp"`, `"text"`. Numbers that are
+    measured are `"float"`, and those that are categories `"integer"` if all of them are whole."""
+    time_zone: str
+    categories: tuple[Any, ...] | None
+    """As texts or numbers, by code; None for a column that is measured."""
+    missing_values: tuple[Any, ...]
+    missing_interval: tuple[float, float] | None
+    label: str
+    rounding: str | None
+    """Of a weight: `"none"`, `"truncate"` or `"closest"`."""
+    missing_texts: tuple[str, ...]
+    """What stands for a missing value in a text file, where `missing_values` are numbers."""
+    grid: float | None
+    """Of a weight: of what its values were made multiples, so that all sums are exact; None if none had to move."""
+
+    @classmethod
+    def from_core(cls, core: _core.Variable) -> Variable:
+        is_text = core.kind == "text"
+        return cls(
+            core.name,
+            cast(Role, core.role),
+            core.kind,
+            core.time_zone,
+            None if core.categories is None else tuple(core.categories),
+            tuple(core.missing_texts if is_text else core.missing_numbers),
+            core.missing_interval,
+            core.label,
+            core.rounding,
+            () if is_text else tuple(core.missing_texts),
+            core.grid,
+        )
+
+    @property
+    def is_categorical(self) -> bool:
+        return self.categories is not None
+
+    def category_names(self) -> list[Any]:
+        """The categories as the user knows them."""
+        if self.kind == "text":
+            return list(self.categories or ())
+        return [_values.decode(number, self.kind, self.time_zone) for number in self.categories or ()]
+
+
+class AttributeBins:
+    """The bins of one attribute, against one target or none."""
+
+    def __init__(self, core: _core.AttributeBins) -> None:
+        self._core = core
+        self.variable = Variable.from_core(core.variable)
+        self.target = None if core.target is None else Variable.from_core(core.target)
+        self.status = Status.from_core(core.status)
+        self.closed: Closed = "right" if core.right_closed else "left"
+        self.cut_points = core.cut_points
+        """In ascending order. Dates are days and timestamps microseconds since 1970; categories are codes."""
+        self.weights = core.weights
+        """By bin; one bin more than there are cut points, or none where nothing was binned."""
+        self.target_weights = core.target_weights
+        """By bin and category of the target."""
+        self.n_distinct = core.n_distinct
+        self.weight = core.weight
+        """Of the records with a valid value, and a valid target if there is one."""
+        self.weight_with_missing = core.weight_with_missing
+        self.minimum = core.minimum
+        """NaN where there is no valid value, as with the maximum."""
+        self.maximum = core.maximum
+        self.target_entropy = core.target_entropy
+        """The target's entropy over the records that `weight` counts, in bits; NaN without a target."""
+        self.model_entropy = core.model_entropy
+        """What is left of the target's entropy within the bins, in bits; NaN without a target."""
+        self.gain = core.gain
+        """By how many bits the bins lower the target's entropy; NaN without a target."""
+        self.rates = core.rates
+        """By bin: the share of the target's second category, the event; None unless the target has two categories."""
+        self.woe = core.woe
+        """By bin: the weight of evidence ln(p / q), where p is the bin's share of all events, and q of all others; None
+        unless the target has two categories."""
+        self.iv = core.iv
+        """By bin: its part of the information value, (p - q) ln(p / q); None unless the target has two categories."""
+        self.information_value = core.information_value
+        """The sum over the bins; NaN unless the target has two categories."""
+
+    def __reduce__(self) -> tuple[Any, ...]:
+        return _restore_bins, (self._core.alone().to_json(),)
+
+    @property
+    def attribute(self) -> str:
+        return self.variable.name
+
+    @property
+    def n_bins(self) -> int:
+        return len(self.weights)
+
+    @property
+    def missing_weight(self) -> float:
+        return self.weight_with_missing - self.weight
+
+    @property
+    def borders(self) -> Floats:
+        """The cut points as people read them. One between two days or two microseconds is shown as the nearest of these
+        that parts the same dates or timestamps."""
+        return self._core.borders
+
+    @property
+    def border_texts(self) -> list[str]:
+        """The borders in words."""
+        return self._core.border_texts
+
+    @cached_property
+    def labels(self) -> list[str]:
+        """The bins in words: an interval, or the categories that are in it."""
+        return self._core.labels
+
+    def to_pandas(self) -> pd.DataFrame:
+        """A row for each bin: its ends, its weight and share, and its weight in each category of the target; of a
+        target of two categories `rate`, `woe` and `iv`, too."""
+        pandas = require("pandas", "data frames", "pandas")
+        ends = [-np.inf, *self.cut_points, np.inf]
+        n = self.n_bins
+        with np.errstate(invalid="ignore", divide="ignore"):
+            shares = self.weights / self.weights.sum()
+        columns: dict[str, Any] = {
+            "attribute": [self.attribute] * n,
+            "target": [self.target.name if self.target else None] * n,
+            "bin": np.arange(n),
+            "interval": self.labels,
+            "left": ends[:n],
+            "right": ends[1 : n + 1],
+            "weight": self.weights,
+            "share": shares,
+        }
+        if self.target is not None and self.target_weights is not None:
+            for code, name in enumerate(self.target.category_names()):
+                columns[f"weight[{name}]"] = self.target_weights[:, code]
+        if self.rates is not None:
+            columns |= {"rate": self.rates, "woe": self.woe, "iv": self.iv}
+        frame: pd.DataFrame = pandas.DataFrame(columns)
+        return frame
+
+    def bin_numbers(self, values: Floats) -> Codes:
+        """The bin of each value, from 0; one past the last bin for a NaN. A value outside the range seen falls into an
+        outer bin. Of a categorical attribute the values are codes."""
+        return _values.bin_numbers(values, self.cut_points, self.closed)
+
+    def plot(self, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
+        """The share of each category of the target, bin by bin; a bin is as wide as its weight."""
+        from ._plots import plot_bins
+
+        return plot_bins(self, ax)
+
+    def __repr__(self) -> str:
+        against = f" against {self.target.name!r}" if self.target else ""
+        return f"<AttributeBins of {self.attribute!r}{against}: {self.labels if self.n_bins else self.status}>"
+
+
+def _restore_bins(text: str) -> AttributeBins:
+    core = read_bins(text)
+    tell_in_time_zones(core)
+    return AttributeBins(core.results[0])
+
+
+def tell_in_time_zones(core: _core.Bins) -> None:
+    """Words the borders of timestamps as people in their time zone read them, which the core can't."""
+    for index, found in enumerate(core.results):
+        if found.variable.time_zone:
+            core.set_border_texts(index, _word_borders(found))
+
+
+def _word_borders(found: _core.AttributeBins) -> list[str]:
+    """Those beyond all calendars stay numbers."""
+    stamps = [_values.decode(border, "timestamp", found.variable.time_zone) for border in found.borders.tolist()]
+    return [
+        str(stamp) if isinstance(stamp, datetime.datetime) else text for stamp, text in zip(stamps, found.border_texts)
+    ]
