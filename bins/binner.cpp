@@ -35,7 +35,7 @@ Binner::Found Binner::Find(std::string_view field)
     if (IsMissing(*value))
         return {};
     if (fBins.attribute->kind == VariableKind::kNumericCategorical)
-        return FindCategory(FormatNumber(*value)); // "1.0" is the category 1
+        return FindCategory(FormatCategoryNumber(*value)); // "1.0" is the category 1
     return {FindBin(fBins.cutPoints, fBins.isRightClosed, *value), false};
 }
 

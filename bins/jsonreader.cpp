@@ -104,7 +104,7 @@ private:
         {
             variable.categories.push_back(variable.kind == VariableKind::kStringCategorical
                                               ? category.GetString()
-                                              : FormatNumber(category.GetNumber()));
+                                              : FormatCategoryNumber(category.GetNumber()));
         }
     }
 

@@ -92,6 +92,11 @@ std::string FormatNumber(double value)
     return isPlain ? ToText(value, std::chars_format::fixed) : ToText(value);
 }
 
+std::string FormatCategoryNumber(double value)
+{
+    return FormatNumber(value + 0.0);
+}
+
 std::string FormatFigure(const std::optional<double>& figure)
 {
     return figure ? FormatNumber(*figure) : "none";

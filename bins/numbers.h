@@ -25,6 +25,9 @@ constexpr const char* kPlainNumbers = "numbers are written as in 1234.5, without
 /// The number in as few digits as read back to the same double. Infinities are "inf" and "-inf".
 std::string FormatNumber(double value);
 
+/// As FormatNumber, but for a category, as which the negative zero is 0.
+std::string FormatCategoryNumber(double value);
+
 /// As FormatNumber, but returns "none" for a figure that was not found.
 std::string FormatFigure(const std::optional<double>& figure);
 

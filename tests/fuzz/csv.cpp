@@ -131,7 +131,7 @@ std::string ToCategory(const Variable& target, std::string_view field)
 {
     const std::optional<double> number = ParseNumber(field);
     const bool isNumber = target.kind == VariableKind::kNumericCategorical && number;
-    return isNumber ? FormatNumber(*number + 0.0) : std::string(field);
+    return isNumber ? FormatCategoryNumber(*number) : std::string(field);
 }
 
 void Count(Recount& recount, const CsvRow& row)

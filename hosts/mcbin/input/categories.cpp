@@ -49,7 +49,7 @@ void Categories::AddNumbers(const Column& column)
         const double code = isMissing ? MCMV::gMissingValue : static_cast<double>(fNames.size());
         for (const std::string& field : fields) fCodes.emplace(field, code);
         if (!isMissing)
-            fNames.push_back(FormatNumber(number + 0.0)); // the negative zero is 0
+            fNames.push_back(FormatCategoryNumber(number));
     }
 }
 

@@ -60,7 +60,7 @@ std::shared_ptr<Variable> MakeVariable(const Field& field, bool isTarget)
     variable->timeZone = field.timeZone;
     variable->categories = field.texts.GetKeys(field.isComplete);
     for (const double number : field.numbers.GetKeys(field.isComplete))
-        variable->categories.push_back(FormatNumber(number));
+        variable->categories.push_back(FormatCategoryNumber(number));
     variable->rounding = field.rounding;
     variable->missingTexts = field.missingTexts.GetDiscreteValues();
     variable->missingNumbers = field.missingNumbers.GetDiscreteValues();

@@ -79,6 +79,7 @@ TEST(Numbers, AreWrittenInAsFewDigitsAsReadBack)
         EXPECT_EQ(c.value, ParseNumber(c.text));
     }
     EXPECT_EQ("none", FormatFigure(std::nullopt));
+    EXPECT_EQ("0", FormatCategoryNumber(-0.0));
 }
 
 TEST(Numbers, SignsAroundThemAreTold)
