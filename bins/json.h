@@ -10,7 +10,7 @@ struct JsonValue;
 
 // Bins as JSON, in the form that docs/json.md describes.
 
-/// What keeps a document from being one of bins: the place in it, such as "results[0].bins[2].left", and what is wrong
+/// What keeps a document from being one of bins: the path in it, such as "results[0].bins[2].left", and what is wrong
 /// there. Without the name of the file, which the host puts in front.
 class JsonFault : public std::runtime_error
 {
