@@ -11,8 +11,8 @@
 #include <utility>
 #include <vector>
 
-/// A value within a document, which it only points to, and its path, for messages. Every
-/// operation throws a JsonFault with that path where the value is not what is asked for.
+/// A value within a document, which it only points to, and its path, for messages. Every operation throws a JsonFault
+/// with that path where the value is not what is asked for.
 class JsonCursor
 {
 public:
