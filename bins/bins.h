@@ -111,6 +111,16 @@ struct Settings
     std::optional<double> smallBinRatio; ///< supervised: the ratio to the lighter neighbour below which a bin is merged
 };
 
+/// How records were reduced to groups of equal values, each with its weight, before they were binned; or why not.
+struct Reduction
+{
+    std::string engine;                  ///< what has reduced them; empty if they were binned one by one after all
+    std::string reason;                  ///< why the one or the other was chosen; empty if it was asked for
+    std::int64_t numQueries = 0;         ///< that the engine has run
+    bool isDistinctExact = true;         ///< otherwise the numbers of distinct values above `numGroups` are estimates
+    std::vector<std::int64_t> numGroups; ///< that were binned, by result
+};
+
 /// The bins of all attributes of a run.
 struct Bins
 {
@@ -123,6 +133,7 @@ struct Bins
     std::vector<std::shared_ptr<const Variable>> variables;
     MCBinning::MCStatus status;
     std::vector<AttributeBins> results; ///< in the order in which they were binned
+    std::optional<Reduction> reduction; ///< nothing where no reduction was thought of
 };
 
 #endif

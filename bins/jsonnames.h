@@ -26,6 +26,9 @@ inline constexpr Names<VariableRole, 3> kRoleNames = {
 inline constexpr Names<ValueKind, 3> kValueKindNames = {
     {"boolean", ValueKind::kBoolean}, {"date", ValueKind::kDate}, {"timestamp", ValueKind::kTimestamp}};
 
+/// Whether numbers of distinct values are exact.
+inline constexpr Names<bool, 2> kDistinctNames = {{"exact", true}, {"approximate", false}};
+
 /// The name of the value, or null if it has none.
 template<class Value, std::size_t kSize>
 const char* GetName(const std::pair<const char*, Value> (&names)[kSize], Value value)

@@ -27,6 +27,8 @@ public:
         fBins.status = ReadStatus(document.At("status"));
         for (const JsonCursor& result : document.At("results").GetElements())
             fBins.results.push_back(ReadResult(result));
+        if (const auto reduction = document.Find("reduction"))
+            fBins.reduction = ReadReduction(*reduction);
         return std::move(fBins);
     }
 
@@ -230,6 +232,22 @@ private:
                 bins[i].At("weights").Refuse("there must be a weight for each category of the target");
             left = right;
         }
+    }
+
+    Reduction ReadReduction(const JsonCursor& json) const
+    {
+        Reduction reduction;
+        if (const auto engine = json.Find("engine"))
+            reduction.engine = engine->GetString();
+        if (const auto reason = json.Find("reason"))
+            reduction.reason = reason->GetString();
+        reduction.numQueries = json.At("queries").GetInteger(0);
+        reduction.isDistinctExact = json.At("distinct").Choose(kDistinctNames);
+        for (const JsonCursor& count : json.At("groups").GetElements())
+            reduction.numGroups.push_back(count.GetInteger(0));
+        if (!reduction.engine.empty() && reduction.numGroups.size() != fBins.results.size())
+            json.At("groups").Refuse("there must be a number of groups for each result");
+        return reduction;
     }
 
     static int ReadInt(const JsonCursor& json) { return static_cast<int>(json.GetInteger(INT_MIN, INT_MAX)); }

@@ -115,6 +115,16 @@ JsonValue ToValue(const AttributeBins& result)
                   {"bins", bins}};
 }
 
+JsonValue ToValue(const Reduction& reduction)
+{
+    const auto textOrNull = [](const std::string& text) { return text.empty() ? JsonValue() : JsonValue(text); };
+    return Object{{"engine", textOrNull(reduction.engine)},
+                  {"reason", textOrNull(reduction.reason)},
+                  {"queries", reduction.numQueries},
+                  {"distinct", GetName(kDistinctNames, reduction.isDistinctExact)},
+                  {"groups", reduction.numGroups}};
+}
+
 } // namespace
 
 JsonValue MakeDocument(const Bins& bins)
@@ -132,6 +142,7 @@ JsonValue MakeDocument(const Bins& bins)
                                   {"records", bins.numRecords},
                                   {"records_without_weight", bins.numRecordsWithoutWeight},
                                   {"missing_text", bins.missingTexts}}},
+                  {"reduction", bins.reduction ? ToValue(*bins.reduction) : JsonValue()},
                   {"variables", variables},
                   {"status", ToValue(bins.status)},
                   {"results", results}};

@@ -1,6 +1,7 @@
 #include "bins/run.h"
 
 #include "bins/collect.h"
+#include "bins/gather.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 
@@ -67,14 +68,6 @@ void RunEqualFrequency(Bins& bins, BINVarList& variables, const std::vector<int>
     Collect<BINAttributeResults>(bins, status, *algorithm, host);
 }
 
-/// No result points to a weight, so the variable may be replaced.
-std::shared_ptr<const Variable> WithGrid(const Variable& weight, std::optional<double> step)
-{
-    auto variable = std::make_shared<Variable>(weight);
-    variable->weightGrid = step;
-    return variable;
-}
-
 } // namespace
 
 void RunBinning(Bins& bins, BINVarList& variables, const std::vector<int>* attributes, const std::vector<int>* targets,
@@ -84,9 +77,5 @@ void RunBinning(Bins& bins, BINVarList& variables, const std::vector<int>* attri
         RunSupervised(bins, variables, attributes, targets, host);
     else
         RunEqualFrequency(bins, variables, attributes, host);
-    for (std::shared_ptr<const Variable>& variable : bins.variables)
-    {
-        if (variable->role == VariableRole::kWeight)
-            variable = WithGrid(*variable, host.weightGrid->GetStep());
-    }
+    SetWeightGrid(bins, host.weightGrid->GetStep());
 }

@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <optional>
 #include <string_view>
+#include <utility>
 
 /// How a weight becomes a whole number, if it does.
 enum class WeightRounding
@@ -56,6 +57,9 @@ public:
 
     /// g, if a weight has moved because of it; nothing as long as all weights lay on the grid.
     std::optional<double> GetStep() const;
+
+    /// g as the product of two powers of two, of which each has an inverse among the doubles.
+    std::pair<double, double> GetFactors() const { return {fFactors[0], fFactors[1]}; }
 
 private:
     WeightRounding fRounding;

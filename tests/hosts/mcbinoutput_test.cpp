@@ -97,6 +97,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
   "method": "supervised",
   "settings": {"closed": "right", "n_bins": 1000, "max_distinct": null, "small_bin_ratio": 0},
   "data": {"name": "data.csv", "records": 4, "records_without_weight": 0, "missing_text": ["NA", "-9"]},
+  "reduction": null,
   "variables": [
     {
       "name": "x",

@@ -15,6 +15,7 @@ import pytest
 DOCUMENTED = [
     mb.supervised_bins,
     mb.equal_frequency_bins,
+    mb.query_source,
     mb.SupervisedBinner,
     mb.EqualFrequencyBinner,
     mb.BinningResult.transform,

@@ -10,6 +10,7 @@ from typing import Any as _Any
 
 from ._bins import AttributeBins
 from ._core import __version__
+from ._engines import query_source
 from ._errors import (
     BadBinTableWarning,
     BinningError,
@@ -48,6 +49,7 @@ __all__ = [
     "SupervisedBinner",
     "__version__",
     "equal_frequency_bins",
+    "query_source",
     "supervised_bins",
 ]
 

@@ -12,6 +12,9 @@ __version__: str
 _Status = tuple[int, str, tuple[int, int, int], tuple[float, float, float]]
 
 def temp_directory(named: str) -> str: ...
+def grid_factors(positive: int, largest: float) -> tuple[float, float]:
+    """The step of the grid of weights, of which so many are positive, as the product of two powers of two."""
+
 def status_words(code: int, is_warning: bool) -> str: ...
 def describe_not_json(line: int) -> str: ...
 
@@ -69,6 +72,15 @@ class AttributeBins:
     def alone(self) -> Bins:
         """As the only result of a run."""
 
+class Reduction:
+    engine: str
+    reason: str
+    queries: int
+    is_distinct_exact: bool
+    groups: list[int]
+
+    def __init__(self, engine: str, reason: str, queries: int, is_distinct_exact: bool, groups: list[int]) -> None: ...
+
 class Bins:
     component_version: str
     method: str
@@ -79,6 +91,7 @@ class Bins:
     data_name: str | None
     records: int | None
     records_without_weight: int | None
+    reduction: Reduction | None
     missing_text: list[str]
     variables: list[Variable]
     status: _Status
@@ -89,6 +102,9 @@ class Bins:
         """From the values of a JSON text, with its objects as tuples of pairs. Raises a ValueError that begins with the
         name of the document."""
     def set_border_texts(self, index: int, texts: list[str]) -> None: ...
+    def set_weight_grid(self, step: float | None) -> None: ...
+    def add_part(self, part: Bins, attribute: int, target: int, n_distinct: int | None = None) -> None:
+        """Adds what a run of one attribute has found, with the indices that it and its target, or -1, have here."""
     def columns(self, taken: list[str]) -> list[tuple[int, str]]:
         """Of each column of bins the index of its result, and its name."""
     def to_json(self) -> str: ...
@@ -117,6 +133,18 @@ class Feed:
     def set_weights(self, weights: tuple[int, float]) -> None: ...
     def read(self, max_rows: int) -> list[_Floats]: ...
     def spool(self, directory: str) -> None: ...
+    def describe(
+        self,
+        *,
+        has_targets: bool,
+        target: int | None = None,
+        n_bins: int,
+        max_distinct: int | None = None,
+        small_bin_ratio: float | None = None,
+        right_closed: bool,
+        data_name: str | None = None,
+    ) -> Bins:
+        """The bins of a run before it has found any."""
     def bin(
         self,
         attributes: list[int],

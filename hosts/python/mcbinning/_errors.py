@@ -34,14 +34,14 @@ class DataError(ValueError):
 
 
 class StreamError(RuntimeError):
-    """The stream that the data came from failed, behind `row` rows."""
+    """The stream or the engine of the data failed. `row` rows had come by then; None if that is not known."""
 
-    def __init__(self, message: str, row: int) -> None:
-        super().__init__(f"the stream failed behind {row} rows: {message}")
+    def __init__(self, message: str, row: int | None = None) -> None:
+        super().__init__(message if row is None else f"the stream failed behind {row} rows: {message}")
         self.message = message
         self.row = row
 
-    def __reduce__(self) -> tuple[type[StreamError], tuple[str, int]]:
+    def __reduce__(self) -> tuple[type[StreamError], tuple[str, int | None]]:
         return type(self), (self.message, self.row)
 
 

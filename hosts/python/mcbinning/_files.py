@@ -9,14 +9,18 @@ import numbers
 import os
 import re
 from collections.abc import Callable, Iterator, Mapping, Sequence
-from dataclasses import dataclass, field
-from typing import Any, Literal
+from dataclasses import dataclass, field, replace
+from typing import TYPE_CHECKING, Any, Literal
 
 from . import _core
 from ._errors import DataError, StreamError
 from ._features import require
+from ._shapes import quote_name, quote_text
 from ._sources import Source, columns_of, open_batches, open_stream
 from ._types import MemoryLimit
+
+if TYPE_CHECKING:
+    from ._engines import Engine
 
 _FILE_FUNCTIONS = {
     ".parquet": "read_parquet",
@@ -44,12 +48,13 @@ def open_relation(relation: Any, name: str | None = None, explain: Callable[[str
         False,
         name=name,
         describe=lambda: columns_of(_guard(lambda: open_stream(relation.limit(0)), explain)),
+        open_engine=lambda: _reduce(relation),
     )
 
 
 def _read(relation: Any, names: Sequence[str] | None, explain: Callable[[str], str] | None) -> _core.Table:
     """In small batches: DuckDB holds several, and those of wide tables are large."""
-    chosen = relation if names is None else relation.project(_quote_all(names))
+    chosen = relation if names is None else relation.project(", ".join(map(quote_name, names)))
     begin = getattr(chosen, "to_arrow_reader", None) or chosen.fetch_record_batch
     return open_stream(begin(_ROWS_AT_ONCE), explain)
 
@@ -64,14 +69,6 @@ def _guard(start: Callable[[], _core.Table], explain: Callable[[str], str] | Non
         raise StreamError(explain(str(error)) if explain else str(error), 0) from error
 
 
-def _quote(name: str) -> str:
-    return '"' + name.replace('"', '""') + '"'
-
-
-def _quote_all(names: Sequence[str]) -> str:
-    return ", ".join(map(_quote, names))
-
-
 @dataclass(frozen=True)
 class Reading:
     """How files are read."""
@@ -81,6 +78,10 @@ class Reading:
     missing_texts: Mapping[str, Sequence[str]] = field(default_factory=dict)
     """And so does each of these, by the name of the column, in a column of numbers."""
     memory_limit: MemoryLimit | None = None
+    threads: int | None = None
+    """Of an engine that reduces them; None: one for each core that the process may use."""
+    temp_dir: str | os.PathLike[str] | None = None
+    """Of such an engine."""
 
 
 def open_paths(paths: Sequence[str], reading: Reading) -> Source:
@@ -129,17 +130,39 @@ def _open_with_duckdb(paths: Sequence[str], name: str, reading: Reading, limit: 
     is_text = function == "read_csv"
     options = {"na_values": ["", *reading.missing_text]} if reading.missing_text and is_text else {}
     files = paths[0] if len(paths) == 1 else list(paths)
-    try:
+
+    def relate(connection: Any) -> Any:
         # A method, as a query with parameters is run at once and kept whole by older versions.
-        connection = _connect(limit, is_local=not any("://" in path for path in paths))
         read = getattr(connection, function)
         relation = read(files, **options)
         typed = {column: "VARCHAR" for column in relation.columns if column in reading.missing_texts}
         if typed and is_text:
             relation = _blank_texts(read(files, dtype=typed, **options), reading.missing_texts)
+        return relation
+
+    try:
+        source = open_relation(
+            relate(_connect(limit, is_local=not any("://" in path for path in paths))), name, explain
+        )
     except duckdb.Error as error:
         raise DataError(f"{name} can't be read: {explain(str(error))}") from error
-    return open_relation(relation, name, explain)
+    return replace(
+        source, open_engine=lambda: _reduce_files(relate, function != "read_parquet", reading, limit, explain)
+    )
+
+
+def _reduce(relation: Any) -> Engine:
+    from ._duckdb import DuckEngine
+
+    return DuckEngine(relation)
+
+
+def _reduce_files(
+    relate: Callable[[Any], Any], is_parsed: bool, reading: Reading, limit: int | None, explain: Callable[[str], str]
+) -> Engine:
+    from ._duckdb import FileEngine
+
+    return FileEngine(relate, is_parsed, reading.threads, limit, reading.temp_dir, explain)
 
 
 def _blank_texts(relation: Any, missing_texts: Mapping[str, Sequence[str]]) -> Any:
@@ -147,8 +170,8 @@ def _blank_texts(relation: Any, missing_texts: Mapping[str, Sequence[str]]) -> A
     only for all columns."""
 
     def select(name: str) -> str:
-        column = _quote(name)
-        texts = ", ".join("'" + text.replace("'", "''") + "'" for text in missing_texts.get(name, ()))
+        column = quote_name(name)
+        texts = ", ".join(map(quote_text, missing_texts.get(name, ())))
         number = f"CAST(CASE WHEN trim({column}) IN ({texts}) THEN NULL ELSE {column} END AS DOUBLE) AS {column}"
         return number if texts else column
 

@@ -10,11 +10,12 @@ from ._files import Reading
 from ._opening import open_source
 from ._outcome import make_result
 from ._plan import Plan, columns_left_out, name_missing, names_to_bin
-from ._progress import Progress, reporting
+from ._progress import Progress
 from ._result import BinningResult
-from ._settings import check_settings, directory_of
+from ._runs import run
+from ._settings import Reducing, RunSettings, check_settings, directory_of
 from ._sources import name_of
-from ._types import Closed, MemoryLimit, Missing, Rounding
+from ._types import Closed, Distinct, MemoryLimit, Missing, Reduce, Rounding
 
 
 def supervised_bins(
@@ -30,7 +31,11 @@ def supervised_bins(
     closed: Closed = "right",
     small_bin_ratio: float = 0.0,
     rounding: Rounding = "none",
+    reduce: Reduce | None = None,
+    max_groups: int = 20_000_000,
+    distinct: Distinct = "exact",
     memory_limit: MemoryLimit | None = None,
+    threads: int | None = None,
     temp_dir: str | os.PathLike[str] | None = None,
     progress: Progress = False,
 ) -> BinningResult:
@@ -45,7 +50,7 @@ def supervised_bins(
         A pandas or polars frame, a polars LazyFrame, a DuckDB relation, anything of pyarrow's or with
         `__arrow_c_stream__`; or the path of a CSV, JSON, Parquet or Arrow IPC file, which may be a pattern such as
         "data/*.parquet", or several paths of files of one form. Data that can be read only once go through a nameless
-        temporary file.
+        temporary file. A Spark frame, or what `query_source` gives, stays where it is: its engine reduces it.
     target : str, default=None
         The column whose categories are separated; at least 2 and at most 256. Its missing values leave a record out.
         Required without `pairs`.
@@ -74,15 +79,31 @@ def supervised_bins(
         Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
         two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
         Among a million records a weight moves by less than one part in 10^9 of the largest.
+    reduce : {"rows", "engine", "auto"}, default=None
+        Where the records become groups of equal values, of which the bins are made; these are the same to the last bit.
+        "rows": all rows are read, as they are by default. "engine": the engine of the data sums the weights of each
+        value and category, and tells these alone, as it does by default with Spark and `query_source`; DuckDB does it
+        with its relations and the files that it reads. "auto": what is likely to be cheaper; the result's `reduction`
+        tells the reason.
+    max_groups : int, default=20000000
+        The most groups that may come from an engine for one attribute. An attribute that is pre-binned may have any
+        number of values, as they are told one by one only where a pre-bin may end.
+    distinct : {"exact", "approximate"}, default="exact"
+        How an engine counts the values of an attribute with more than `max_groups`: an exact count is the dearest of
+        its queries, and nothing but `n_distinct`, and whether the attribute is pre-binned, depends on it.
     memory_limit : int or str, default=None
         The most memory that the reading of a file may take, in bytes, or as a text such as "512MB" or "2GiB". None:
         what the machine has. One batch of the columns that are read has to fit: of Parquet a page of each column, of
-        CSV some 100 MB. The library itself takes 16 bytes for each row, twice while it sorts. Only with a path.
+        CSV some 100 MB. The library itself takes 16 bytes for each row, twice while it sorts; with `reduce="engine"`
+        for each group, and DuckDB keeps in files what exceeds the limit. Only with a path.
+    threads : int, default=None
+        Those of DuckDB, where it reduces files. None: as many as the process may use.
     temp_dir : path, default=None
         The directory of the temporary files, 8 bytes for each row and column. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
-        Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
-        number of records read or the index of the variable that is done.
+        Whether to show progress bars; or a function that is called with the phase and a number: "records" and how many
+        were read, "attributes" and the index of the variable that is done, or "query" and how much of an engine's query
+        is done, in percent.
 
     Returns
     -------
@@ -128,27 +149,16 @@ def supervised_bins(
     if pairs is not None and attributes is not None:
         raise TypeError("pairs name the attributes, so attributes can't be given, too")
     check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding)
-    source = open_source(data, Reading(memory_limit=memory_limit))
+    reducing = Reducing(reduce, max_groups, distinct)
+    source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
     target, weight = (None if label is None else name_of(label) for label in (target, weight))
     if pairs is not None:
         wanted = list(dict.fromkeys((name_of(attribute), name_of(category)) for attribute, category in pairs))
     else:
         wanted = [(name, target) for name in names_to_bin(source, attributes, [target, weight])]
     plan = Plan(source, wanted, target, weight, name_missing(missing), rounding)
-    feed = plan.open_feed(directory_of(temp_dir))
-    with reporting(progress, plan.names, len(wanted), source.rows) as report:
-        bins = feed.bin(
-            [plan.names.index(attribute) for attribute, _ in wanted],
-            [plan.names.index(category) for _, category in wanted],
-            target=None if target is None else plan.names.index(target),
-            n_bins=n_bins,
-            max_distinct=max_distinct,
-            small_bin_ratio=small_bin_ratio,
-            right_closed=closed == "right",
-            data_name=source.name,
-            temp_dir=directory_of(temp_dir),
-            progress=report,
-        )
+    settings = RunSettings(n_bins, max_distinct, small_bin_ratio, closed == "right", directory_of(temp_dir))
+    bins = run(plan, settings, reducing, progress)
     left_out = columns_left_out(source, plan.names) if attributes is None and pairs is None else None
     return make_result(bins, left_out)
 
@@ -162,7 +172,11 @@ def equal_frequency_bins(
     n_bins: int = 10,
     closed: Closed = "right",
     rounding: Rounding = "none",
+    reduce: Reduce | None = None,
+    max_groups: int = 20_000_000,
+    distinct: Distinct = "exact",
     memory_limit: MemoryLimit | None = None,
+    threads: int | None = None,
     temp_dir: str | os.PathLike[str] | None = None,
     progress: Progress = False,
 ) -> BinningResult:
@@ -173,7 +187,7 @@ def equal_frequency_bins(
     data : table, stream, path or list of paths
         A pandas or polars frame, a polars LazyFrame, a DuckDB relation, anything of pyarrow's or with
         `__arrow_c_stream__`; or the path of a CSV, JSON, Parquet or Arrow IPC file, which may be a pattern such as
-        "data/*.parquet", or several paths of files of one form.
+        "data/*.parquet", or several paths of files of one form; or a Spark frame, or what `query_source` gives.
     attributes : sequence of str, default=None
         The columns to cut. None: all of numbers, booleans, dates and timestamps; other ones are left out, and the
         result's `left_out` names them. A column of text that is named is cut between sets of its categories.
@@ -191,14 +205,23 @@ def equal_frequency_bins(
         Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
         two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
         Among a million records a weight moves by less than one part in 10^9 of the largest.
+    reduce : {"rows", "engine", "auto"}, default=None
+        Whether an engine reduces the records; see `supervised_bins`.
+    max_groups : int, default=20000000
+        The most groups that may come from an engine for one attribute, which may have any number of values.
+    distinct : {"exact", "approximate"}, default="exact"
+        How an engine counts the values of an attribute with more than `max_groups`.
     memory_limit : int or str, default=None
         The most memory that the reading of a file may take, in bytes, or as a text such as "512MB" or "2GiB". None:
         what the machine has. Only with a path; see `supervised_bins`.
+    threads : int, default=None
+        Those of DuckDB, where it reduces files. None: as many as the process may use.
     temp_dir : path, default=None
         The directory of the temporary files, 8 bytes for each row and column. None: TMPDIR, else /tmp.
     progress : bool or callable, default=False
-        Whether to show progress bars; or a function that is called with the phase, "records" or "attributes", and the
-        number of records read or the index of the variable that is done.
+        Whether to show progress bars; or a function that is called with the phase and a number: "records" and how many
+        were read, "attributes" and the index of the variable that is done, or "query" and how much of an engine's query
+        is done, in percent.
 
     Returns
     -------
@@ -226,18 +249,11 @@ def equal_frequency_bins(
     [25.0, 25.0, 25.0, 25.0]
     """
     check_settings(closed, n_bins, rounding=rounding)
-    source = open_source(data, Reading(memory_limit=memory_limit))
+    reducing = Reducing(reduce, max_groups, distinct)
+    source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
     weight = None if weight is None else name_of(weight)
     names = names_to_bin(source, attributes, [weight])
     plan = Plan(source, [(name, None) for name in names], None, weight, name_missing(missing), rounding)
-    feed = plan.open_feed(directory_of(temp_dir))
-    with reporting(progress, plan.names, len(names), source.rows) as report:
-        bins = feed.bin(
-            [plan.names.index(name) for name in names],
-            n_bins=n_bins,
-            right_closed=closed == "right",
-            data_name=source.name,
-            temp_dir=directory_of(temp_dir),
-            progress=report,
-        )
+    settings = RunSettings(n_bins, None, None, closed == "right", directory_of(temp_dir))
+    bins = run(plan, settings, reducing, progress)
     return make_result(bins, columns_left_out(source, plan.names) if attributes is None else None)

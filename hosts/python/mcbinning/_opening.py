@@ -14,6 +14,8 @@ _PLAIN = Reading()
 
 def open_source(data: Any, reading: Reading = _PLAIN) -> Source:
     """Any object with the Arrow stream protocol, a polars LazyFrame, a path or several."""
+    if isinstance(data, Source):
+        return data
     if is_path(data):
         return open_paths([os.fspath(data)], reading)
     if isinstance(data, (list, tuple)) and data and all(map(is_path, data)):

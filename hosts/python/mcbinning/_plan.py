@@ -97,7 +97,7 @@ class Plan:
 
     def open_feed(self, directory: str) -> _core.Feed:
         """A feed that knows all categories and what the weights are like."""
-        categorical = [name for name in self.names if self._use(name) == "category"]
+        categorical = self.categorical
         to_learn = categorical if self.weight is None else [*categorical, self.weight]
         if not to_learn:
             return self._make_feed(self.names)
@@ -114,42 +114,49 @@ class Plan:
             indices = {name: i for i, name in enumerate(categorical)}
         for name in categorical:
             categories = known.categories(indices[name])
-            self._check_categories(name, categories)
+            self.check_categories(name, categories)
             if known is not feed:
                 feed.set_categories(self.names.index(name), categories)
         return feed
 
-    def _column(self, name: str) -> Column:
+    @property
+    def categorical(self) -> list[str]:
+        return [name for name in self.names if self._use(name) == "category"]
+
+    def column(self, name: str) -> Column:
         return next(column for column in self.source.columns if column.name == name)
 
     def _use(self, name: str) -> str:
         if name == self.weight:
             return "weight"
-        column = self._column(name)
+        column = self.column(name)
         is_category = name in self.targets or column.kind == "text" or column.is_ordered
         return "category" if is_category else "attribute"
 
-    def _missing(self, name: str) -> tuple[tuple[Any, ...], tuple[float, float] | None]:
+    def missing_of(self, name: str) -> tuple[tuple[Any, ...], tuple[float, float] | None]:
         try:
-            return parse_missing(self.missing.get(name, []), self._column(name).kind)
+            return parse_missing(self.missing.get(name, []), self.column(name).kind)
         except (TypeError, ValueError, OverflowError) as error:
             raise DataError(f"what is declared missing can't be used: {error}", name) from error
 
     def _make_feed(self, names: list[str]) -> _core.Feed:
-        table = self.source.open(names)
+        return self.make_feed(names, self.source.open(names))
+
+    def make_feed(self, names: list[str], table: _core.Table) -> _core.Feed:
+        """The columns of these names, out of a table that may have further ones."""
         places = [fields[0] for fields in table.columns]
         feed = _core.Feed(table)
         for index, name in enumerate(names):
             feed.add_field(name, self._use(name), column=places.index(name), rounding=self.rounding)
-            values, interval = self._missing(name)
-            is_text = self._column(name).kind == "text"
+            values, interval = self.missing_of(name)
+            is_text = self.column(name).kind == "text"
             feed.declare_missing(index, [] if is_text else list(values), interval, list(values) if is_text else [])
         return feed
 
-    def _check_categories(self, name: str, categories: list[Any]) -> None:
+    def check_categories(self, name: str, categories: list[Any]) -> None:
         if len(categories) == 0:
             raise DataError("no row has a category: the data are empty, or all is missing", name)
         if len(categories) == 1:
-            column = self._column(name)
+            column = self.column(name)
             category = categories[0] if column.kind == "text" else _values.decode(categories[0], column.kind)
             raise DataError(f"there is a single category, {category!r}; at least 2 are needed", name)

@@ -8,7 +8,8 @@ from typing import Any
 
 from ._features import require
 
-Progress = bool | Callable[[str, int], None]
+Report = Callable[[str, int], None]
+Progress = bool | Report
 """Whether to show progress bars, or a function that is called with the phase, `"records"` or `"attributes"`, and the
 number of records read or the place of the attribute just done among the variables."""
 
@@ -40,9 +41,7 @@ class _Bars:
 
 
 @contextmanager
-def reporting(
-    progress: Progress, names: list[str], total: int, rows: int | None = None
-) -> Iterator[Callable[[str, int], None] | None]:
+def reporting(progress: Progress, names: list[str], total: int, rows: int | None = None) -> Iterator[Report | None]:
     """What to call while a run goes on. `total` attributes are binned, and `names` are those of all variables."""
     if callable(progress):
         yield progress

@@ -15,7 +15,7 @@ from ._features import require
 from ._json import read_bins
 from ._sources import name_of
 from ._status import Status
-from ._types import Closed, MemoryLimit, Method, Unseen
+from ._types import Closed, Distinct, MemoryLimit, Method, Unseen
 
 if TYPE_CHECKING:
     import matplotlib.axes
@@ -30,6 +30,24 @@ class Settings:
     n_bins: int
     max_distinct: int | None
     small_bin_ratio: float | None
+
+
+@dataclass(frozen=True)
+class Reduction:
+    """How an engine reduced the rows to groups of equal values; or why it did not."""
+
+    engine: str | None
+    """None where the rows were read after all."""
+    reason: str | None
+    """Why the engine or the rows were chosen; None if they were asked for."""
+    queries: int
+    """That the engine ran."""
+    distinct: Distinct
+    """Whether the number of distinct values of an attribute with very many is exact."""
+    groups: Mapping[Any, int]
+    """By the result's keys: how many groups were binned."""
+    weight_grid: float | None
+    """Of what the weights were made multiples; None if none had to move."""
 
 
 class BinningResult(Mapping[Any, AttributeBins]):
@@ -65,6 +83,16 @@ class BinningResult(Mapping[Any, AttributeBins]):
         """Of what the weights were made multiples, so that every sum of them is exact; None where all weights were such
         multiples, and without weights."""
         return next((variable.grid for variable in self.variables if variable.role == "weight"), None)
+
+    @property
+    def reduction(self) -> Reduction | None:
+        """How the rows were reduced by an engine; None where that was not thought of."""
+        core = self._core.reduction
+        if core is None:
+            return None
+        groups = dict(zip(self, core.groups))
+        distinct: Distinct = "exact" if core.is_distinct_exact else "approximate"
+        return Reduction(core.engine or None, core.reason or None, core.queries, distinct, groups, self.weight_grid)
 
     def __getitem__(self, key: Any) -> AttributeBins:
         for found in self.bins:

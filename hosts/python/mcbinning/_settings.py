@@ -4,13 +4,47 @@ from __future__ import annotations
 
 import numbers
 import os
+from dataclasses import dataclass
 from typing import Any
 
 from . import _core
 from ._errors import BinningError
 from ._status import TEMP_DIR_NOT_FOUND, Status
+from ._types import Distinct, Reduce
 
 _LARGEST_INT = 2**31 - 1
+
+
+@dataclass(frozen=True)
+class RunSettings:
+    """How the attributes are binned."""
+
+    n_bins: int
+    max_distinct: int | None
+    small_bin_ratio: float | None
+    right_closed: bool
+    temp_dir: str
+
+    @property
+    def keywords(self) -> dict[str, Any]:
+        """Of the core's operations."""
+        return {name: getattr(self, name) for name in ("n_bins", "max_distinct", "small_bin_ratio", "right_closed")}
+
+
+@dataclass(frozen=True)
+class Reducing:
+    """Whether the rows are reduced, and how far."""
+
+    reduce: Reduce | None
+    max_groups: int
+    distinct: Distinct
+
+    def __post_init__(self) -> None:
+        if self.reduce not in (None, "rows", "engine", "auto"):
+            raise ValueError(f"reduce must be 'rows', 'engine' or 'auto', not {self.reduce!r}")
+        if self.distinct not in ("exact", "approximate"):
+            raise ValueError(f"distinct must be 'exact' or 'approximate', not {self.distinct!r}")
+        check_whole("max_groups", self.max_groups, 1)
 
 
 def check_settings(
@@ -18,16 +52,16 @@ def check_settings(
 ) -> None:
     if closed not in ("right", "left"):
         raise ValueError(f"closed must be 'right' or 'left', not {closed!r}")
-    _check_whole("n_bins", n_bins, 2)
+    check_whole("n_bins", n_bins, 2)
     if max_distinct is not None:
-        _check_whole("max_distinct", max_distinct, 1)
+        check_whole("max_distinct", max_distinct, 1)
     if not 0.0 <= small_bin_ratio <= 1.0:
         raise ValueError(f"small_bin_ratio must be from 0 to 1, not {small_bin_ratio}")
     if rounding not in ("none", "truncate", "closest"):
         raise ValueError(f"rounding must be 'none', 'truncate' or 'closest', not {rounding!r}")
 
 
-def _check_whole(name: str, value: Any, least: int) -> None:
+def check_whole(name: str, value: Any, least: int) -> None:
     if not isinstance(value, numbers.Integral) or not least <= int(value) <= _LARGEST_INT:
         raise ValueError(f"{name} must be a whole number of at least {least}, not {value!r}")
 

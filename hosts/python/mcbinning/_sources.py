@@ -5,10 +5,13 @@ from __future__ import annotations
 from collections.abc import Callable, Sequence
 from dataclasses import dataclass
 from functools import cached_property
-from typing import Any
+from typing import TYPE_CHECKING, Any
 
 from . import _core
 from ._errors import DataError
+
+if TYPE_CHECKING:
+    from ._engines import Engine
 
 
 @dataclass(frozen=True)
@@ -36,6 +39,10 @@ class Source:
     """How many there are, where that is known."""
     describe: Callable[[], Sequence[Column]] | None = None
     """Returns the columns, where that is cheaper than to open them all."""
+    open_engine: Callable[[], Engine] | None = None
+    """Returns what can reduce the data where they are, if there is such a thing."""
+    is_reduced: bool = False
+    """It is, unless rows are asked for."""
 
     @cached_property
     def columns(self) -> tuple[Column, ...]:

@@ -32,7 +32,7 @@ def write(core: _core.Bins, dialect: str, table: str | None, labels: bool) -> st
     name = next(name for name, kind in sqlglot.Dialect.classes.items() if kind is type(known))
     columns = core.to_sql(True, labels)
     tree = sqlglot.parse_one(f"SELECT *{_behind_comma(columns)}", read="duckdb")
-    found = [_tell_nan(column, name) for column in tree.expressions[1:]]
+    found = [tell_nan(column, name) for column in tree.expressions[1:]]
     if table is None:
         return ",\n".join(column.sql(dialect=dialect, pretty=True) for column in found) + "\n"
     tree = sqlglot.select("*", *found).from_(sqlglot.exp.to_table(table))
@@ -43,17 +43,19 @@ def _behind_comma(columns: str) -> str:
     return ",\n" + columns.rstrip("\n") if columns else ""
 
 
-def _tell_nan(column: Any, dialect: str) -> Any:
-    """With the dialect's own conditions for a NaN, where it can tell one."""
+def tell_nan(tree: Any, dialect: str) -> Any:
+    """SQL with the dialect's own conditions for a NaN. Where it can't tell one, no value is a NaN."""
     from sqlglot import exp
 
-    for node in list(column.find_all(exp.IsNan)):
+    for node in list(tree.find_all(exp.IsNan)):
         condition = _nan_condition(node.this, dialect)
         if condition is not None:
             node.replace(condition)
-        else:
+        elif isinstance(node.parent, exp.Or):
             node.parent.replace(node.parent.this)  # "x IS NULL" is what stands before it
-    return column
+        else:
+            node.replace(exp.false())
+    return tree
 
 
 def _nan_condition(column: Any, dialect: str) -> Any:

@@ -6,8 +6,10 @@ from collections.abc import Mapping
 from typing import Any, Literal
 
 Closed = Literal["right", "left"]
+Distinct = Literal["exact", "approximate"]
 Encode = Literal["ordinal", "onehot", "interval"]
 MissingOutput = Literal["code", "keep"]
+Reduce = Literal["rows", "engine", "auto"]
 Rounding = Literal["none", "truncate", "closest"]
 Unseen = Literal["error", "missing"]
 Method = Literal["supervised", "equal-frequency"]

@@ -2,6 +2,7 @@
 
 #include "bins/bins.h"
 #include "bins/csv.h"
+#include "bins/gather.h"
 #include "bins/json.h"
 #include "bins/jsonbuilder.h"
 #include "bins/jsonnames.h"
@@ -237,12 +238,25 @@ void BindAttributeBins(nb::module_& module)
         .def("alone", &MakeAlone);
 }
 
+void BindReduction(nb::module_& module)
+{
+    nb::class_<Reduction>(module, "Reduction")
+        .def(nb::init<std::string, std::string, std::int64_t, bool, std::vector<std::int64_t>>(), "engine"_a,
+             "reason"_a, "queries"_a, "is_distinct_exact"_a, "groups"_a)
+        .def_ro("engine", &Reduction::engine)
+        .def_ro("reason", &Reduction::reason)
+        .def_ro("queries", &Reduction::numQueries)
+        .def_ro("is_distinct_exact", &Reduction::isDistinctExact)
+        .def_ro("groups", &Reduction::numGroups);
+}
+
 } // namespace
 
 void BindBins(nb::module_& module)
 {
     BindVariable(module);
     BindAttributeBins(module);
+    BindReduction(module);
     using Self = const Bins&;
     nb::class_<Bins>(module, "Bins")
         .def_static("read", &ReadDocument, "document"_a.none(), "name"_a)
@@ -253,14 +267,17 @@ void BindBins(nb::module_& module)
         .def_prop_ro("max_distinct", [](Self self) { return self.settings.maxDistinct; })
         .def_prop_ro("small_bin_ratio", [](Self self) { return self.settings.smallBinRatio; })
         .def_ro("data_name", &Bins::dataName)
-        .def_ro("records", &Bins::numRecords)
-        .def_ro("records_without_weight", &Bins::numRecordsWithoutWeight)
+        .def_rw("records", &Bins::numRecords, nb::arg().none())
+        .def_rw("records_without_weight", &Bins::numRecordsWithoutWeight, nb::arg().none())
+        .def_rw("reduction", &Bins::reduction, nb::arg().none())
         .def_ro("missing_text", &Bins::missingTexts)
         .def_prop_ro("variables", &GetVariables)
         .def_prop_ro("status", [](Self self) { return ToTuple(self.status); })
         .def_ro("results", &Bins::results, nb::rv_policy::copy)
         .def("set_border_texts", [](Bins& self, std::size_t index, std::vector<std::string> texts)
              { self.results.at(index).borderTexts = std::move(texts); })
+        .def("set_weight_grid", &SetWeightGrid, "step"_a.none())
+        .def("add_part", &AddPart, "part"_a, "attribute"_a, "target"_a, "n_distinct"_a.none() = nb::none())
         .def("columns", &GetBinColumns, "taken"_a)
         .def("to_json", &ToJson)
         .def("to_csv", &ToCsv)

@@ -239,6 +239,16 @@ nb::list Feed::Read(std::size_t maxRows)
     return arrays;
 }
 
+Bins Feed::Describe(const Settings& settings, std::optional<int> target,
+                    const std::optional<std::string>& dataName) const
+{
+    Bins bins;
+    bins.settings = settings;
+    bins.dataName = dataName;
+    bins.variables = MakeVariables(fFields, target);
+    return bins;
+}
+
 Bins Feed::Bin(const Settings& settings, const RunRequest& request, const std::optional<std::string>& dataName,
                const nb::object& progress)
 {
@@ -251,9 +261,7 @@ Bins Feed::Bin(const Settings& settings, const RunRequest& request, const std::o
         tally.rounding = fFields[*index].rounding;
     LibraryBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table, fFields, tally);
     Interrupts interrupts;
-    Bins bins;
-    bins.settings = settings;
-    bins.dataName = dataName;
+    Bins bins = Describe(settings, request.target, dataName);
     {
         const nb::gil_scoped_release released;
         BinFields(bins, fFields, blocks, request, progress, interrupts);

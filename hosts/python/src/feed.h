@@ -65,6 +65,11 @@ public:
     /// missing. The arrays are empty at the end.
     nanobind::list Read(std::size_t maxRows);
 
+    /// The bins of a run before it has found any: what is known of the fields.
+    /// \param target the index of the field that is the target of all attributes, if they have one.
+    Bins Describe(const Settings& settings, std::optional<int> target,
+                  const std::optional<std::string>& dataName) const;
+
     /// \param progress is called with a phase and an index, or None.
     Bins Bin(const Settings& settings, const RunRequest& request, const std::optional<std::string>& dataName,
              const nanobind::object& progress);

@@ -40,6 +40,21 @@ Bins BinFeed(Feed& feed, std::vector<int> attributes, std::optional<std::vector<
     return feed.Bin({method, isRightClosed, numBins, maxDistinct, smallBinRatio}, request, dataName, progress);
 }
 
+/// The bins that BinFeed() would give, without a result. `hasTargets` tells whether the run is supervised.
+Bins DescribeFeed(const Feed& feed, bool hasTargets, std::optional<int> target, int numBins,
+                  std::optional<int> maxDistinct, std::optional<double> smallBinRatio, bool isRightClosed,
+                  const std::optional<std::string>& dataName)
+{
+    const Method method = hasTargets ? Method::kSupervised : Method::kEqualFrequency;
+    return feed.Describe({method, isRightClosed, numBins, maxDistinct, smallBinRatio}, target, dataName);
+}
+
+/// The step of the grid of weights, of which so many are positive, as the product of two powers of two.
+std::pair<double, double> GetGridFactors(std::int64_t numPositive, double largest)
+{
+    return WeightGrid({WeightRounding::kNone, numPositive, largest}).GetFactors();
+}
+
 /// A tuple for each column: name, kind of values, time zone, whether it can be used, and whether it is a dictionary that
 /// declares the order of its values.
 nb::list DescribeColumns(const Table& table)
@@ -94,6 +109,7 @@ NB_MODULE(_core, module)
     module.attr("__version__") = MCBINNING_VERSION;
     // Raises a RuntimeError, with words for the user, where TMPDIR is set and can't be used.
     module.def("temp_directory", [](const std::string& named) { return ChooseTempDirectory(named, "temp_dir="); });
+    module.def("grid_factors", &GetGridFactors, "positive"_a, "largest"_a);
     BindBins(module);
 
     nb::class_<Table>(module, "Table")
@@ -122,6 +138,9 @@ NB_MODULE(_core, module)
         .def("learn", &Feed::Learn)
         .def("read", &Feed::Read, "max_rows"_a)
         .def("spool", &Feed::SpoolRecords, "directory"_a)
+        .def("describe", &DescribeFeed, nb::kw_only(), "has_targets"_a, "target"_a.none() = nb::none(), "n_bins"_a,
+             "max_distinct"_a.none() = nb::none(), "small_bin_ratio"_a.none() = nb::none(), "right_closed"_a,
+             "data_name"_a.none() = nb::none())
         .def("bin", &BinFeed, "attributes"_a, "targets"_a.none() = nb::none(), nb::kw_only(),
              "target"_a.none() = nb::none(), "n_bins"_a, "max_distinct"_a.none() = nb::none(),
              "small_bin_ratio"_a.none() = nb::none(), "right_closed"_a, "data_name"_a.none() = nb::none(), "temp_dir"_a,

@@ -70,11 +70,17 @@ std::shared_ptr<Variable> MakeVariable(const Field& field, bool isTarget)
 
 } // namespace
 
+std::vector<std::shared_ptr<const Variable>> MakeVariables(const std::vector<Field>& fields, std::optional<int> target)
+{
+    std::vector<std::shared_ptr<const Variable>> variables;
+    for (std::size_t i = 0; i < fields.size(); ++i)
+        variables.push_back(MakeVariable(fields[i], target == static_cast<int>(i)));
+    return variables;
+}
+
 void BinFields(Bins& bins, const std::vector<Field>& fields, LibraryBlocks& blocks, const RunRequest& request,
                const nanobind::object& progress, Interrupts& interrupts)
 {
-    for (std::size_t i = 0; i < fields.size(); ++i)
-        bins.variables.push_back(MakeVariable(fields[i], request.target == static_cast<int>(i)));
     BlockRecords records(blocks, fields.size(), interrupts);
     CancelOnInterrupt cancel(records, interrupts);
     std::optional<ProgressToPython> listener;

@@ -6,6 +6,7 @@
 #include "hosts/python/src/field.h"
 #include "hosts/python/src/libraryblocks.h"
 
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>
@@ -19,7 +20,10 @@ struct RunRequest
     std::string tempDir;         ///< empty for the system's
 };
 
-/// Bins the fields as `bins.settings` say, and adds to `bins` what is known of the fields and what was found. The
+/// What is known of the fields, of which `target` is the index of the one that is the target of all attributes.
+std::vector<std::shared_ptr<const Variable>> MakeVariables(const std::vector<Field>& fields, std::optional<int> target);
+
+/// Bins the fields, which are the variables of `bins`, as `bins.settings` say, and adds to `bins` what was found. The
 /// results of a run that was interrupted are not complete. Takes no GIL but for `progress`, which may be None, and
 /// `interrupts`.
 void BinFields(Bins& bins, const std::vector<Field>& fields, LibraryBlocks& blocks, const RunRequest& request,

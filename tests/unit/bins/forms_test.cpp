@@ -53,6 +53,7 @@ Bins ManyThings()
     bins.results[1].status = MCBinning::MCStatus(MCBinning::BINStatusNoCutPoints, true);
     bins.results[1].status.SetDiscreteDatum(1, -7);
     bins.results[1].status.SetScaleDatum(2, std::numeric_limits<double>::quiet_NaN());
+    bins.reduction = Reduction{"DuckDB", "", 7, false, {12, 2}};
     return bins;
 }
 
@@ -113,6 +114,8 @@ TEST(BinsAsJson, ObjectsStandOnLinesOfTheirOwnAndNumbersAreShort)
              "      \"name\": \"age \\\"in years\\\"\",\n      \"label\": \"\xC3\xA9\\u0001\",\n",
              "{\"values\": [999, \"-inf\"], \"texts\": [\"unknown\"], \"interval\": [\"-inf\", -1]}",
              "      \"categories\": [0, 2.5],\n",
+             "{\"engine\": \"DuckDB\", \"reason\": null, \"queries\": 7, \"distinct\": \"approximate\", "
+             "\"groups\": [12, 2]},\n",
              "{\"left\": 26.5, \"right\": \"inf\", \"weight\": 3, \"weights\": [1, 2], \"rate\": ",
              "\"discrete\": [0, -7, 0], \"scale\": [0, 0, \"nan\"]}",
          })
@@ -142,6 +145,10 @@ TEST(BinsAsJson, FaultsNameTheirPlace)
          JsonValue::Array{1},
          "variables[0].missing.interval: an interval has two ends"},
         {{"status", "scale"}, JsonValue::Array{1}, "status: a status has three slots of each kind"},
+        {{"reduction", "groups"},
+         JsonValue::Array{1},
+         "reduction.groups: there must be a number of groups for each result"},
+        {{"reduction", "distinct"}, "roughly", "reduction.distinct: 'roughly' is not known here"},
         {{"results"}, "x", "results: '\"x\"' stands where a list should be"},
         {{"results", "0", "attribute"}, "weight", "results[0].attribute: there is no variable 'weight'"},
         {{"results", "0", "cut_points"}, JsonValue::Array{1, 1}, "results[0].cut_points: cut points must rise"},

@@ -1,0 +1,383 @@
+"""Bins of a table that stays in its engine.
+
+The engine sums the weights of each pair's values and categories, and the library bins these sums as weighted records.
+As the weights lie on the grid that a run over the rows has, every sum of them is exact, on however many machines it is
+made, and so is every figure.
+"""
+
+from __future__ import annotations
+
+import math
+import threading
+from collections.abc import Callable, Iterator, Sequence
+from concurrent.futures import ThreadPoolExecutor
+from contextlib import contextmanager
+from dataclasses import dataclass, replace
+from typing import Any
+
+import numpy as np
+import pyarrow as pa
+import pyarrow.compute as pc
+
+from . import _core, _shapes
+from ._buckets import TooManyNearTargets, deal_out
+from ._choice import choose_engine
+from ._engines import CountedQueries, Engine
+from ._errors import DataError, StreamError
+from ._plan import Plan
+from ._progress import Report
+from ._rows import bin_rows
+from ._settings import Reducing, RunSettings
+from ._shapes import Deal, Weights
+from ._sources import open_batches, open_stream
+
+_SECONDS_BETWEEN_REPORTS = 0.2
+_FEW_GROUPS = 1 << 22
+_EXACT_DIGITS = 15
+"""A decimal of so many digits has a double of its own, which all engines find."""
+
+
+class TooManyGroups(Exception):
+    """A group-by gives more groups than may be taken."""
+
+
+@dataclass(frozen=True)
+class Tally:
+    """What is known of all rows before the first attribute is looked at."""
+
+    records: int
+    without_weight: int | None
+    total: float
+    """Of all weights."""
+    weights: Weights
+    """On their grid."""
+    step: float | None
+    """That of the grid, if a weight has moved."""
+
+
+def bin_reduced(plan: Plan, settings: RunSettings, reducing: Reducing, report: Report | None) -> _core.Bins:
+    """As the run over all rows, but for what it tells of the reduction. That run itself, where it is to choose and the
+    engine would be dearer."""
+    assert plan.source.open_engine is not None
+    with plan.source.open_engine() as engine, _reporting_progress(engine, report):
+        queries = CountedQueries(engine)
+        reason = ""
+        if reducing.reduce == "auto" and not plan.source.is_reduced:
+            is_chosen, reason = choose_engine(queries, [attribute for attribute, _ in plan.pairs])
+            if not is_chosen:
+                bins = bin_rows(plan, settings, report)
+                bins.reduction = _core.Reduction("", reason, queries.number, True, [])
+                return bins
+        tally = _tally(plan, queries)
+        reducer = _Reducer(plan, queries, tally, settings, reducing)
+        bins = reducer.describe()
+        bins.records = tally.records
+        bins.records_without_weight = tally.without_weight
+        bins.set_weight_grid(tally.step)
+        groups = []
+        for (attribute, target), part in zip(plan.pairs, _map(engine, reducer.bin_pair, plan.pairs)):
+            index = plan.names.index(attribute)
+            bins.add_part(part.bins, index, -1 if target is None else plan.names.index(target), part.n_distinct)
+            groups += [part.groups] * len(part.bins.results)
+            if report is not None:
+                report("attributes", index)
+        is_exact = reducing.distinct == "exact"
+        bins.reduction = _core.Reduction(engine.name, reason, queries.number, is_exact, groups)
+        return bins
+
+
+def _map(engine: Engine, work: Callable[[Any], Any], items: Sequence[Any]) -> Iterator[Any]:
+    """In their order. What fails, or interrupts, ends all that is running."""
+    if engine.workers == 1 or len(items) == 1:
+        yield from map(work, items)
+        return
+    with ThreadPoolExecutor(engine.workers) as pool:
+        futures = [pool.submit(work, item) for item in items]
+        try:
+            for future in futures:
+                yield future.result()
+        except BaseException:
+            pool.shutdown(wait=False, cancel_futures=True)
+            engine.cancel()
+            raise
+
+
+@contextmanager
+def _reporting_progress(engine: Engine, report: Report | None) -> Iterator[None]:
+    """Tells of the engine's own progress, in percent, as long as it tells of it."""
+    if report is None:
+        yield
+        return
+    is_done = threading.Event()
+
+    def watch() -> None:
+        while not is_done.wait(_SECONDS_BETWEEN_REPORTS):
+            share = engine.get_progress()
+            if share is not None:
+                report("query", int(100 * share))
+
+    watcher = threading.Thread(target=watch, daemon=True)
+    watcher.start()
+    try:
+        yield
+    finally:
+        is_done.set()
+        watcher.join()
+
+
+def _tally(plan: Plan, queries: CountedQueries) -> Tally:
+    """Checks the weights and puts them on the grid that a run over the rows has."""
+    if plan.weight is None:
+        records = int(queries.row(_shapes.check_weights(Weights(None)))["records"])
+        return Tally(records, None, float(records), Weights(None), None)
+    values, interval = plan.missing_of(plan.weight)
+    weights = Weights(plan.weight, plan.rounding, values, interval)
+    found = queries.row(_shapes.check_weights(weights))
+    for fault, words in (("nan", "NaN"), ("negative", "negative"), ("infinite", "infinite")):
+        if found[fault]:
+            number = int(found[fault])
+            raise DataError(f"{number} weights are {words}" if number > 1 else f"one weight is {words}", plan.weight)
+    grid = _core.grid_factors(int(found["positive"]), float(found["largest"]))
+    weights = replace(weights, grid=grid if found["positive"] else None)
+    sums = queries.row(_shapes.sum_weights(weights))
+    step = grid[0] * grid[1] if sums["moved"] else None
+    return Tally(int(found["records"]), int(found["without_weight"]), float(sums["total"]), weights, step)
+
+
+@dataclass(frozen=True)
+class _Part:
+    """What was found of one pair."""
+
+    bins: _core.Bins
+    groups: int
+    n_distinct: int | None = None
+    """Where the library was given fewer values than there are."""
+
+
+class _Reducer:
+    """Reduces and bins the pairs of a plan."""
+
+    def __init__(
+        self, plan: Plan, queries: CountedQueries, tally: Tally, settings: RunSettings, reducing: Reducing
+    ) -> None:
+        self._plan = plan
+        self._queries = queries
+        self._tally = tally
+        self._settings = settings
+        self._reducing = reducing
+        self._schema = queries.stream(f"SELECT * FROM {_shapes.ROWS} LIMIT 0").schema
+        self._refuse_wide_decimals(plan.weight)
+        self._category_values = {name: self._list_values(name) for name in plan.categorical}
+        self._categories = {name: self._learn(name) for name in plan.categorical}
+
+    def describe(self) -> _core.Bins:
+        """The bins before any is found."""
+        plan = self._plan
+        feed = plan.make_feed(plan.names, open_stream(self._schema.empty_table()))
+        for name, categories in self._categories.items():
+            feed.set_categories(plan.names.index(name), categories)
+        return feed.describe(
+            has_targets=bool(plan.targets),
+            target=None if plan.target is None else plan.names.index(plan.target),
+            **self._settings.keywords,
+            data_name=plan.source.name,
+        )
+
+    def bin_pair(self, pair: tuple[str, str | None]) -> _Part:
+        attribute, target = pair
+        part = self._bin_groups(attribute, target)
+        for found in part.bins.results:
+            if found.status[1] != "error" and found.weight_with_missing != self._tally.total:
+                raise StreamError(
+                    f"the weights of {attribute!r} sum to {found.weight_with_missing!r}, and all weights to "
+                    f"{self._tally.total!r}: the table was changed while it was read. Bin a snapshot of it"
+                )
+        return part
+
+    def _bin_groups(self, attribute: str, target: str | None) -> _Part:
+        can_join = self._can_join(attribute, target)
+        if not (can_join and self._has_many_values(attribute)):
+            try:
+                return self._bin_values(attribute, target)
+            except TooManyGroups:
+                if not can_join:
+                    raise DataError(self._explain_groups(target), attribute) from None
+        return self._bin_buckets(attribute, target)
+
+    def _bin_values(self, attribute: str, target: str | None) -> _Part:
+        """With a group for each value."""
+        has_zeros = pa.types.is_floating(self._schema.field(attribute).type)
+        limit = self._reducing.max_groups
+        sql = _shapes.group_pair(attribute, target, self._tally.weights, has_zeros, limit + 1)
+        groups = _Groups(self._queries.stream(sql), limit, has_zeros)
+        feed = self._make_feed(groups.rename(attribute, target), groups, attribute, target)
+        bins = self._bin(feed, target, self._settings)
+        return _Part(bins, groups.number)
+
+    def _bin_buckets(self, attribute: str, target: str | None) -> _Part:
+        """With a group for each value near a cut, and one for all values between two cuts."""
+        settings, reducing = self._settings, self._reducing
+        number = self._number_of(attribute)
+        assert number is not None
+        missing = self._plan.missing_of(attribute)
+        deal = Deal(attribute, number, target, self._tally.weights, *missing, self._invalid_values(target))
+        num_categories = len(self._categories[target]) if target is not None else 1
+        try:
+            dealt = deal_out(
+                self._queries,
+                deal,
+                lambda column: self._encode(target, column),
+                settings.n_bins,
+                num_categories,
+                reducing.max_groups,
+                reducing.distinct == "exact",
+            )
+        except TooManyNearTargets:
+            raise DataError(
+                f"more than max_groups={reducing.max_groups} values lie next to the borders of {settings.n_bins} bins "
+                "of equal frequency: allow more groups, or bin with a smaller n_bins",
+                attribute,
+            ) from None
+        if target is not None and settings.max_distinct is not None and dealt.n_distinct <= settings.max_distinct:
+            raise DataError(self._explain_groups(target), attribute)
+        names = [attribute] if target is None else [attribute, target]
+        groups = dealt.groups.rename_columns([*names, ""])
+        feed = self._make_feed(groups.schema, iter(groups.to_batches()), attribute, target)
+        bins = self._bin(feed, target, replace(settings, max_distinct=None if target is None else 1))
+        n_distinct = [max(found.n_distinct + dealt.n_untold, 0) for found in bins.results]
+        return _Part(bins, groups.num_rows, *n_distinct)
+
+    def _bin(self, feed: _core.Feed, target: str | None, settings: RunSettings) -> _core.Bins:
+        targets = None if target is None else [1]
+        return feed.bin([0], targets, **settings.keywords, temp_dir=settings.temp_dir, progress=None)
+
+    def _make_feed(
+        self, schema: pa.Schema, batches: Iterator[pa.RecordBatch], attribute: str, target: str | None
+    ) -> _core.Feed:
+        """Of groups: the value, the category if there is a target, the weight."""
+        names = [attribute] if target is None else [attribute, target]
+        feed = self._plan.make_feed(names, open_batches(schema, batches))
+        feed.add_field("", "weight", column=len(names))
+        feed.set_weights((1, self._tally.total))  # whose grid has all sums of weights that make up the total
+        for index, name in enumerate(names):
+            if name in self._categories:
+                feed.set_categories(index, self._categories[name])
+        return feed
+
+    def _list_values(self, name: str) -> pa.Array:
+        limit = self._reducing.max_groups
+        found = self._queries.table(_shapes.list_values(name, limit + 1))
+        if found.num_rows > limit:
+            raise DataError(f"there are more than max_groups={limit} categories", name)
+        return found["value_"].combine_chunks()
+
+    def _learn(self, name: str) -> list[Any]:
+        """The categories in the library's order: an engine's own may be another."""
+        feed = self._plan.make_feed([name], open_stream(pa.table({name: self._category_values[name]})))
+        feed.learn()
+        categories = feed.categories(0)
+        self._plan.check_categories(name, categories)
+        return categories
+
+    def _encode(self, target: str | None, column: pa.ChunkedArray) -> np.ndarray[Any, Any]:
+        """The codes of a column of categories; NaN for a missing one."""
+        if target is None:
+            return np.zeros(len(column))
+        feed = self._plan.make_feed([target], open_stream(pa.table({target: column})))
+        feed.set_categories(0, self._categories[target])
+        codes = []
+        while len(part := feed.read(1 << 17)[0]) > 0:
+            codes.append(part)
+        return np.concatenate([*codes, np.zeros(0)])
+
+    def _invalid_values(self, target: str | None) -> list[Any]:
+        """The target's values that are declared missing, as they stand in its column."""
+        if target is None:
+            return []
+        values = self._category_values[target]
+        is_invalid = np.isnan(self._encode(target, pa.chunked_array([values])))
+        return [value for value in values.filter(pa.array(is_invalid)).to_pylist() if value is not None]
+
+    def _can_join(self, attribute: str, target: str | None) -> bool:
+        """Whether values may be told as one, where they lie in one bin of equal frequency."""
+        is_walked = target is None or self._settings.max_distinct is not None
+        return is_walked and attribute not in self._categories and self._number_of(attribute) is not None
+
+    def _number_of(self, attribute: str) -> str | None:
+        """SQL for the values of a column as doubles; None if engines may differ in them."""
+        kind = self._schema.field(attribute).type
+        if pa.types.is_timestamp(kind):
+            ticks = self._queries.engine.microseconds(attribute)
+            return None if ticks is None else f"CAST({ticks} AS DOUBLE)"
+        is_exact = pa.types.is_integer(kind) or pa.types.is_floating(kind)
+        if pa.types.is_decimal(kind):
+            is_exact = kind.precision <= _EXACT_DIGITS
+        return _shapes.as_double(attribute) if is_exact else None
+
+    def _has_many_values(self, attribute: str) -> bool:
+        """Whether there will be too many groups, as far as an estimate tells."""
+        if self._tally.records <= self._few_groups:
+            return False
+        estimate = self._queries.row(_shapes.count_values_roughly(attribute))["n"]
+        return bool(estimate > self._few_groups)
+
+    @property
+    def _few_groups(self) -> int:
+        """So many are always told one by one, where that is allowed."""
+        return min(_FEW_GROUPS, self._reducing.max_groups)
+
+    def _refuse_wide_decimals(self, weight: str | None) -> None:
+        kind = None if weight is None else self._schema.field(weight).type
+        if kind is not None and pa.types.is_decimal(kind) and kind.precision > _EXACT_DIGITS:
+            raise DataError(
+                f"weights of more than {_EXACT_DIGITS} digits are rounded by each engine in its own way: cast the "
+                "column to doubles in the engine",
+                weight,
+            )
+
+    def _explain_groups(self, target: str | None) -> str:
+        limit = self._reducing.max_groups
+        values = "values" if target is None else "pairs of value and category"
+        advice = f"allow more by max_groups, which take about {_size(24 * 2 * limit)} here"
+        if target is not None:
+            advice = f"pre-bin it by max_distinct, below its number of values, or {advice}"
+        return f"there are more than max_groups={limit} {values}: {advice}"
+
+
+def _size(number_of_bytes: int) -> str:
+    power = max(0, min(3, int(math.log(max(number_of_bytes, 1), 1000))))
+    return f"{number_of_bytes / 1000**power:.0f} {['bytes', 'kB', 'MB', 'GB'][power]}"
+
+
+class _Groups:
+    """The batches of a group-by, with the negative zeros in their column, as long as they are not too many."""
+
+    def __init__(self, reader: pa.RecordBatchReader, limit: int, has_zeros: bool) -> None:
+        self._reader = reader
+        self._limit = limit
+        self._has_zeros = has_zeros
+        self.number = 0
+
+    def rename(self, attribute: str, target: str | None) -> pa.Schema:
+        """The schema, with these names."""
+        fields = [field for field in self._reader.schema if field.name != "zero_"]
+        names = [attribute] if target is None else [attribute, target]
+        return pa.schema([field.with_name(name) for field, name in zip(fields, [*names, ""])])
+
+    def __iter__(self) -> Iterator[pa.RecordBatch]:
+        return self
+
+    def __next__(self) -> pa.RecordBatch:
+        batch = next(self._reader)
+        self.number += batch.num_rows
+        if self.number > self._limit:
+            raise TooManyGroups
+        return restore_zeros(batch) if self._has_zeros else batch
+
+
+def restore_zeros(batch: pa.RecordBatch) -> pa.RecordBatch:
+    """Without the column that tells of a zero's sign."""
+    values, is_negative, *others = batch.columns
+    zero = pa.scalar(-0.0, values.type)
+    names = [name for name in batch.schema.names if name != "zero_"]
+    return pa.RecordBatch.from_arrays([pc.if_else(is_negative, zero, values), *others], names=names)
