@@ -33,12 +33,15 @@ class Engine:
         """SQL for a column of timestamps as whole microseconds since 1970; None where the engine has no such thing."""
         return None
 
+    def check_columns(self, names: Sequence[str]) -> None:
+        """\raise DataError if the engine compares values of these columns otherwise than the library."""
+
     def get_progress(self) -> float | None:
         """The share of the running query that is done, from 0 to 1, where the engine tells it."""
         return None
 
     def cancel(self) -> None:
-        """Ends the queries that run in other threads."""
+        """Ends the queries that run, in whatever thread."""
 
     def close(self) -> None:
         """Takes away what was made in the engine."""
@@ -46,7 +49,9 @@ class Engine:
     def __enter__(self) -> Engine:
         return self
 
-    def __exit__(self, *_: object) -> None:
+    def __exit__(self, kind: type[BaseException] | None, *_: object) -> None:
+        if kind is not None:
+            self.cancel()
         self.close()
 
 

@@ -5,9 +5,11 @@ from __future__ import annotations
 import os
 from typing import Any
 
+from ._engines import engine_source
 from ._files import Reading, open_paths, open_relation
 from ._frames import open_pandas, open_polars, open_polars_lazy, open_pyarrow
 from ._sources import Source, once, open_stream
+from ._spark import SparkEngine, is_spark_frame
 
 _PLAIN = Reading()
 
@@ -25,6 +27,8 @@ def open_source(data: Any, reading: Reading = _PLAIN) -> Source:
     module = type(data).__module__.partition(".")[0]
     if module in ("duckdb", "_duckdb") and hasattr(data, "project"):
         return open_relation(data)
+    if is_spark_frame(data):
+        return engine_source(lambda: SparkEngine(data), None)
     if module == "pandas" and hasattr(data, "columns"):
         return open_pandas(data)
     if is_lazy_frame(data):

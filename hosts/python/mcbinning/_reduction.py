@@ -68,6 +68,7 @@ def bin_reduced(plan: Plan, settings: RunSettings, reducing: Reducing, report: R
                 bins = bin_rows(plan, settings, report)
                 bins.reduction = _core.Reduction("", reason, queries.number, True, [])
                 return bins
+        engine.check_columns(plan.names)
         tally = _tally(plan, queries)
         reducer = _Reducer(plan, queries, tally, settings, reducing)
         bins = reducer.describe()

@@ -25,8 +25,9 @@ def quote_text(text: str) -> str:
 
 
 def double(value: float) -> str:
-    """A literal that reads back as this very number."""
-    return f"{value:.17e}"
+    """The shortest literal of a double that reads back as this very number."""
+    text = repr(float(value))
+    return text if "e" in text else f"{text}e0"
 
 
 def as_double(column: str) -> str:

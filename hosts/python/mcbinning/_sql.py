@@ -27,16 +27,22 @@ def write(core: _core.Bins, dialect: str, table: str | None, labels: bool) -> st
     if dialect in ("", "duckdb"):
         columns = core.to_sql(dialect == "duckdb", labels)
         return columns if table is None else f"SELECT *{_behind_comma(columns)}\nFROM {table}\n"
+    found = parse(core, dialect, labels)
+    if table is None:
+        return ",\n".join(column.sql(dialect=dialect, pretty=True) for column in found) + "\n"
+    sqlglot = require("sqlglot", "dialects of SQL", "sql")
+    tree = sqlglot.select("*", *found).from_(sqlglot.exp.to_table(table))
+    return str(tree.sql(dialect=dialect, pretty=True)) + "\n"
+
+
+def parse(core: _core.Bins, dialect: str, labels: bool) -> list[Any]:
+    """The columns of bins as trees of sqlglot's, for a dialect."""
     sqlglot = require("sqlglot", "dialects of SQL", "sql")
     known = sqlglot.Dialect.get_or_raise(dialect)
     name = next(name for name, kind in sqlglot.Dialect.classes.items() if kind is type(known))
     columns = core.to_sql(True, labels)
     tree = sqlglot.parse_one(f"SELECT *{_behind_comma(columns)}", read="duckdb")
-    found = [tell_nan(column, name) for column in tree.expressions[1:]]
-    if table is None:
-        return ",\n".join(column.sql(dialect=dialect, pretty=True) for column in found) + "\n"
-    tree = sqlglot.select("*", *found).from_(sqlglot.exp.to_table(table))
-    return str(tree.sql(dialect=dialect, pretty=True)) + "\n"
+    return [tell_nan(column, name) for column in tree.expressions[1:]]
 
 
 def _behind_comma(columns: str) -> str:

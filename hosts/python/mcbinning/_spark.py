@@ -1,0 +1,115 @@
+"""Spark as an engine, and bins as columns of a Spark frame."""
+
+from __future__ import annotations
+
+import uuid
+from collections.abc import Sequence
+from typing import TYPE_CHECKING, Any
+
+from ._engines import Engine, engine_failed, translate
+from ._errors import DataError
+from ._features import require
+from ._shapes import quote_name
+
+if TYPE_CHECKING:
+    import pyarrow as pa
+
+    from ._bins import AttributeBins
+    from ._types import Unseen
+
+_FIRST_VERSION = 4
+"""That hands on Arrow tables."""
+
+
+def is_spark_frame(data: Any) -> bool:
+    """Of a session here, or of one on a server."""
+    return type(data).__module__.startswith("pyspark.sql.") and type(data).__name__ == "DataFrame"
+
+
+class SparkEngine(Engine):
+    """A frame, under a name of its own for as long as the engine is open."""
+
+    name = "Spark"
+    # Each job leaves cores idle while it starts and ends.
+    workers = 4
+
+    def __init__(self, frame: Any) -> None:
+        self._frame = frame
+        self._session = frame.sparkSession
+        if int(self._session.version.partition(".")[0]) < _FIRST_VERSION:
+            raise DataError(f"Spark {self._session.version} can't hand on Arrow tables, as {_FIRST_VERSION}.0 can")
+        # A session here does not find by its own tags what becomes an Arrow table, and a server knows no other ones.
+        if type(frame).__module__.startswith("pyspark.sql.connect."):
+            self._tagging = self._session.addTag, self._session.removeTag
+            self._cancel = self._session.interruptTag
+        else:
+            context = self._session.sparkContext
+            self._tagging = context.addJobTag, context.removeJobTag
+            self._cancel = context.cancelJobsWithTag
+        # The tag of all jobs as well, by which they are ended.
+        self._view = f"mcbinning_{uuid.uuid4().hex}"
+        frame.createOrReplaceTempView(self._view)
+
+    def query(self, sql: str) -> pa.RecordBatchReader:
+        query = translate(sql, "spark", self._view)
+        add, remove = self._tagging
+        add(self._view)  # to the jobs of this thread
+        try:
+            return self._session.sql(query).toArrow().to_reader()
+        except Exception as error:  # Spark's own ones, and those of the bridge to Java
+            raise engine_failed(self.name, _find_cause(str(error))) from error
+        finally:
+            remove(self._view)
+
+    def check_columns(self, names: Sequence[str]) -> None:
+        for field in self._frame.schema.fields:
+            collation = getattr(field.dataType, "collation", "UTF8_BINARY")
+            if field.name in names and collation != "UTF8_BINARY":
+                raise DataError(
+                    f"its collation {collation} takes different texts for one: cast it to STRING COLLATE UTF8_BINARY",
+                    field.name,
+                )
+
+    def microseconds(self, column: str) -> str:
+        name = quote_name(column)
+        if self._frame.schema[column].dataType.typeName() != "timestamp_ntz":
+            return f"UNIX_MICROS({name})"
+        # Made of its parts, as a cast would take it for a time of the session's zone.
+        parts = [
+            f"HOUR({name}) * 3600e6",
+            f"MINUTE({name}) * 60e6",
+            f"CAST(EXTRACT(SECOND FROM {name}) AS DOUBLE) * 1e6",
+        ]
+        return f"(UNIX_DATE(CAST({name} AS DATE)) * 86400e6 + {' + '.join(parts)})"
+
+    def cancel(self) -> None:
+        self._cancel(self._view)
+
+    def close(self) -> None:
+        self._session.catalog.dropTempView(self._view)
+
+
+def _find_cause(message: str) -> str:
+    """The line of Java's page that tells what went wrong."""
+    lines = message.strip().splitlines() or [""]
+    causes = [line.partition("Caused by: ")[2] for line in lines if "Caused by: " in line]
+    return (causes or lines)[-1 if causes else 0].strip()
+
+
+def add_bins(frame: Any, chosen: Sequence[tuple[str, AttributeBins, str]], unseen: Unseen) -> Any:
+    """The frame with further columns: of each the name, the bins and their SQL, which gives NULL for an unseen category
+    as well as for a missing value."""
+    functions = require("pyspark.sql.functions", "Spark frames", "spark")
+    columns = []
+    for name, bins, case in chosen:
+        column = functions.expr(case)
+        if bins.variable.is_categorical and unseen == "error":
+            value = functions.col(f"`{bins.attribute.replace('`', '``')}`")
+            missing = [functions.lit(code) for code in bins.variable.missing_values]
+            is_missing = value.isNull() | value.isin(missing)
+            words = f"column {bins.attribute!r}: a category is new; it is not among those that the bins were made of"
+            column = functions.coalesce(
+                column, functions.when(~is_missing, functions.raise_error(functions.lit(words)))
+            )
+        columns.append(column.alias(name))
+    return frame.select("*", *columns)
