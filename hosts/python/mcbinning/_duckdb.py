@@ -5,6 +5,7 @@ from __future__ import annotations
 import os
 import tempfile
 from collections.abc import Callable, Iterator
+from contextlib import contextmanager
 from typing import Any
 
 import pyarrow as pa
@@ -26,20 +27,26 @@ class DuckEngine(Engine):
         self._explain = explain
 
     def query(self, sql: str) -> pa.RecordBatchReader:
-        import duckdb
-
-        try:
+        with self._telling():
             found = self._relation.query(ROWS, sql)
             begin = getattr(found, "to_arrow_reader", None) or found.fetch_record_batch
             reader = begin(_ROWS_AT_ONCE)
             return pa.RecordBatchReader.from_batches(reader.schema, self._iterate(reader))
-        except duckdb.Error as error:
-            raise engine_failed(self.name, self._explain(str(error))) from error
 
     def _iterate(self, reader: pa.RecordBatchReader) -> Iterator[pa.RecordBatch]:
-        try:
+        with self._telling():
             yield from reader
-        except (pa.ArrowException, OSError) as error:
+
+    @contextmanager
+    def _telling(self) -> Iterator[None]:
+        """What DuckDB raises, in the package's terms. Ctrl-C interrupts its query, and it says no more than that."""
+        import duckdb
+
+        try:
+            yield
+        except (duckdb.Error, pa.ArrowException, OSError, RuntimeError) as error:
+            if isinstance(error, duckdb.InterruptException) or "interrupted" in str(error).lower():
+                raise KeyboardInterrupt from error
             raise engine_failed(self.name, self._explain(str(error))) from error
 
     def microseconds(self, column: str) -> str:

@@ -24,6 +24,8 @@ def open_source(data: Any, reading: Reading = _PLAIN) -> Source:
         return open_paths([os.fspath(path) for path in data], reading)
     if reading.memory_limit is not None:
         raise ValueError(f"memory_limit bounds the reading of files, and a {type(data).__name__} is none")
+    if reading.threads is not None:
+        raise ValueError(f"threads are those of DuckDB, where it reads files, and a {type(data).__name__} is none")
     module = type(data).__module__.partition(".")[0]
     if module in ("duckdb", "_duckdb") and hasattr(data, "project"):
         return open_relation(data)

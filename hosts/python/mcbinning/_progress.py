@@ -10,34 +10,43 @@ from ._features import require
 
 Report = Callable[[str, int], None]
 Progress = bool | Report
-"""Whether to show progress bars, or a function that is called with the phase, `"records"` or `"attributes"`, and the
-number of records read or the place of the attribute just done among the variables."""
+"""Whether to show progress bars, or a function that is called with the phase and a number: `"records"` and how many
+were read, `"attributes"` and the index of the variable just done, `"query"` and how much of it is done in percent."""
 
 
 class _Bars:
-    """A bar for the rows, then one for the attributes."""
+    """A bar for the rows, if they are read here, then one for the attributes."""
 
     def __init__(self, names: list[str], total: int, rows: int | None) -> None:
-        tqdm = require("tqdm.auto", "progress bars", "progress").tqdm
-        self._tqdm: Any = tqdm
+        tqdm: Any = require("tqdm.auto", "progress bars", "progress").tqdm
         self._names = names
-        self._total = total
-        self._bar = tqdm(desc="reading", unit=" rows", unit_scale=True, total=rows)
-        self._phase = "records"
+        self._open = {
+            "records": lambda: tqdm(desc="reading", unit=" rows", unit_scale=True, total=rows),
+            "attributes": lambda: tqdm(desc="binning", unit=" attributes", total=total),
+        }
+        self._phase = ""
+        self._bar: Any = None
 
     def __call__(self, phase: str, index: int) -> None:
+        bar = self._show("records" if phase == "records" else "attributes")
         if phase == "records":
-            self._bar.update(index - self._bar.n)
-            return
-        if self._phase == "records":
+            bar.update(index - bar.n)
+        elif phase == "query":
+            bar.set_postfix_str(f"query {index} %")
+        else:
+            bar.set_postfix_str(self._names[index], refresh=False)
+            bar.update(1)
+
+    def _show(self, phase: str) -> Any:
+        if phase != self._phase:
+            self.close()
+            self._bar = self._open[phase]()
             self._phase = phase
-            self._bar.close()
-            self._bar = self._tqdm(desc="binning", unit=" attributes", total=self._total)
-        self._bar.set_postfix_str(self._names[index], refresh=False)
-        self._bar.update(1)
+        return self._bar
 
     def close(self) -> None:
-        self._bar.close()
+        if self._bar is not None:
+            self._bar.close()
 
 
 @contextmanager

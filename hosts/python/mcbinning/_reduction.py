@@ -139,10 +139,14 @@ def _tally(plan: Plan, queries: CountedQueries) -> Tally:
             number = int(found[fault])
             raise DataError(f"{number} weights are {words}" if number > 1 else f"one weight is {words}", plan.weight)
     grid = _core.grid_factors(int(found["positive"]), float(found["largest"]))
-    weights = replace(weights, grid=grid if found["positive"] else None)
-    sums = queries.row(_shapes.sum_weights(weights))
-    step = grid[0] * grid[1] if sums["moved"] else None
-    return Tally(int(found["records"]), int(found["without_weight"]), float(sums["total"]), weights, step)
+    on_grid = replace(weights, grid=grid if found["positive"] else None)
+    sums = queries.row(_shapes.sum_weights(on_grid))
+    if not math.isfinite(sums["total"]):
+        raise DataError("the weights sum to more than any number", plan.weight)
+    counts = int(found["records"]), int(found["without_weight"])
+    if not sums["moved"]:
+        return Tally(*counts, float(sums["total"]), weights, None)
+    return Tally(*counts, float(sums["total"]), on_grid, grid[0] * grid[1])
 
 
 @dataclass(frozen=True)
@@ -275,7 +279,10 @@ class _Reducer:
     def _learn(self, name: str) -> list[Any]:
         """The categories in the library's order: an engine's own may be another."""
         feed = self._plan.make_feed([name], open_stream(pa.table({name: self._category_values[name]})))
-        feed.learn()
+        try:
+            feed.learn()
+        except DataError as error:
+            raise DataError(error.message, name) from None  # the row is one of the list
         categories = feed.categories(0)
         self._plan.check_categories(name, categories)
         return categories
