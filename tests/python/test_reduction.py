@@ -297,6 +297,7 @@ def test_auto_takes_what_is_cheaper_and_says_why(tmp_path):
             (relation_of(table), "many", None, r"20000 rows, and about \d{5} different values"),
             (parquet, "few", "DuckDB", r"about 4\d different values"),
             (csv, "few", None, "each query would read the text of the files anew"),
+            (table, "few", None, "no engine has the data"),
         ):
             bins = mb.supervised_bins(data, "t", [attribute], reduce="auto")
             assert bins.reduction.engine == engine and re.search(reason, bins.reduction.reason)

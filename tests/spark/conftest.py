@@ -105,7 +105,7 @@ class Cluster:
         """The ids of the processes that work for the session: the children of the workers."""
         workers = {process.pid for process in self.processes[1:]}
         found = []
-        for entry in Path("/proc").iterdir():
+        for entry in Path("/proc").glob("[0-9]*"):
             try:
                 state, parent = (entry / "stat").read_text().rsplit(")", 1)[1].split()[:2]
             except OSError:  # no process, or one that has ended by now

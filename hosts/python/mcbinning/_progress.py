@@ -17,7 +17,7 @@ were read, `"attributes"` and the index of the variable just done, `"query"` and
 class _Bars:
     """A bar for the rows, if they are read here, then one for the attributes."""
 
-    def __init__(self, names: list[str], total: int, rows: int | None) -> None:
+    def __init__(self, names: list[str], total: int, rows: int | None, are_rows_read: bool) -> None:
         tqdm: Any = require("tqdm.auto", "progress bars", "progress").tqdm
         self._names = names
         self._open = {
@@ -26,6 +26,8 @@ class _Bars:
         }
         self._phase = ""
         self._bar: Any = None
+        if are_rows_read:
+            self._show("records")
 
     def __call__(self, phase: str, index: int) -> None:
         bar = self._show("records" if phase == "records" else "attributes")
@@ -50,12 +52,15 @@ class _Bars:
 
 
 @contextmanager
-def reporting(progress: Progress, names: list[str], total: int, rows: int | None = None) -> Iterator[Report | None]:
-    """What to call while a run goes on. `total` attributes are binned, and `names` are those of all variables."""
+def reporting(
+    progress: Progress, names: list[str], total: int, rows: int | None = None, are_rows_read: bool = True
+) -> Iterator[Report | None]:
+    """What to call while a run goes on. `total` attributes are binned, and `names` are those of all variables.
+    `are_rows_read` is False where an engine may reduce them."""
     if callable(progress):
         yield progress
     elif progress:
-        bars = _Bars(names, total, rows)
+        bars = _Bars(names, total, rows, are_rows_read)
         try:
             yield bars
         finally:

@@ -17,9 +17,12 @@ def run(plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progres
             "reduce='engine' needs data that an engine has: files that DuckDB reads, a relation of DuckDB's, a Spark "
             "frame, or what query_source gives"
         )
-    with reporting(progress, plan.names, len(plan.pairs), source.rows) as report:
+    with reporting(progress, plan.names, len(plan.pairs), source.rows, not is_reduced) as report:
         if is_reduced and source.open_engine is not None:
             from ._reduction import bin_reduced
 
             return bin_reduced(plan, settings, reducing, report)
-        return bin_rows(plan, settings, report)
+        bins = bin_rows(plan, settings, report)
+        if reducing.reduce == "auto":
+            bins.reduction = _core.Reduction("", "no engine has the data", 0, True, [])
+        return bins
