@@ -1,4 +1,4 @@
-"""The code in the guide runs as it stands."""
+"""The code in the guides runs as it stands."""
 
 from __future__ import annotations
 
@@ -8,7 +8,8 @@ import matplotlib.pyplot as plt
 import pytest
 from conftest import ROOT
 
-BLOCKS = re.findall(r"^```python\n(.*?)^```", (ROOT / "docs" / "python.md").read_text(encoding="utf-8"), re.M | re.S)
+GUIDES = [(ROOT / "docs" / name).read_text(encoding="utf-8") for name in ("python.md", "engines.md")]
+BLOCKS = [block for guide in GUIDES for block in re.findall(r"^```python\n(.*?)^```", guide, re.M | re.S)]
 
 
 @pytest.mark.parametrize("code", BLOCKS, ids=lambda code: code.splitlines()[0])
@@ -16,9 +17,9 @@ def test_code_of_the_guide_runs(code, tmp_path, monkeypatch):
     (tmp_path / "examples").symlink_to(ROOT / "examples")
     monkeypatch.chdir(tmp_path)
 
-    exec(compile(code, "docs/python.md", "exec"), {})
+    exec(compile(code, "docs", "exec"), {})
     plt.close("all")
 
 
-def test_the_guide_has_its_five_walks():
-    assert len(BLOCKS) == 5 and len(BLOCKS[0].splitlines()) == 10
+def test_the_guides_have_their_seven_walks():
+    assert len(BLOCKS) == 7 and len(BLOCKS[0].splitlines()) == 10
