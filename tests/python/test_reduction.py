@@ -133,6 +133,19 @@ def test_categories_are_those_of_all_rows():
     assert len(bins["x"].target.categories) == 4 and bins.records == 6 and bins.records_without_weight == 1
 
 
+def test_columns_may_have_any_names(monkeypatch):
+    """Also those that the queries use themselves."""
+    monkeypatch.setattr(_buckets, "_FEW_ROWS", 100)
+    rng = np.random.default_rng(6)
+    names = ["category_", "weight_", "value_", "number_", "bucket_", "zero_", "rows_", 'a "b"', "low_", "GROUP"]
+    table = pa.table({name: rng.normal(0, 1, 900).round(3) for name in names})
+    table = table.set_column(0, "category_", pa.array(rng.integers(0, 2, 900)))
+    table = table.set_column(1, "weight_", pa.array(rng.random(900)))
+    check_equal(mb.supervised_bins, table, "category_", weight="weight_")
+    check_equal(mb.equal_frequency_bins, table, names[2:], weight="weight_", n_bins=4, max_groups=400)
+    check_equal(mb.supervised_bins, table, "category_", names[1:3], n_bins=4, max_distinct=9, max_groups=700)
+
+
 def test_a_run_without_records_that_count_fails_as_over_rows():
     for w in ([0.0, 0.0], [None, None]):
         table = pa.table({"x": [1.0, 2.0], "t": [0, 1], "w": pa.array(w, pa.float64())})

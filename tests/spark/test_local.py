@@ -1,5 +1,7 @@
 """Spark frames: their bins are those of a run over the rows, and so are the bins of their values."""
 
+import os
+import signal
 import threading
 import time
 import types
@@ -116,3 +118,11 @@ def test_cancelling_ends_the_jobs_of_one_engine(spark):
         thread.join(60)
         assert not thread.is_alive() and ended
     assert spark.range(5).count() == 5
+
+
+def test_ctrl_c_ends_all_that_runs(spark):
+    slow = spark.range(10**12, numPartitions=2).selectExpr("id % 7 AS x", "id % 5 AS y", "id % 3 AS z")
+    threading.Timer(4, os.kill, (os.getpid(), signal.SIGINT)).start()
+    with pytest.raises(KeyboardInterrupt):
+        mb.equal_frequency_bins(slow)
+    assert not spark.sparkContext.statusTracker().getActiveJobsIds() and not spark.catalog.listTables()

@@ -57,6 +57,8 @@ class SparkEngine(Engine):
         try:
             return self._session.sql(query).toArrow().to_reader()
         except Exception as error:  # Spark's own ones, and those of the bridge to Java
+            if _is_interrupt(error):
+                raise KeyboardInterrupt from error
             raise engine_failed(self.name, _find_cause(str(error))) from error
         finally:
             remove(self._view)
@@ -87,6 +89,11 @@ class SparkEngine(Engine):
 
     def close(self) -> None:
         self._session.catalog.dropTempView(self._view)
+
+
+def _is_interrupt(error: BaseException | None) -> bool:
+    """At Ctrl-C Spark ends its jobs, and the failure of these hides the interrupt."""
+    return error is not None and (isinstance(error, KeyboardInterrupt) or _is_interrupt(error.__context__))
 
 
 def _find_cause(message: str) -> str:
