@@ -5,9 +5,9 @@ cmake_minimum_required(VERSION 3.25)
 execute_process(COMMAND ${VALGRIND} --quiet --tool=callgrind --callgrind-out-file=${PROFILE}
   --compress-strings=no --compress-pos=no ${PROGRAM} ${WORKLOAD} ${SCALE} COMMAND_ERROR_IS_FATAL ANY)
 
-# A profile names each object file ahead of what was done in it. A line of digits is a place and what it cost; that
-# behind "calls" is what was done by the callee, which stands at its own place too. "cob" names the callee's object if
-# it is another.
+# A profile names each object file ahead of what was done in it. A line of digits is a line of source and what it cost;
+# that behind "calls" is what was done by the callee, which has a line of its own, too. "cob" names the callee's object
+# if it is another.
 file(STRINGS ${PROFILE} lines REGEX "^(ob=|cob=|calls=|[0-9])")
 set(instructions 0)
 set(calls 0)

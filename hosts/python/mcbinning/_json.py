@@ -14,7 +14,7 @@ _TOKEN = re.compile(r'"(?:[^"\\]|\\.)*"|[^\s"\[\]{}:,]+', re.DOTALL)
 
 
 def read_bins(source: str | os.PathLike[str]) -> _core.Bins:
-    """Reads a text, or the file of a path. \\raise ValueError with the place of the fault, if it has one."""
+    """Reads a text, or the file of a path. \\raise ValueError with the path of the fault, if it has one."""
     named = os.fspath(source)
     if isinstance(source, str) and named.lstrip("\ufeff \t\r\n").startswith("{"):
         name, content = "the text", named.encode("utf-8", "surrogatepass")

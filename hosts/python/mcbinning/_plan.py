@@ -144,10 +144,10 @@ class Plan:
 
     def make_feed(self, names: list[str], table: _core.Table) -> _core.Feed:
         """The columns of these names, out of a table that may have further ones."""
-        places = [fields[0] for fields in table.columns]
+        positions = [fields[0] for fields in table.columns]
         feed = _core.Feed(table)
         for index, name in enumerate(names):
-            feed.add_field(name, self._use(name), column=places.index(name), rounding=self.rounding)
+            feed.add_field(name, self._use(name), column=positions.index(name), rounding=self.rounding)
             values, interval = self.missing_of(name)
             is_text = self.column(name).kind == "text"
             feed.declare_missing(index, [] if is_text else list(values), interval, list(values) if is_text else [])

@@ -87,18 +87,18 @@ def open_values(
     check_names(source, names)
     table = source.open(names)
     columns = columns_of(table)
-    places = [column.name for column in columns]
+    positions = [column.name for column in columns]
     feed = _core.Feed(table)
     for index, variable in enumerate(variables):
-        place = places.index(variable.name)
-        feed.add_field(variable.name, "category" if variable.is_categorical else "attribute", column=place)
+        position = positions.index(variable.name)
+        feed.add_field(variable.name, "category" if variable.is_categorical else "attribute", column=position)
         values = list(variable.missing_values)
-        if columns[place].kind == "text":
+        if columns[position].kind == "text":
             feed.declare_missing(index, [], None, [*map(str, values), *missing_text])
         else:
             feed.declare_missing(index, _as_numbers(values, variable), variable.missing_interval, [])
         if variable.categories is not None:
-            feed.set_categories(index, _as_in_column(list(variable.categories), variable, columns[place].kind), unseen)
+            feed.set_categories(index, _as_in_column(list(variable.categories), variable, columns[position].kind), unseen)
     return feed
 
 

@@ -143,24 +143,24 @@ public:
 class DictionaryReader : public ColumnReader
 {
 public:
-    DictionaryReader(std::unique_ptr<ColumnReader> places, const ColumnReader& values, std::size_t size)
-        : fPlaces(std::move(places)), fValues(size)
+    DictionaryReader(std::unique_ptr<ColumnReader> indices, const ColumnReader& values, std::size_t size)
+        : fIndices(std::move(indices)), fValues(size)
     {
         values.Read(0, size, fValues.data());
     }
 
     void Read(std::size_t first, std::size_t count, double* values) const override
     {
-        fPlaces->Read(first, count, values);
+        fIndices->Read(first, count, values);
         for (std::size_t i = 0; i < count; ++i)
         {
             if (values[i] != gMissingValue)
-                values[i] = fValues[CheckPlace(values[i], fValues.size())];
+                values[i] = fValues[CheckIndex(values[i], fValues.size())];
         }
     }
 
 private:
-    std::unique_ptr<ColumnReader> fPlaces;
+    std::unique_ptr<ColumnReader> fIndices;
     std::vector<double> fValues;
 };
 
@@ -246,7 +246,7 @@ std::string_view TextReader::ViewAt(std::size_t index) const
     if (fStorage == Storage::kTextView)
     {
         // 16 bytes: the length, and then the text itself if it has at most 12 bytes, else its first four, the number of
-        // its buffer and its place there.
+        // its buffer and its position there.
         const char* const view = static_cast<const char*>(fArray.buffers[1]) + 16 * index;
         std::int32_t parts[4];
         std::memcpy(parts, view, sizeof(parts));
@@ -280,19 +280,19 @@ std::unique_ptr<ColumnReader> MakeReader(const ArrowArray& array, const ColumnTy
     if (!type.isDictionary)
         return MakePlainReader(array, type.storage, type.factor, type.divisor, offset);
     const ArrowArray& dictionary = *array.dictionary;
-    return std::make_unique<DictionaryReader>(MakePlaceReader(array, type, offset),
+    return std::make_unique<DictionaryReader>(MakeIndexReader(array, type, offset),
                                               *MakePlainReader(dictionary, type.storage, type.factor, type.divisor, 0),
                                               static_cast<std::size_t>(dictionary.length));
 }
 
-std::unique_ptr<ColumnReader> MakePlaceReader(const ArrowArray& array, const ColumnType& type, std::int64_t offset)
+std::unique_ptr<ColumnReader> MakeIndexReader(const ArrowArray& array, const ColumnType& type, std::int64_t offset)
 {
     return MakePlainReader(array, type.indexStorage, 1.0, 1.0, offset);
 }
 
-std::size_t CheckPlace(double place, std::size_t size)
+std::size_t CheckIndex(double index, std::size_t size)
 {
-    if (!(place >= 0.0 && place < static_cast<double>(size)))
+    if (!(index >= 0.0 && index < static_cast<double>(size)))
         throw DataFault("an index points outside of its dictionary of " + std::to_string(size) + " values");
-    return static_cast<std::size_t>(place);
+    return static_cast<std::size_t>(index);
 }

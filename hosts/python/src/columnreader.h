@@ -60,11 +60,11 @@ std::unique_ptr<ColumnReader> MakeReader(const StridedArray& array);
 /// Reads the numbers of `array`, which are not those of a text type, from `offset` rows behind its own beginning.
 std::unique_ptr<ColumnReader> MakeReader(const ArrowArray& array, const ColumnType& type, std::int64_t offset);
 
-/// Reads not the values of a dictionary's column but their places in the dictionary.
-std::unique_ptr<ColumnReader> MakePlaceReader(const ArrowArray& array, const ColumnType& type, std::int64_t offset);
+/// Reads not the values of a dictionary's column but their indices in the dictionary.
+std::unique_ptr<ColumnReader> MakeIndexReader(const ArrowArray& array, const ColumnType& type, std::int64_t offset);
 
-/// The place as an index of a dictionary of `size` values. \throw DataFault if it has none there: not every producer
+/// The number as an index of a dictionary of `size` values. \throw DataFault if it has none there: not every producer
 /// looks.
-std::size_t CheckPlace(double place, std::size_t size);
+std::size_t CheckIndex(double index, std::size_t size);
 
 #endif

@@ -38,7 +38,7 @@ struct ColumnType
     /// A number is the stored one times `factor`, divided by `divisor`: days of dates, microseconds of timestamps.
     double factor = 1.0;
     double divisor = 1.0;
-    /// The stored numbers are places in a dictionary, and what is told above is about its values.
+    /// The stored numbers are indices in a dictionary, and what is told above is about its values.
     bool isDictionary = false;
     Storage indexStorage = Storage::kNone; ///< of a dictionary
     bool isOrdered = false;                ///< the order of the dictionary is that of its values

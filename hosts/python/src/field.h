@@ -38,7 +38,7 @@ struct Field
     ValueKind valueKind = ValueKind::kNumber;
     std::string timeZone;
 
-    /// The place of its column in the stream; -1 where it has an array.
+    /// The position of its column in the stream; -1 where it has an array.
     int column = -1;
     /// One value for each record of the whole data; borrowed.
     StridedArray array{};

@@ -165,34 +165,34 @@ private:
 class DictionaryCategoryField : public FieldReader
 {
 public:
-    DictionaryCategoryField(std::unique_ptr<ColumnReader> places, TextReader texts, std::size_t size, Field& field)
-        : fPlaces(std::move(places)), fTexts(texts), fCodes(size, gMissingValue), fField(field)
+    DictionaryCategoryField(std::unique_ptr<ColumnReader> indices, TextReader texts, std::size_t size, Field& field)
+        : fIndices(std::move(indices)), fTexts(texts), fCodes(size, gMissingValue), fField(field)
     {
     }
 
     void Read(std::size_t first, std::size_t count, std::int64_t row, double* values) override
     {
-        fPlaces->Read(first, count, values);
+        fIndices->Read(first, count, values);
         for (std::size_t i = 0; i < count; ++i)
         {
             values[i] = values[i] == gMissingValue
                             ? kMissingCode
-                            : Encode(CheckPlace(values[i], fCodes.size()), row + static_cast<std::int64_t>(i));
+                            : Encode(CheckIndex(values[i], fCodes.size()), row + static_cast<std::int64_t>(i));
         }
     }
 
 private:
-    double Encode(std::size_t place, std::int64_t row)
+    double Encode(std::size_t index, std::int64_t row)
     {
-        double& code = fCodes[place];
+        double& code = fCodes[index];
         if (code == gMissingValue)
-            code = EncodeText(fField, fTexts.At(place), row);
+            code = EncodeText(fField, fTexts.At(index), row);
         return code;
     }
 
-    std::unique_ptr<ColumnReader> fPlaces;
+    std::unique_ptr<ColumnReader> fIndices;
     TextReader fTexts;
-    std::vector<double> fCodes; ///< by place; gMissingValue where not looked up yet
+    std::vector<double> fCodes; ///< by index; gMissingValue where not looked up yet
     Field& fField;
 };
 
@@ -336,7 +336,7 @@ std::unique_ptr<FieldReader> TableBlocks::MakeFieldReader(std::size_t index, con
         if (type.IsText() && type.isDictionary)
         {
             return std::make_unique<DictionaryCategoryField>(
-                MakePlaceReader(column, type, batch->offset), TextReader(*column.dictionary, type.storage, 0),
+                MakeIndexReader(column, type, batch->offset), TextReader(*column.dictionary, type.storage, 0),
                 static_cast<std::size_t>(column.dictionary->length), field);
         }
         if (type.IsText())
