@@ -232,13 +232,15 @@ def test_a_table_that_changes_between_two_queries_is_noticed():
     quiet = Warehouse(table)
     mb.supervised_bins(mb.query_source(quiet, "duckdb", "people"), "t")
 
-    def insert(connection):
-        connection.execute("INSERT INTO people VALUES (3, 1)")
-
-    busy = Warehouse(table, len(quiet.queries) - 1, insert)
-    with pytest.raises(mb.StreamError, match="the table was changed while it was read") as error:
-        mb.supervised_bins(mb.query_source(busy, "duckdb", "people"), "t")
-    assert error.value.row is None
+    for row, sign in (
+        ("(3, 1)", "^the weights of 'x' sum to 101.0"),
+        ("(3, 2)", "^column 't': the category 2 was not"),
+    ):
+        insert = f"INSERT INTO people VALUES {row}"
+        busy = Warehouse(table, len(quiet.queries) - 1, lambda connection, sql=insert: connection.execute(sql))
+        with pytest.raises(mb.StreamError, match=f"{sign}.* the table was changed while it was read") as error:
+            mb.supervised_bins(mb.query_source(busy, "duckdb", "people"), "t")
+        assert error.value.row is None
 
 
 def test_a_query_source_gives_equal_bins_and_its_rows_to_transform():
@@ -326,6 +328,17 @@ def test_progress_tells_of_attributes_by_name(capsys):
         mb.supervised_bins(relation_of(table), "t", ["y", "x"], reduce="engine", progress=True)
     assert [number for phase, number in seen if phase == "attributes"] == [1, 0]
     assert "binning" in capsys.readouterr().err
+
+
+def test_what_the_progress_function_raises_ends_the_query(tmp_path):
+    pq.write_table(pa.table({"x": np.random.default_rng(8).normal(0, 1, 3_000_000)}), tmp_path / "rows.parquet")
+
+    def fail(phase, number):
+        raise LookupError(phase)
+
+    with pytest.raises(LookupError, match=r"query|attributes"):
+        mb.equal_frequency_bins(tmp_path / "rows.parquet", reduce="engine", temp_dir=tmp_path, progress=fail)
+    assert os.listdir(tmp_path) == ["rows.parquet"]
 
 
 def test_ctrl_c_ends_the_query_and_leaves_nothing_behind(tmp_path):

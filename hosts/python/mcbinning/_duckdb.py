@@ -86,6 +86,9 @@ class FileEngine(DuckEngine):
         percent = self._connection.query_progress()
         return percent / 100.0 if percent >= 0.0 else None
 
+    def cancel(self) -> None:
+        self._connection.interrupt()
+
     def close(self) -> None:
         self._connection.close()
         self._directory.cleanup()

@@ -33,6 +33,7 @@ from ._sources import open_batches, open_stream
 
 _SECONDS_BETWEEN_REPORTS = 0.2
 _FEW_GROUPS = 1 << 22
+"""So many, of some 100 MB, are told one by one even where that need not be."""
 _EXACT_DIGITS = 15
 """A decimal of so many digits has a double of its own, which all engines find."""
 
@@ -110,12 +111,17 @@ def _reporting_progress(engine: Engine, report: Report | None) -> Iterator[None]
         yield
         return
     is_done = threading.Event()
+    failures: list[BaseException] = []
 
     def watch() -> None:
-        while not is_done.wait(_SECONDS_BETWEEN_REPORTS):
-            share = engine.get_progress()
-            if share is not None:
-                report("query", int(100 * share))
+        try:
+            while not is_done.wait(_SECONDS_BETWEEN_REPORTS):
+                share = engine.get_progress()
+                if share is not None:
+                    report("query", int(100 * share))
+        except BaseException as failure:
+            failures.append(failure)
+            engine.cancel()
 
     watcher = threading.Thread(target=watch, daemon=True)
     watcher.start()
@@ -124,6 +130,8 @@ def _reporting_progress(engine: Engine, report: Report | None) -> Iterator[None]
     finally:
         is_done.set()
         watcher.join()
+        if failures:  # what the engine made of being cancelled tells less
+            raise failures[0]
 
 
 def _tally(plan: Plan, queries: CountedQueries) -> Tally:
@@ -190,13 +198,16 @@ class _Reducer:
 
     def bin_pair(self, pair: tuple[str, str | None]) -> _Part:
         attribute, target = pair
-        part = self._bin_groups(attribute, target)
+        try:
+            part = self._bin_groups(attribute, target)
+        except DataError as error:
+            if error.row is None:
+                raise
+            raise _changed(f"column {error.column!r}: {error.message}") from error  # in a group, which has no row
         for found in part.bins.results:
             if found.status[1] != "error" and found.weight_with_missing != self._tally.total:
-                raise StreamError(
-                    f"the weights of {attribute!r} sum to {found.weight_with_missing!r}, and all weights to "
-                    f"{self._tally.total!r}: the table was changed while it was read. Bin a snapshot of it"
-                )
+                sums = f"{found.weight_with_missing!r}, and not to {self._tally.total!r} as all weights"
+                raise _changed(f"the weights of {attribute!r} sum to {sums}")
         return part
 
     def _bin_groups(self, attribute: str, target: str | None) -> _Part:
@@ -350,6 +361,10 @@ class _Reducer:
         if target is not None:
             advice = f"pre-bin it by max_distinct, below its number of values, or {advice}"
         return f"there are more than max_groups={limit} {values}: {advice}"
+
+
+def _changed(sign: str) -> StreamError:
+    return StreamError(f"{sign}: the table was changed while it was read. Bin a snapshot of it")
 
 
 def _size(number_of_bytes: int) -> str:

@@ -224,7 +224,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         Raises
         ------
         ValueError
-            The text is no JSON of bins, or of a newer version. The message names the file, and the path of the fault in it.
+            The text is no JSON of bins, or of a newer version. The message names the file, and the path of the fault.
 
         Examples
         --------

@@ -98,7 +98,9 @@ def open_values(
         else:
             feed.declare_missing(index, _as_numbers(values, variable), variable.missing_interval, [])
         if variable.categories is not None:
-            feed.set_categories(index, _as_in_column(list(variable.categories), variable, columns[position].kind), unseen)
+            feed.set_categories(
+                index, _as_in_column(list(variable.categories), variable, columns[position].kind), unseen
+            )
     return feed
 
 
