@@ -90,6 +90,11 @@ struct AttributeBins
     /// in a time zone. Otherwise empty. It is not part of the form in JSON.
     std::vector<std::string> borderTexts;
     std::vector<Bin> bins; ///< one more than cut points, or none where nothing was binned
+    /// The records without a valid value, but with a valid category if there is a target; nothing where they are not
+    /// known. It has no borders.
+    std::optional<Bin> missing;
+    /// What is added to both weights of a bin, to tell the weight of evidence, where it has no events or no others.
+    double smoothing = 0.5;
 
     bool HasBins() const { return !bins.empty(); }
 };
@@ -109,6 +114,7 @@ struct Settings
     std::optional<int>
         maxDistinct; ///< supervised: an attribute with more distinct values is pre-binned; nothing: never
     std::optional<double> smallBinRatio; ///< supervised: the ratio to the lighter neighbour below which a bin is merged
+    double smoothing = 0.5;              ///< that of the results
 };
 
 /// How records were reduced to groups of equal values, each with its weight, before they were binned; or why not.

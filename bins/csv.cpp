@@ -1,8 +1,8 @@
 #include "bins/csv.h"
 
 #include "bins/labels.h"
-#include "bins/measures.h"
 #include "bins/numbers.h"
+#include "bins/rows.h"
 #include "bins/text.h"
 
 #include <algorithm>
@@ -37,44 +37,38 @@ std::vector<std::string> MakeHead(const Targets& targets)
     return head;
 }
 
-/// Writes the rows of the bins of one result.
-class Rows
+/// The number of a bin; of the other rows what they are.
+std::string TellBin(const BinRow& row, std::size_t index)
 {
-public:
-    Rows(const AttributeBins& bins, const Targets& targets)
-        : fBins(bins), fTargets(targets), fLabels(MakeLabels(bins)), fEvidence(ComputeEvidence(bins))
-    {
-    }
+    return row.kind == BinRow::Kind::kBin ? std::to_string(index) : row.label;
+}
 
-    std::vector<std::string> Make(std::size_t index) const
-    {
-        const Bin& bin = fBins.bins[index];
-        std::vector<std::string> row{fBins.attribute->name,
-                                     fBins.target ? fBins.target->name : "",
-                                     std::to_string(index),
-                                     fLabels[index],
-                                     FormatNumber(bin.left),
-                                     FormatNumber(bin.right),
-                                     fBins.isRightClosed ? "right" : "left",
-                                     FormatNumber(bin.weight),
-                                     FormatNumber(ComputeShare(bin.weight, fBins.weight))};
-        for (double Evidence::*const member :
-             {&Evidence::rate, &Evidence::weightOfEvidence, &Evidence::informationValue})
-            row.push_back(fEvidence.empty() ? "" : FormatNumber(fEvidence[index].*member));
-        for (const Variable* const target : fTargets)
-        {
-            for (std::size_t code = 0; code < target->categories.size(); ++code)
-                row.push_back(target == fBins.target.get() ? FormatNumber(bin.weights[code]) : "");
-        }
-        return row;
-    }
+std::string TellBorder(const BinRow& row, double border)
+{
+    return row.kind == BinRow::Kind::kBin ? FormatNumber(border) : "";
+}
 
-private:
-    const AttributeBins& fBins;
-    const Targets& fTargets;
-    std::vector<std::string> fLabels;
-    std::vector<Evidence> fEvidence;
-};
+std::vector<std::string> MakeFields(const AttributeBins& bins, const BinRow& row, std::size_t index,
+                                    const Targets& targets)
+{
+    std::vector<std::string> fields{bins.attribute->name,
+                                    bins.target ? bins.target->name : "",
+                                    TellBin(row, index),
+                                    row.label,
+                                    TellBorder(row, row.bin.left),
+                                    TellBorder(row, row.bin.right),
+                                    bins.isRightClosed ? "right" : "left",
+                                    FormatNumber(row.bin.weight),
+                                    FormatNumber(row.share)};
+    for (double Evidence::*const member : {&Evidence::rate, &Evidence::weightOfEvidence, &Evidence::informationValue})
+        fields.push_back(row.evidence ? FormatNumber((*row.evidence).*member) : "");
+    for (const Variable* const target : targets)
+    {
+        for (std::size_t code = 0; code < target->categories.size(); ++code)
+            fields.push_back(target == bins.target.get() ? FormatNumber(row.bin.weights[code]) : "");
+    }
+    return fields;
+}
 
 std::string MakeLine(std::vector<std::string> row)
 {
@@ -90,8 +84,8 @@ std::string ToCsv(const Bins& bins)
     std::string csv = MakeLine(MakeHead(targets));
     for (const AttributeBins& result : bins.results)
     {
-        const Rows rows(result, targets);
-        for (std::size_t i = 0; i < result.bins.size(); ++i) csv += MakeLine(rows.Make(i));
+        const std::vector<BinRow> rows = MakeRows(result);
+        for (std::size_t i = 0; i < rows.size(); ++i) csv += MakeLine(MakeFields(result, rows[i], i, targets));
     }
     return csv;
 }

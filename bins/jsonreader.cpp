@@ -44,6 +44,9 @@ private:
         if (!maxDistinct.IsNull())
             settings.maxDistinct = ReadInt(maxDistinct);
         settings.smallBinRatio = json.At(isOld ? "small_bins" : "small_bin_ratio").GetFigure();
+        // Until there was smoothing, there was none.
+        const auto smoothing = json.Find("smoothing");
+        settings.smoothing = smoothing ? smoothing->GetNumber() : 0.0;
         return settings;
     }
 
@@ -182,6 +185,9 @@ private:
         result.cutPoints = json.At("cut_points").GetNumbers();
         for (const JsonCursor& bin : json.At("bins").GetElements()) result.bins.push_back(ReadBin(bin, result));
         RefuseIfInconsistent(json, result);
+        result.smoothing = fBins.settings.smoothing;
+        if (const auto missing = json.Find("missing"))
+            result.missing = ReadMissingGroup(*missing, result);
         return result;
     }
 
@@ -209,6 +215,18 @@ private:
         if (fVersion == 1 && result.target)
             bin.weights.resize(std::max(bin.weights.size(), result.target->categories.size()));
         return bin;
+    }
+
+    static Bin ReadMissingGroup(const JsonCursor& json, const AttributeBins& result)
+    {
+        Bin missing;
+        missing.left = missing.right = std::numeric_limits<double>::quiet_NaN();
+        missing.weight = json.At("weight").GetNumber();
+        if (!json.At("weights").IsNull())
+            missing.weights = json.At("weights").GetNumbers();
+        if (missing.weights.size() != (result.target ? result.target->categories.size() : 0))
+            json.At("weights").Refuse("there must be a weight for each category of the target");
+        return missing;
     }
 
     /// The bins lie between the cut points, which so can't be NaN, and hold a weight for each category of the target.

@@ -21,10 +21,12 @@ JsonValue ToValue(const std::string& number)
 
 JsonValue ToValue(const Settings& settings)
 {
+    const bool isSupervised = settings.method == Method::kSupervised;
     return Object{{"closed", GetName(kClosedNames, settings.isRightClosed)},
                   {"n_bins", settings.numBins},
                   {"max_distinct", settings.maxDistinct},
-                  {"small_bin_ratio", settings.smallBinRatio}};
+                  {"small_bin_ratio", settings.smallBinRatio},
+                  {"smoothing", isSupervised ? JsonValue(settings.smoothing) : JsonValue()}};
 }
 
 JsonValue ToValue(const MCBinning::MCStatus& status)
@@ -81,13 +83,12 @@ JsonValue ToValue(const Variable& variable)
                   {"time_zone", variable.timeZone}};
 }
 
-JsonValue ToValue(const Bin& bin, const AttributeBins& bins, const Evidence* evidence)
+/// What is said of a bin, or of the missing, behind its borders. `index` is that of its evidence.
+Object MakeGroup(const Bin& bin, const AttributeBins& bins, const std::vector<Evidence>& evidence, std::size_t index)
 {
-    const auto figure = [evidence](double Evidence::*member)
-    { return evidence ? JsonValue(evidence->*member) : JsonValue(); };
-    return Object{{"left", bin.left},
-                  {"right", bin.right},
-                  {"weight", bin.weight},
+    const auto figure = [&](double Evidence::*member)
+    { return index < evidence.size() ? JsonValue(evidence[index].*member) : JsonValue(); };
+    return Object{{"weight", bin.weight},
                   {"weights", bins.target ? JsonValue(bin.weights) : JsonValue()},
                   {"rate", figure(&Evidence::rate)},
                   {"woe", figure(&Evidence::weightOfEvidence)},
@@ -99,7 +100,15 @@ JsonValue ToValue(const AttributeBins& result)
     const std::vector<Evidence> evidence = ComputeEvidence(result);
     Array bins;
     for (std::size_t i = 0; i < result.bins.size(); ++i)
-        bins.push_back(ToValue(result.bins[i], result, evidence.empty() ? nullptr : &evidence[i]));
+    {
+        Object bin{{"left", result.bins[i].left}, {"right", result.bins[i].right}};
+        for (JsonValue::Member& member : MakeGroup(result.bins[i], result, evidence, i))
+            bin.push_back(std::move(member));
+        bins.push_back(std::move(bin));
+    }
+    JsonValue missing;
+    if (result.missing)
+        missing = MakeGroup(*result.missing, result, evidence, result.bins.size());
     return Object{{"attribute", result.attribute->name},
                   {"target", result.target ? JsonValue(result.target->name) : JsonValue()},
                   {"status", ToValue(result.status)},
@@ -112,7 +121,8 @@ JsonValue ToValue(const AttributeBins& result)
                   {"model_entropy", result.modelEntropy},
                   {"information_value", ComputeInformationValue(result)},
                   {"cut_points", result.cutPoints},
-                  {"bins", bins}};
+                  {"bins", bins},
+                  {"missing", missing}};
 }
 
 JsonValue ToValue(const Reduction& reduction)

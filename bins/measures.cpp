@@ -7,12 +7,29 @@
 namespace
 {
 
-Evidence MakeEvidence(const Bin& bin, const std::vector<double>& categoryWeights)
+/// Whether the weight of evidence of a bin, or of the missing, would be infinite.
+bool IsOneSided(const Bin& bin)
 {
-    const double events = ComputeShare(bin.weights[1], categoryWeights[1]);
-    const double others = ComputeShare(bin.weights[0], categoryWeights[0]);
+    return bin.weight > 0.0 && (bin.weights[0] == 0.0 || bin.weights[1] == 0.0);
+}
+
+Evidence MakeEvidence(const Bin& bin, double smoothing, const std::vector<double>& categoryWeights)
+{
+    const double added = IsOneSided(bin) ? smoothing : 0.0;
+    const double events = ComputeShare(bin.weights[1] + added, categoryWeights[1]);
+    const double others = ComputeShare(bin.weights[0] + added, categoryWeights[0]);
     const double weightOfEvidence = events == others ? 0.0 : std::log(events / others);
     return {ComputeShare(bin.weights[1], bin.weight), weightOfEvidence, (events - others) * weightOfEvidence};
+}
+
+/// The bins, and behind them the missing if they have weight.
+std::vector<const Bin*> ListGroups(const AttributeBins& bins)
+{
+    std::vector<const Bin*> groups;
+    for (const Bin& bin : bins.bins) groups.push_back(&bin);
+    if (HasMissing(bins))
+        groups.push_back(&*bins.missing);
+    return groups;
 }
 
 } // namespace
@@ -64,13 +81,31 @@ double ComputeShare(double part, double whole)
 
 std::vector<Evidence> ComputeEvidence(const AttributeBins& bins)
 {
-    const std::vector<double> categoryWeights = SumByCategory(bins);
+    std::vector<double> categoryWeights = SumByCategory(bins);
+    if (HasMissing(bins))
+    {
+        for (std::size_t code = 0; code < categoryWeights.size(); ++code)
+            categoryWeights[code] += bins.missing->weights[code];
+    }
     std::vector<Evidence> evidence;
     if (categoryWeights.size() == 2 && categoryWeights[0] > 0.0 && categoryWeights[1] > 0.0)
     {
-        for (const Bin& bin : bins.bins) evidence.push_back(MakeEvidence(bin, categoryWeights));
+        for (const Bin* const group : ListGroups(bins))
+            evidence.push_back(MakeEvidence(*group, bins.smoothing, categoryWeights));
     }
     return evidence;
+}
+
+bool IsSmoothed(const AttributeBins& bins)
+{
+    const std::vector<const Bin*> groups = ListGroups(bins);
+    return bins.smoothing > 0.0 && !ComputeEvidence(bins).empty() &&
+           std::any_of(groups.begin(), groups.end(), [](const Bin* group) { return IsOneSided(*group); });
+}
+
+bool HasMissing(const AttributeBins& bins)
+{
+    return bins.missing && bins.missing->weight > 0.0;
 }
 
 std::optional<double> ComputeInformationValue(const AttributeBins& bins)

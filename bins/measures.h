@@ -23,20 +23,28 @@ std::optional<double> ComputeGain(const AttributeBins& bins);
 /// `part` of `whole`; 0 if the whole is.
 double ComputeShare(double part, double whole);
 
-/// What a bin says about a target of two categories, the second of which is the event.
+/// What a bin, or the records without a value, say about a target of two categories, the second of which is the event.
 struct Evidence
 {
-    /// The share of the bin's weight that has the event.
+    /// The share of the weight that has the event.
     double rate;
-    /// The weight of evidence ln(p / q): p is the bin's share of all events, and q its share of all others. Infinite
-    /// where one of them is 0, and 0 where both are.
+    /// The weight of evidence ln(p / q): p is the share of all events, and q that of all others; events and others with
+    /// a missing value are among all. Where a bin has no events or no others, the smoothing is added to both of its
+    /// weights; without smoothing the weight of evidence is infinite then. It is 0 where the bin has neither.
     double weightOfEvidence;
-    /// (p - q) ln(p / q). The sum over the bins is the information value of the attribute.
+    /// (p - q) ln(p / q). The sum over all of them is the information value of the attribute.
     double informationValue;
 };
 
-/// By bin; empty unless the target has two categories, and both have weight.
+/// By bin, and one more behind them where records without a value have weight. Empty unless the target has two
+/// categories, and both have weight.
 std::vector<Evidence> ComputeEvidence(const AttributeBins& bins);
+
+/// Whether the smoothing has changed some of the evidence.
+bool IsSmoothed(const AttributeBins& bins);
+
+/// Whether there are records without a value, and they have weight.
+bool HasMissing(const AttributeBins& bins);
 
 /// Nothing where ComputeEvidence() is empty.
 std::optional<double> ComputeInformationValue(const AttributeBins& bins);

@@ -2,6 +2,7 @@
 
 #include "bins/collect.h"
 #include "bins/gather.h"
+#include "bins/targettally.h"
 
 #include <mcobnqrt/mcobnqrt.h>
 
@@ -27,13 +28,28 @@ LibrarySettings MakeSettings(const Settings& settings, const RunHost& host)
 
 /// Takes all that the algorithm has found in a run that ended with `status`.
 template<class LibraryResult, class Algorithm>
-void Collect(Bins& bins, const MCBinning::MCStatus& status, Algorithm& algorithm, const RunHost& host)
+void Collect(Bins& bins, const MCBinning::MCStatus& status, Algorithm& algorithm, const RunHost& host,
+             const TargetTally& tally)
 {
     bins.status = status;
     bins.componentVersion = algorithm.GetVersionString();
     std::vector<LibraryResult> results;
     algorithm.GetOutput()->GetAllCutPoints(results); // its only refusal is that there are none
     for (const LibraryResult& result : results) AddResult(bins, result, *host.values);
+    for (AttributeBins& result : bins.results)
+    {
+        result.missing = tally.FindMissing(result);
+        result.smoothing = bins.settings.smoothing;
+    }
+}
+
+/// Those of the pairs or, without pairs, that of the list, if it has one.
+std::vector<int> FindTargets(const BINVarList& variables, const std::vector<int>* targets)
+{
+    if (targets != nullptr)
+        return *targets;
+    const int target = variables.GetTargetIndex();
+    return target < 0 ? std::vector<int>() : std::vector<int>{target};
 }
 
 void RunSupervised(Bins& bins, BINVarList& variables, const std::vector<int>* attributes,
@@ -50,8 +66,9 @@ void RunSupervised(Bins& bins, BINVarList& variables, const std::vector<int>* at
         bins.status = factory.GetStatus();
         return;
     }
-    const MCBinning::MCStatus status = algorithm->Run(host.records, attributes, targets);
-    Collect<BINAttributeTargetResults>(bins, status, *algorithm, host);
+    TargetTally records(*host.records, bins.variables, FindTargets(variables, targets));
+    const MCBinning::MCStatus status = algorithm->Run(&records, attributes, targets);
+    Collect<BINAttributeTargetResults>(bins, status, *algorithm, host, records);
 }
 
 void RunEqualFrequency(Bins& bins, BINVarList& variables, const std::vector<int>* attributes, const RunHost& host)
@@ -64,8 +81,9 @@ void RunEqualFrequency(Bins& bins, BINVarList& variables, const std::vector<int>
         bins.status = factory.GetStatus();
         return;
     }
-    const MCBinning::MCStatus status = algorithm->Run(host.records, attributes);
-    Collect<BINAttributeResults>(bins, status, *algorithm, host);
+    TargetTally records(*host.records, bins.variables, {});
+    const MCBinning::MCStatus status = algorithm->Run(&records, attributes);
+    Collect<BINAttributeResults>(bins, status, *algorithm, host, records);
 }
 
 } // namespace

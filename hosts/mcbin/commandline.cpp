@@ -49,16 +49,16 @@ CLI::Validator MakeNameCheck()
 }
 
 /// CLI::Range lets a NaN pass.
-CLI::Validator MakeRatioCheck()
+/// Refuses what is no finite number from 0 to `most`, which `words` tell of.
+CLI::Validator MakeNumberCheck(double most, const std::string& words)
 {
-    const auto isRatio = [](const std::string& text)
-    {
-        const std::optional<double> ratio = ParseNumber(text);
-        return ratio && *ratio >= 0.0 && *ratio <= 1.0;
-    };
-    return CLI::Validator([isRatio](const std::string& text)
-                          { return isRatio(text) ? "" : "'" + text + "' is no number from 0 to 1"; },
-                          "", "");
+    return CLI::Validator(
+        [most, words](const std::string& text)
+        {
+            const std::optional<double> number = ParseNumber(text);
+            return number && *number >= 0.0 && *number <= most ? "" : "'" + text + "' is no number " + words;
+        },
+        "", "");
 }
 
 /// A list that may be given by repeating the option; it doesn't swallow what follows.
@@ -271,8 +271,15 @@ void AddSupervised(CLI::App& app, Request& request)
     AddNumBins(command, request.bin, "The number of bins for that; 1000 if not given");
     AddRenamed(command, "--small-bin-ratio", "--small-bins", settings.smallBinRatio,
                "An inner bin of less than this share of its lighter neighbour's weight is merged, from 0 to 1",
-               MakeRatioCheck())
+               MakeNumberCheck(1.0, "from 0 to 1"))
         ->option_text("RATIO")
+        ->group("Settings");
+    command
+        .add_option("--smoothing", settings.smoothing,
+                    "Added to the weights of a bin's events and others for the WoE, where one of them is 0; 0.5 if not "
+                    "given, and with 0 such a WoE is infinite")
+        ->check(MakeNumberCheck(std::numeric_limits<double>::max(), "from 0"))
+        ->option_text("WEIGHT")
         ->group("Settings");
     AddSettings(command, request.bin);
     AddOutput(command, request.bin.output);

@@ -101,7 +101,8 @@ TEST_P(McbinApply, GivesTheWeightsOfTheTablesAndWhatTheSqlGives)
     for (const auto& row :
          Cells(Run("supervised data.csv " + (kOptions + closed) + " --format csv | sed 's/, /;/g'").out))
     {
-        if (row[0] != "attribute")
+        const bool isBin = row[2].find_first_not_of("0123456789") == std::string::npos;
+        if (isBin)
             tables[(row[0] == "\"od\"\"d\"" ? "\"od\"\"d_bin\"" : row[0] + "_bin")].push_back(std::stoi(row[7]));
     }
     EXPECT_EQ(3u, tables.size());

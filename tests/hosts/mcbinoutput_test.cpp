@@ -44,9 +44,11 @@ TEST_F(McbinOutput, EqualFrequencyTablesComeInTheOrderOfTheData)
 
     EXPECT_EQ(R"(x
   4 distinct values from 0.1 to 3, missing weight 1
-  bin          weight  share
-  (-inf, 1.5)       2  50.0%  ██████████████████████████████
-  [1.5, +inf)       2  50.0%  ██████████████████████████████
+  bin          weight   share
+  (-inf, 1.5)       2   40.0%  ██████████████████████████████
+  [1.5, +inf)       2   40.0%  ██████████████████████████████
+  missing           1   20.0%  ███████████████
+  total             5  100.0%
 
 Without cut points:
   b  warning 120019: no cut point was found: too few different values for the number of bins
@@ -62,9 +64,10 @@ TEST_F(McbinOutput, BinsOfACategoricalAttributeAreSetsOfItsCategories)
 
     EXPECT_EQ(R"(g
   4 categories from 'a, b' to 'mid', missing weight 0
-  bin                weight  share
-  {a, b, high, low}       4  66.7%  ██████████████████████████████
-  {mid}                   2  33.3%  ███████████████
+  bin                weight   share
+  {a, b, high, low}       4   66.7%  ██████████████████████████████
+  {mid}                   2   33.3%  ███████████████
+  total                   6  100.0%
 
 )",
               outcome.out);
@@ -77,7 +80,7 @@ TEST_F(McbinOutput, MoreCategoriesThanShadesShareTheLastOne)
 
     EXPECT_NE(std::string::npos, outcome.out.find("  █ adult ▓ pupil ▒ retired & <old> ░ others\n")) << outcome.out;
     EXPECT_NE(std::string::npos,
-              outcome.out.find("  bin         weight  share  adult  child  pupil  retired & <old>  student\n"))
+              outcome.out.find("  bin         weight   share  adult  child  pupil  retired & <old>  student\n"))
         << outcome.out;
 }
 
@@ -95,7 +98,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
   "schema_version": 3,
   "component_version": "Supervised Binning Component Ver. 1.0 (V)",
   "method": "supervised",
-  "settings": {"closed": "right", "n_bins": 1000, "max_distinct": null, "small_bin_ratio": 0},
+  "settings": {"closed": "right", "n_bins": 1000, "max_distinct": null, "small_bin_ratio": 0, "smoothing": 0.5},
   "data": {"name": "data.csv", "records": 4, "records_without_weight": 0, "missing_text": ["NA", "-9"]},
   "reduction": null,
   "variables": [
@@ -149,11 +152,12 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "maximum": 0.30000000000000004,
       "target_entropy": 0,
       "model_entropy": 0,
-      "information_value": null,
+      "information_value": 3.594886226455673,
       "cut_points": [],
       "bins": [
-        {"left": "-inf", "right": "inf", "weight": 2, "weights": [2, 0], "rate": null, "woe": null, "iv": null}
-      ]
+        {"left": "-inf", "right": "inf", "weight": 2, "weights": [2, 0], "rate": 0, "woe": -2.0149030205422647, "iv": 2.182811605587453}
+      ],
+      "missing": {"weight": 3, "weights": [0, 3], "rate": 1, "woe": 1.540445040947149, "iv": 1.41207462086822}
     }
   ]
 }
@@ -234,24 +238,27 @@ TEST_F(McbinOutputOnTerminal, TablesFitTheTerminalAndStandStraightWithWideCharac
     };
 
     // Of many categories the heaviest keep their columns, of two the rate tells more than both.
-    EXPECT_EQ(R"(  bin             weight  share  大阪  others
-  (-inf, 11000]       12  19.7%     0      12  ░░░░░░░░░░░░░
-  (11000, 23000]      12  19.7%    12       0  ▒▒▒▒▒▒▒▒▒▒▒▒▒
-  (23000, 35000]      12  19.7%     0      12  ▓▓▓▓▓▓▓▓▓▓▓▓▓
-  (35000, 47000]      12  19.7%     0      12  ░░░░░░░░░░░░░
-  (47000, +inf)       13  21.3%     1      12  ████████████▒
+    EXPECT_EQ(R"(  bin             weight   share  大阪  others
+  (-inf, 11000]       12   19.7%     0      12  ░░░░░░░░░░░░
+  (11000, 23000]      12   19.7%    12       0  ▒▒▒▒▒▒▒▒▒▒▒▒
+  (23000, 35000]      12   19.7%     0      12  ▓▓▓▓▓▓▓▓▓▓▓▓
+  (35000, 47000]      12   19.7%     0      12  ░░░░░░░░░░░░
+  (47000, +inf)       13   21.3%     1      12  ███████████▒
+  total               61  100.0%    13      48
   █ a very long name of a category ▓ emoji😀 ▒ 大阪 ░ others
 )",
               print("--target place", 60));
-    EXPECT_EQ(R"(  bin                        weight  share    rate
-  {a very long ..., 2 more}      36  59.0%    0.0%
-  {大阪, 東京}                   25  41.0%  100.0%
-  rate and WoE of 'nein'; information value inf
+    EXPECT_EQ(R"(  bin                        weight   share    rate
+  {a very long ..., 2 more}      36   59.0%    0.0%
+  {大阪, 東京}                   25   41.0%  100.0%
+  total                          61  100.0%   41.0%
+  rate and WoE of 'nein'; information value 8.2246
 )",
-              print("--target ja --attributes place --categorical place", 50));
-    EXPECT_EQ(R"(  bin                      weight  share
-  {a very lon..., 2 more}      36  59.0%
-  {大阪, 東京}                 25  41.0%
+              print("--target ja --attributes place --categorical place", 51));
+    EXPECT_EQ(R"(  bin                      weight   share
+  {a very lon..., 2 more}      36   59.0%
+  {大阪, 東京}                 25   41.0%
+  total                        61  100.0%
 )",
               print("--target ja --attributes place --categorical place", 40));
 }

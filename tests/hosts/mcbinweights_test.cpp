@@ -108,13 +108,13 @@ TEST_F(McbinWeights, FractionsCountUnlessRounded)
             .out;
     };
 
-    // The grid for 3 weights of at most 2.5 is 2^-49, and so 0.4 moves by 4e-16.
-    EXPECT_EQ("4.4\n2.5\n1.9000000000000004\n", weights(""));
-    EXPECT_EQ("4.4\n2.5\n1.9000000000000004\n", weights("--round none"));
+    // Of all, of two bins, and of the missing. The grid for 3 weights of at most 2.5 is 2^-49, and so 0.4 moves by 4e-16.
+    EXPECT_EQ("4.4\n2.5\n1.9000000000000004\n0\n", weights(""));
+    EXPECT_EQ("4.4\n2.5\n1.9000000000000004\n0\n", weights("--round none"));
     const Outcome table = RunOn("x,w\n1,1234567.8\n2,0.1\n2,0.2\n", "equal-frequency", "--bins 2 --weight w");
     EXPECT_NE(std::string::npos, table.out.find("(1, +inf)      0.3    0.0%")) << "few digits are enough for a person";
-    EXPECT_EQ("3\n2\n1\n", weights("--round truncate"));
-    EXPECT_EQ("5\n3\n2\n", weights("--round closest"));
+    EXPECT_EQ("3\n2\n1\n0\n", weights("--round truncate"));
+    EXPECT_EQ("5\n3\n2\n0\n", weights("--round closest"));
     EXPECT_EQ(2, Run("equal-frequency data.csv --weight w --round up").exitCode);
 }
 

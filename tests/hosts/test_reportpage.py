@@ -62,14 +62,21 @@ def findings(mcbin, browser, tmp_path_factory):
     return sorted(results, key=lambda result: result["model_entropy"] - result["target_entropy"])
 
 
+def groups_of(result):
+    """The bins, and the missing if there are any."""
+    return result["bins"] + [result["missing"]] * (result["missing"]["weight"] > 0)
+
+
 def test_the_tables_hold_the_weights_that_were_found(browser, findings):
     sections = browser.execute_script(CELLS)
 
     assert len(findings) == len(sections) == 4
     for result, (head, *rows) in zip(findings, sections):
         categories = len(result["bins"][0]["weights"])
-        assert len(rows) == len(result["bins"]) == len(result["cut_points"]) + 1
-        for bin, row in zip(result["bins"], rows):
+        groups = groups_of(result)
+        others = ["missing"] * (len(groups) - len(result["bins"])) + ["total"]
+        assert [row[0] for row in rows[len(result["bins"]) :]] == others
+        for bin, row in zip(groups, rows):
             assert [float(cell) for cell in [row[1], *row[3 : 3 + categories]]] == [bin["weight"], *bin["weights"]]
         assert ("WoE" in head) == (categories == 2)
 
@@ -80,10 +87,11 @@ def test_the_charts_have_the_shares_as_heights_and_the_colours_of_their_key(brow
     for result, rectangles in zip(findings, browser.execute_script(RECTANGLES)):
         shares = [r for r in rectangles if r["kind"] != "weight"]
         weights = [r["height"] for r in rectangles if r["kind"] == "weight"]
-        expected = [w / bin["weight"] for bin in result["bins"] for w in bin["weights"] if w > 0]
-        full = sum(r["height"] for r in shares) / len(result["bins"])
+        groups = groups_of(result)
+        expected = [w / group["weight"] for group in groups for w in group["weights"] if w > 0]
+        full = sum(r["height"] for r in shares) / len(groups)
         assert np.allclose([r["height"] / full for r in shares], expected, atol=1e-3)
-        found = [bin["weight"] for bin in result["bins"]]
+        found = [group["weight"] for group in groups]
         assert np.allclose(np.divide(weights, max(weights)), np.divide(found, max(found)), atol=1e-3)
         for r in shares:
             assert r["fill"] == r["key"]

@@ -36,7 +36,7 @@ def test_cut_point_is_the_value_at_the_closed_side():
     assert left.cut_points_[0].tolist() == [11.0]
     assert right.transform([[3.0], [3.1]]).tolist() == [[0.0], [1.0]]
     assert left.transform([[10.9], [11.0]]).tolist() == [[0.0], [1.0]]
-    assert right.bin_tables_[0]["weight[low]"].tolist() == [12.0, 0.0]
+    assert right.bin_tables_[0]["weight[low]"].tolist() == [12.0, 0.0, 12.0]
     assert right.statuses_[0].ok
 
 
@@ -88,7 +88,7 @@ def test_fractional_weights_are_used_as_they_are():
     table = mb.SupervisedBinner().fit(WITH_GAP, TWO_CLASSES, sample_weight=weights).bin_tables_[0]
 
     assert table["weight"].tolist() == pytest.approx(
-        [weights[TWO_CLASSES == "low"].sum(), weights[TWO_CLASSES == "up"].sum()]
+        [weights[TWO_CLASSES == "low"].sum(), weights[TWO_CLASSES == "up"].sum(), weights.sum()]
     )
 
 

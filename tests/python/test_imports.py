@@ -108,6 +108,6 @@ print(bins.to_sql(table="t") != bins.to_sql("duckdb", table="t"))
     others = [name for name in FEATURES if name != "pyarrow"]
 
     assert run(MAKE + use, *others).splitlines() == [
-        "['(-inf, 19]', '(19, +inf)'] [0, 0, 1, 1] 3 <BinningResult: supervised, 1 results>",
+        "['(-inf, 19]', '(19, +inf)'] [0, 0, 1, 1] 4 <BinningResult: supervised, 1 results>",
         "True",
     ]

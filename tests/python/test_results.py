@@ -226,12 +226,19 @@ def test_what_rounding_leaves_is_no_gain():
             assert str(result["x"].gain) == "0.0" and result.summary()["gain"][0] == 0.0, case
 
 
-def test_frames_have_a_row_for_each_bin(iris):
+def test_frames_have_a_row_for_each_bin_and_for_the_missing_and_the_total(iris):
+    iris.loc[:29, "petal_width"] = np.nan
+    iris.loc[140:, "species"] = np.nan  # whose records are in no row
     result = mb.supervised_bins(iris, "species")
     frame = result.to_pandas()
 
-    assert len(frame) == sum(found.n_bins for found in result.values())
-    assert frame.groupby("attribute")["weight"].sum().tolist() == [150.0] * 4
+    assert len(frame) == sum(found.n_bins + 1 for found in result.values()) + 1
+    assert frame[frame["bin"].isna()]["interval"].tolist() == ["total"] * 3 + ["missing", "total"]
+    assert frame[frame["interval"] != "total"].groupby("attribute")["weight"].sum().tolist() == [140.0] * 4
+    assert frame[frame["interval"] == "total"]["share"].tolist() == [1.0] * 4
+    missing = result["petal_width"].missing
+    assert (missing.weight, missing.target_weights, missing.woe) == (30.0, (30.0, 0.0, 0.0), None)
+    assert result["petal_length"].missing is None
     parts = frame[[f"weight[{name}]" for name in ("setosa", "versicolor", "virginica")]]
     assert parts.sum(axis=1).tolist() == frame["weight"].tolist()
     assert result.to_arrow().to_pandas().equals(frame)
@@ -261,14 +268,35 @@ def test_what_bins_say_about_an_event_is_in_every_table():
     assert found.rates.tolist() == [0.25, 0.75] and found.woe == pytest.approx(woe)
     assert found.iv == pytest.approx([math.log(3) / 2] * 2) and found.information_value == found.iv.sum()
     assert found.to_pandas()[["rate", "woe", "iv"]].to_numpy().T.tolist() == [
-        [0.25, 0.75],
-        *map(list, (found.woe, found.iv)),
+        [0.25, 0.75, 0.5],
+        [*found.woe, 0.0],
+        [*found.iv, found.information_value],
     ]
     of_four = result["x", "z"]
     assert of_four.rates is None and of_four.woe is None and "woe" not in of_four.to_pandas()
     values = dict(zip(result.summary()["target"], result.summary()["information_value"]))
     assert values["y"] == found.information_value and math.isnan(values["z"])
     assert found.information_value == json.loads(result.to_json())["results"][0]["information_value"]
+
+
+def test_the_missing_weigh_in_the_evidence_and_empty_cells_are_smoothed():
+    x = [1] * 6 + [2] * 6 + [None] * 4
+    data = pa.table({"x": pa.array(x, pa.float64()), "y": [0] * 6 + [1] * 6 + [0, 0, 0, 1]})
+    for smoothing in (0.5, 2.0, 0.0):
+        found = mb.supervised_bins(data, "y", smoothing=smoothing)["x"]
+        events, others = smoothing / 7, (6 + smoothing) / 9
+        first = math.log(events / others) if smoothing else -math.inf
+        missing = math.log((1 / 7) / (3 / 9))
+        assert found.rates.tolist() == [0.0, 1.0] and found.woe[0] == first
+        assert (found.missing.rate, found.missing.woe) == (0.25, missing)
+        assert found.information_value == found.iv.sum() + found.missing.iv
+    weighted = mb.supervised_bins(data.append_column("w", pa.array(np.arange(16) / 4)), "y", weight="w")["x"]
+    assert weighted.missing.target_weights == (3.0 + 3.25 + 3.5, 3.75)
+    again = pickle.loads(pickle.dumps(found))
+    assert again.woe.tolist() == found.woe.tolist() and again.missing == found.missing and again.smoothing == 0.0
+    for smoothing in (-1, math.inf, math.nan):
+        with pytest.raises(ValueError, match="smoothing must be a finite number of at least 0"):
+            mb.supervised_bins(data, "y", smoothing=smoothing)
 
 
 def test_copies_and_pickles_are_equal_to_the_last_bit(mixed):

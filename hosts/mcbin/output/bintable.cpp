@@ -1,8 +1,7 @@
 #include "hosts/mcbin/output/bintable.h"
 
-#include "bins/labels.h"
-#include "bins/measures.h"
 #include "bins/numbers.h"
+#include "bins/rows.h"
 #include "bins/utf8.h"
 #include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/output/sharebar.h"
@@ -39,14 +38,10 @@ struct Extent
 /// The bins, and what is said of them in every table, however wide it is.
 struct Content
 {
-    explicit Content(const AttributeBins& attributeBins)
-        : bins(attributeBins), labels(MakeLabels(bins)), evidence(ComputeEvidence(bins))
-    {
-    }
+    explicit Content(const AttributeBins& attributeBins) : bins(attributeBins), rows(MakeRows(bins)) {}
 
     const AttributeBins& bins;
-    std::vector<std::string> labels;
-    std::vector<Evidence> evidence; ///< by bin; empty unless the target has two categories
+    std::vector<BinRow> rows; ///< with evidence if the target has two categories
 };
 
 Extent MakeWidest(const Content& content, const Screen& screen)
@@ -54,7 +49,7 @@ Extent MakeWidest(const Content& content, const Screen& screen)
     constexpr std::size_t kNumRates = 3;
     const Variable* const target = content.bins.target.get();
     return {std::min(kMostCategoryColumns, target ? target->categories.size() : 0),
-            content.evidence.empty() ? 0 : kNumRates, true,
+            content.rows.front().evidence ? kNumRates : 0, true,
             std::min(kWidestLabel, screen.width.value_or(2 * kWidestLabel) / 2)};
 }
 
@@ -90,7 +85,9 @@ std::vector<std::string> MakeHead(const AttributeBins& bins, const std::vector<s
 /// The interval, or as many of the bin's categories as have room.
 std::string MakeLabel(const Content& content, std::size_t index, std::size_t width)
 {
-    std::string label = Printable(content.labels[index]);
+    std::string label = Printable(content.rows[index].label);
+    if (content.rows[index].kind != BinRow::Kind::kBin)
+        return label;
     std::vector<std::string> categories = ListCategories(content.bins, index);
     if (categories.empty() || GetWidth(label) <= width)
         return label;
@@ -117,20 +114,20 @@ void AppendCategories(std::vector<std::string>& row, const Bin& bin, const std::
         row.push_back(FormatWeight(others));
 }
 
-std::vector<std::string> MakeRow(const Content& content, std::size_t index, const std::vector<std::size_t>& codes,
-                                 const Extent& extent)
+std::vector<std::string> MakeCells(const Content& content, std::size_t index, const std::vector<std::size_t>& codes,
+                                   const Extent& extent)
 {
-    const Bin& bin = content.bins.bins[index];
-    std::vector<std::string> row{MakeLabel(content, index, extent.labelWidth), FormatWeight(bin.weight),
-                                 fmt::format("{:.1f}%", 100.0 * ComputeShare(bin.weight, content.bins.weight))};
-    AppendCategories(row, bin, codes);
+    const BinRow& row = content.rows[index];
+    std::vector<std::string> cells{MakeLabel(content, index, extent.labelWidth), FormatWeight(row.bin.weight),
+                                   fmt::format("{:.1f}%", 100.0 * row.share)};
+    AppendCategories(cells, row.bin, codes);
     if (extent.numRates > 0)
-        row.push_back(fmt::format("{:.1f}%", 100.0 * content.evidence[index].rate));
+        cells.push_back(fmt::format("{:.1f}%", 100.0 * row.evidence->rate));
     if (extent.numRates > 1)
-        row.push_back(fmt::format("{:+.3f}", content.evidence[index].weightOfEvidence));
+        cells.push_back(FormatWeightOfEvidence(row));
     if (extent.numRates > 2)
-        row.push_back(fmt::format("{:.4f}", content.evidence[index].informationValue));
-    return row;
+        cells.push_back(fmt::format("{:.4f}", row.evidence->informationValue));
+    return cells;
 }
 
 std::vector<std::size_t> GetWidths(const std::vector<std::vector<std::string>>& rows)
@@ -151,11 +148,11 @@ std::string Align(const std::vector<std::string>& row, const std::vector<std::si
     return line;
 }
 
-Rows MakeRows(const Content& content, const Extent& extent)
+Rows MakeCells(const Content& content, const Extent& extent)
 {
-    const std::vector<std::size_t> codes = FindHeaviest(SumByCategory(content.bins), extent.numCategories);
+    const std::vector<std::size_t> codes = FindHeaviest(content.rows.back().bin.weights, extent.numCategories);
     Rows rows{MakeHead(content.bins, codes, extent)};
-    for (std::size_t i = 0; i < content.bins.bins.size(); ++i) rows.push_back(MakeRow(content, i, codes, extent));
+    for (std::size_t i = 0; i < content.rows.size(); ++i) rows.push_back(MakeCells(content, i, codes, extent));
     return rows;
 }
 
@@ -175,24 +172,26 @@ void PrintBinTable(std::ostream& os, const AttributeBins& bins, const Screen& sc
     constexpr std::size_t kGap = 2; // in front of the bar
     const Content content(bins);
     Extent extent = MakeWidest(content, screen);
-    Rows rows = MakeRows(content, extent);
+    Rows rows = MakeCells(content, extent);
     const auto fits = [&]
     {
         const std::optional<std::size_t> room = GetRoom(rows, screen);
         return room && (!extent.hasBar || *room >= kGap + kNarrowestBar);
     };
-    while (!fits() && Narrow(extent)) rows = MakeRows(content, extent);
+    while (!fits() && Narrow(extent)) rows = MakeCells(content, extent);
 
     const std::size_t room = GetRoom(rows, screen).value_or(0);
     const std::vector<std::size_t> widths = GetWidths(rows);
     const ShareBar bar(bins, extent.hasBar ? std::min(room - kGap, kWidestBar) : 0, screen.hasColours);
     os << Align(rows.front(), widths) << '\n';
-    for (std::size_t i = 0; i < bins.bins.size(); ++i)
-        os << Align(rows[i + 1], widths) << bar.Draw(bins.bins[i]) << '\n';
+    for (std::size_t i = 0; i < content.rows.size(); ++i)
+    {
+        const bool isTotal = content.rows[i].kind == BinRow::Kind::kTotal;
+        os << Align(rows[i + 1], widths) << (isTotal ? "" : bar.Draw(content.rows[i].bin)) << '\n';
+    }
     os << bar.GetLegend();
     if (extent.numRates > 0)
-    {
-        os << "  rate and WoE of " << Quote(bins.target->categories[1]) << "; information value "
-           << fmt::format("{:.4f}", *ComputeInformationValue(bins)) << '\n';
-    }
+        os << "  " << DescribeEvidence(bins) << '\n';
+    if (const std::string words = DescribeSmoothing(bins); extent.numRates > 1 && !words.empty())
+        os << "  " << words << '\n';
 }

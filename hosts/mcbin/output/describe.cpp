@@ -4,6 +4,8 @@
 #include "bins/numbers.h"
 #include "bins/text.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <numeric>
 
@@ -45,6 +47,22 @@ std::string DescribeWithoutWeight(const Bins& bins)
 {
     const std::int64_t number = bins.numRecordsWithoutWeight.value_or(0);
     return number == 0 ? "" : std::to_string(number) + (number == 1 ? " record" : " records");
+}
+
+std::string DescribeEvidence(const AttributeBins& bins)
+{
+    return fmt::format("rate and WoE of {}; information value {:.4f}", Quote(bins.target->categories[1]),
+                       *ComputeInformationValue(bins));
+}
+
+std::string DescribeSmoothing(const AttributeBins& bins)
+{
+    return IsSmoothed(bins) ? FormatNumber(bins.smoothing) + " added where a category has no weight" : "";
+}
+
+std::string FormatWeightOfEvidence(const BinRow& row)
+{
+    return row.kind == BinRow::Kind::kTotal ? "" : fmt::format("{:+.3f}", row.evidence->weightOfEvidence);
 }
 
 std::vector<std::string> ListCategories(const AttributeBins& bins, std::size_t bin)

@@ -1,8 +1,7 @@
 #include "hosts/mcbin/output/htmlreport.h"
 
-#include "bins/labels.h"
-#include "bins/measures.h"
 #include "bins/numbers.h"
+#include "bins/rows.h"
 #include "bins/words.h"
 #include "hosts/mcbin/outcome.h"
 #include "hosts/mcbin/output/describe.h"
@@ -63,8 +62,14 @@ void PrintOverviewRow(std::ostream& os, const AttributeBins& bins, bool hasTarge
         os << fmt::format("<td>{:.4f}</td><td class=\"meter\"><span style=\"width:{:.1f}%\"></span>{:.1f}%</td>", gain,
                           100.0 * share, 100.0 * share);
     }
-    os << "<td>" << bins.bins.size() << "</td><td>" << bins.numDistinct << "</td><td>" << FormatMissing(bins)
-       << "</td></tr>\n";
+    if (hasTarget)
+    {
+        const std::optional<double> value = ComputeInformationValue(bins);
+        os << "<td>" << (value ? fmt::format("{:.4f}", *value) : "") << "</td>";
+    }
+    os << "<td>" << bins.bins.size() << "</td><td>" << bins.numDistinct
+       << fmt::format("</td><td>{:.1f}%</td></tr>\n",
+                      100.0 * ComputeShare(bins.weightWithMissing - bins.weight, bins.weightWithMissing));
 }
 
 void PrintOverview(std::ostream& os, const std::vector<const AttributeBins*>& results, bool hasTarget)
@@ -72,7 +77,7 @@ void PrintOverview(std::ostream& os, const std::vector<const AttributeBins*>& re
     if (results.empty())
         return;
     os << "<div class=\"scroll\"><table id=\"overview\">\n<tr><th>attribute</th>"
-       << (hasTarget ? "<th>gain, bits</th><th>of the entropy</th>" : "")
+       << (hasTarget ? "<th>gain, bits</th><th>of the entropy</th><th>IV</th>" : "")
        << "<th>bins</th><th>distinct</th><th>missing</th></tr>\n";
     for (std::size_t i = 0; i < results.size(); ++i) PrintOverviewRow(os, *results[i], hasTarget, i + 1);
     os << "</table></div>\n";
@@ -88,26 +93,34 @@ void PrintBinsHead(std::ostream& os, const AttributeBins& bins, bool hasEvidence
     os << (hasEvidence ? "<th>rate</th><th>WoE</th><th>IV</th>" : "") << "</tr>\n";
 }
 
+void PrintRow(std::ostream& os, const BinRow& row)
+{
+    os << (row.kind == BinRow::Kind::kBin ? "<tr>" : "<tr class=\"" + row.label + "\">") << "<td>"
+       << EscapeHtml(row.label) << "</td><td>" << FormatWeight(row.bin.weight)
+       << fmt::format("</td><td>{:.1f}%</td>", 100.0 * row.share);
+    for (const double weight : row.bin.weights) os << "<td>" << FormatWeight(weight) << "</td>";
+    if (row.evidence)
+    {
+        os << fmt::format("<td>{:.1f}%</td><td>{}</td><td>{:.4f}</td>", 100.0 * row.evidence->rate,
+                          FormatWeightOfEvidence(row), row.evidence->informationValue);
+    }
+    os << "</tr>\n";
+}
+
 void PrintBins(std::ostream& os, const AttributeBins& bins)
 {
-    const std::vector<std::string> labels = MakeLabels(bins);
-    const std::vector<Evidence> evidence = ComputeEvidence(bins);
+    const std::vector<BinRow> rows = MakeRows(bins);
+    const bool hasEvidence = rows.front().evidence.has_value();
     os << "<div class=\"scroll\"><table class=\"bins\">\n";
-    PrintBinsHead(os, bins, !evidence.empty());
-    for (std::size_t i = 0; i < bins.bins.size(); ++i)
-    {
-        const Bin& bin = bins.bins[i];
-        os << "<tr><td>" << EscapeHtml(labels[i]) << "</td><td>" << FormatWeight(bin.weight)
-           << fmt::format("</td><td>{:.1f}%</td>", 100.0 * ComputeShare(bin.weight, bins.weight));
-        for (const double weight : bin.weights) os << "<td>" << FormatWeight(weight) << "</td>";
-        if (!evidence.empty())
-        {
-            os << fmt::format("<td>{:.1f}%</td><td>{:+.3f}</td><td>{:.4f}</td>", 100.0 * evidence[i].rate,
-                              evidence[i].weightOfEvidence, evidence[i].informationValue);
-        }
-        os << "</tr>\n";
-    }
+    PrintBinsHead(os, bins, hasEvidence);
+    for (const BinRow& row : rows) PrintRow(os, row);
     os << "</table></div>\n";
+    if (hasEvidence)
+    {
+        const std::string smoothing = DescribeSmoothing(bins);
+        os << "<p class=\"note\">" << EscapeHtml(DescribeEvidence(bins)) << (smoothing.empty() ? "" : "; ") << smoothing
+           << ".</p>\n";
+    }
 }
 
 void PrintFigures(std::ostream& os, const AttributeBins& bins)
@@ -115,8 +128,8 @@ void PrintFigures(std::ostream& os, const AttributeBins& bins)
     os << "<p>";
     if (const std::optional<double> gain = ComputeGain(bins))
     {
-        os << fmt::format("Gain {:.4f} bits: entropy ", *gain) << FormatNumber(*ComputeTargetEntropy(bins))
-           << " before, " << FormatNumber(*bins.modelEntropy) << " after. ";
+        os << fmt::format("Gain {:.4f} bits: entropy {:.4f} before, {:.4f} after. ", *gain, *ComputeTargetEntropy(bins),
+                          *bins.modelEntropy);
     }
     os << EscapeHtml(DescribeValues(bins)) << ", missing weight " << FormatMissing(bins) << '.';
     if (!bins.status.IsOK())

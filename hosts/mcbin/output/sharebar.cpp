@@ -1,7 +1,7 @@
 #include "hosts/mcbin/output/sharebar.h"
 
 #include "bins/labels.h"
-#include "bins/measures.h"
+#include "bins/rows.h"
 #include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/text.h"
 
@@ -19,7 +19,11 @@ constexpr std::array<const char*, 4> kColours{"\x1b[34m", "\x1b[33m", "\x1b[35m"
 double GetLargestWeight(const AttributeBins& bins)
 {
     double largest = 0.0;
-    for (const Bin& bin : bins.bins) largest = std::max(largest, bin.weight);
+    for (const BinRow& row : MakeRows(bins))
+    {
+        if (row.kind != BinRow::Kind::kTotal)
+            largest = std::max(largest, row.bin.weight);
+    }
     return largest;
 }
 

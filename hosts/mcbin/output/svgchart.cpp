@@ -1,8 +1,7 @@
 #include "hosts/mcbin/output/svgchart.h"
 
-#include "bins/labels.h"
-#include "bins/measures.h"
 #include "bins/numbers.h"
+#include "bins/rows.h"
 #include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/text.h"
 
@@ -26,6 +25,7 @@ constexpr double kGap = 10.0; ///< between the stacks and the weights
 constexpr double kWeightHeight = 56.0;
 constexpr double kLabelHeight = 22.0;
 constexpr double kLabelWidth = 52.0; ///< room for one cut point
+constexpr double kMissingGap = 0.5;  ///< in front of the missing, in widths of a bin
 constexpr std::size_t kNumColours = 7;
 constexpr std::size_t kOthersColour = 7;
 
@@ -41,7 +41,8 @@ struct Layout
 Layout MakeLayout(const AttributeBins& bins)
 {
     Layout layout{};
-    layout.binWidth = (kWidth - kLeft - kRight) / static_cast<double>(bins.bins.size());
+    const double numColumns = static_cast<double>(bins.bins.size()) + (HasMissing(bins) ? 1.0 + kMissingGap : 0.0);
+    layout.binWidth = (kWidth - kLeft - kRight) / numColumns;
     layout.stackHeight = !bins.target ? 0.0 : kStackHeight;
     layout.weightTop = kTop + layout.stackHeight + (!bins.target ? 0.0 : kGap);
     layout.height = layout.weightTop + kWeightHeight + kLabelHeight;
@@ -145,8 +146,10 @@ void PrintChart(std::ostream& os, const AttributeBins& bins)
 {
     const Layout layout = MakeLayout(bins);
     const std::vector<std::size_t> colours = ChooseColours(bins);
+    std::vector<BinRow> rows = MakeRows(bins);
+    rows.pop_back(); // the total
     double heaviest = 0.0;
-    for (const Bin& bin : bins.bins) heaviest = std::max(heaviest, bin.weight);
+    for (const BinRow& row : rows) heaviest = std::max(heaviest, row.bin.weight);
 
     if (const Variable* const target = bins.target.get())
         PrintKey(os, *target, colours);
@@ -154,16 +157,19 @@ void PrintChart(std::ostream& os, const AttributeBins& bins)
                       layout.height, EscapeHtml(bins.attribute->name));
     PrintAxes(os, layout, heaviest);
     double x = kLeft;
-    const std::vector<std::string> labels = MakeLabels(bins);
-    for (std::size_t i = 0; i < bins.bins.size(); ++i)
+    for (const BinRow& row : rows)
     {
-        const Bin& bin = bins.bins[i];
+        const Bin& bin = row.bin;
+        if (row.kind == BinRow::Kind::kMissing)
+        {
+            x += kMissingGap * layout.binWidth;
+            PrintText(os, x + layout.binWidth / 2, layout.height - 7.0, "middle", row.label);
+        }
         if (bins.target)
-            PrintStack(os, *bins.target, bin, labels[i], layout, x, colours);
+            PrintStack(os, *bins.target, bin, row.label, layout, x, colours);
         const double height = kWeightHeight * ComputeShare(bin.weight, heaviest);
         PrintRectangle(os, "weight", x, layout.weightTop + kWeightHeight - height, layout.binWidth - 1.0, height,
-                       fmt::format("{}: weight {}, {:.1f}%", labels[i], FormatWeight(bin.weight),
-                                   100.0 * ComputeShare(bin.weight, bins.weight)));
+                       fmt::format("{}: weight {}, {:.1f}%", row.label, FormatWeight(bin.weight), 100.0 * row.share));
         x += layout.binWidth;
     }
     PrintCutPoints(os, bins, layout);

@@ -36,7 +36,7 @@ void PrintHeading(std::ostream& os, const AttributeBins& bins, const Screen& scr
         os << fmt::format(": gain {:.4f} bits, {:.1f}%", *gain, 100.0 * ComputeShare(*gain, *entropy));
     os << '\n';
     if (gain)
-        os << "  entropy " << FormatNumber(*entropy) << " before, " << FormatNumber(*bins.modelEntropy) << " after\n";
+        os << fmt::format("  entropy {:.4f} before, {:.4f} after\n", *entropy, *bins.modelEntropy);
     os << "  " << DescribeValues(bins) << ", missing weight " << FormatWeight(bins.weightWithMissing - bins.weight)
        << '\n';
 }

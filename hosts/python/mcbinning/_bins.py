@@ -71,6 +71,27 @@ class Variable:
         return [_values.decode(number, self.kind, self.time_zone) for number in self.categories or ()]
 
 
+@dataclass(frozen=True)
+class Missing:
+    """The records without a valid value of the attribute, but with a category if there is a target."""
+
+    weight: float
+    target_weights: tuple[float, ...]
+    """By category of the target."""
+    rate: float | None
+    """As of a bin; None unless the target has two categories."""
+    woe: float | None
+    iv: float | None
+
+    @classmethod
+    def of_rows(cls, rows: list[Any]) -> Missing | None:
+        """None where no such record has weight."""
+        for kind, _, _, _, weight, _, target_weights, evidence in rows:
+            if kind == "missing":
+                return cls(weight, tuple(target_weights), *(evidence or (None,) * 3))
+        return None
+
+
 class AttributeBins:
     """The bins of one attribute, against one target or none."""
 
@@ -102,12 +123,15 @@ class AttributeBins:
         self.rates = core.rates
         """By bin: the share of the target's second category, the event; None unless the target has two categories."""
         self.woe = core.woe
-        """By bin: the weight of evidence ln(p / q), where p is the bin's share of all events, and q of all others; None
-        unless the target has two categories."""
+        """By bin: the weight of evidence ln(p / q), where p is the bin's share of all events, and q of all others, also
+        of those with a missing value; None unless the target has two categories."""
         self.iv = core.iv
         """By bin: its part of the information value, (p - q) ln(p / q); None unless the target has two categories."""
         self.information_value = core.information_value
-        """The sum over the bins; NaN unless the target has two categories."""
+        """The sum over the bins and the missing; NaN unless the target has two categories."""
+        self.smoothing = core.smoothing
+        """What is added to both weights of a bin, for its weight of evidence, where one of them is 0."""
+        self.missing = Missing.of_rows(core.rows)
 
     def __reduce__(self) -> tuple[Any, ...]:
         return _restore_bins, (self._core.alone().to_json(),)
@@ -142,27 +166,27 @@ class AttributeBins:
 
     def to_pandas(self) -> pd.DataFrame:
         """A row for each bin: its ends, its weight and share, and its weight in each category of the target; of a
-        target of two categories `rate`, `woe` and `iv`, too."""
+        target of two categories `rate`, `woe` and `iv`, too. Behind the bins a row for the missing, if they have
+        weight, and one for the total; they have no number."""
         pandas = require("pandas", "data frames", "pandas")
-        ends = [-np.inf, *self.cut_points, np.inf]
-        n = self.n_bins
-        with np.errstate(invalid="ignore", divide="ignore"):
-            shares = self.weights / self.weights.sum()
+        rows = self._core.rows
+        numbers = [index if row[0] == "bin" else None for index, row in enumerate(rows)]
         columns: dict[str, Any] = {
-            "attribute": [self.attribute] * n,
-            "target": [self.target.name if self.target else None] * n,
-            "bin": np.arange(n),
-            "interval": self.labels,
-            "left": ends[:n],
-            "right": ends[1 : n + 1],
-            "weight": self.weights,
-            "share": shares,
+            "attribute": [self.attribute] * len(rows),
+            "target": [self.target.name if self.target else None] * len(rows),
+            "bin": pandas.array(numbers, dtype="Int64"),
+            "interval": [row[1] for row in rows],
+            "left": [row[2] for row in rows],
+            "right": [row[3] for row in rows],
+            "weight": [row[4] for row in rows],
+            "share": [row[5] for row in rows],
         }
-        if self.target is not None and self.target_weights is not None:
+        if self.target is not None:
             for code, name in enumerate(self.target.category_names()):
-                columns[f"weight[{name}]"] = self.target_weights[:, code]
+                columns[f"weight[{name}]"] = [row[6][code] for row in rows]
         if self.rates is not None:
-            columns |= {"rate": self.rates, "woe": self.woe, "iv": self.iv}
+            evidence = [row[7] or (np.nan,) * 3 for row in rows]
+            columns |= {name: [row[i] for row in evidence] for i, name in enumerate(("rate", "woe", "iv"))}
         frame: pd.DataFrame = pandas.DataFrame(columns)
         return frame
 

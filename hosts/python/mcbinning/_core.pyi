@@ -67,6 +67,11 @@ class AttributeBins:
     woe: _Floats | None
     iv: _Floats | None
     information_value: float
+    smoothing: float
+    rows: list[tuple[str, str, float, float, float, float, list[float], tuple[float, float, float] | None]]
+    """Of each bin, the missing if they have weight, and the total: "bin", "missing" or "total", the label, the borders,
+    the weight and its share of the total, the weight in each category of the target, and rate, weight of evidence and
+    information value."""
 
     def find_bin(self, value: float) -> int: ...
     def alone(self) -> Bins:
@@ -88,6 +93,7 @@ class Bins:
     n_bins: int
     max_distinct: int | None
     small_bin_ratio: float | None
+    smoothing: float
     data_name: str | None
     records: int | None
     records_without_weight: int | None
@@ -141,6 +147,7 @@ class Feed:
         n_bins: int,
         max_distinct: int | None = None,
         small_bin_ratio: float | None = None,
+        smoothing: float = 0.5,
         right_closed: bool,
         data_name: str | None = None,
     ) -> Bins:
@@ -154,6 +161,7 @@ class Feed:
         n_bins: int,
         max_distinct: int | None = None,
         small_bin_ratio: float | None = None,
+        smoothing: float = 0.5,
         right_closed: bool,
         data_name: str | None = None,
         temp_dir: str,

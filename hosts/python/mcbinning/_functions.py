@@ -30,6 +30,7 @@ def supervised_bins(
     n_bins: int = 1000,
     closed: Closed = "right",
     small_bin_ratio: float = 0.0,
+    smoothing: float = 0.5,
     rounding: Rounding = "none",
     reduce: Reduce | None = None,
     max_groups: int = 20_000_000,
@@ -75,6 +76,9 @@ def supervised_bins(
         The side of a bin that belongs to it: (a, b] or [a, b).
     small_bin_ratio : float, default=0.0
         An inner bin whose weight is below this share, 0 to 1, of its lighter neighbour's is merged away.
+    smoothing : float, default=0.5
+        What is added to the weights of a bin's events and others for the weight of evidence, where one of them is 0.
+        With 0 such a weight of evidence is infinite.
     rounding : {"none", "truncate", "closest"}, default="none"
         Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
         two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
@@ -148,7 +152,7 @@ def supervised_bins(
         raise TypeError("either target or pairs must be given")
     if pairs is not None and attributes is not None:
         raise TypeError("pairs name the attributes, so attributes can't be given, too")
-    check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding)
+    check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding, smoothing=smoothing)
     reducing = Reducing(reduce, max_groups, distinct)
     source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
     target, weight = (None if label is None else name_of(label) for label in (target, weight))
@@ -157,7 +161,7 @@ def supervised_bins(
     else:
         wanted = [(name, target) for name in names_to_bin(source, attributes, [target, weight])]
     plan = Plan(source, wanted, target, weight, name_missing(missing), rounding)
-    settings = RunSettings(n_bins, max_distinct, small_bin_ratio, closed == "right", directory_of(temp_dir))
+    settings = RunSettings(n_bins, max_distinct, small_bin_ratio, smoothing, closed == "right", directory_of(temp_dir))
     bins = run(plan, settings, reducing, progress)
     left_out = columns_left_out(source, plan.names) if attributes is None and pairs is None else None
     return make_result(bins, left_out)
@@ -254,6 +258,6 @@ def equal_frequency_bins(
     weight = None if weight is None else name_of(weight)
     names = names_to_bin(source, attributes, [weight])
     plan = Plan(source, [(name, None) for name in names], None, weight, name_missing(missing), rounding)
-    settings = RunSettings(n_bins, None, None, closed == "right", directory_of(temp_dir))
+    settings = RunSettings(n_bins, None, None, 0.5, closed == "right", directory_of(temp_dir))
     bins = run(plan, settings, reducing, progress)
     return make_result(bins, columns_left_out(source, plan.names) if attributes is None else None)

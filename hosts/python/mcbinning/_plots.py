@@ -16,6 +16,10 @@ if TYPE_CHECKING:
     from ._result import BinningResult
 
 
+_GAP = 0.03
+"""In front of the missing, as a share of the width of all."""
+
+
 def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
     plt = require("matplotlib.pyplot", "plots", "plot")
 
@@ -26,14 +30,21 @@ def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> m
     if found.n_bins == 0:
         ax.text(0.5, 0.5, found.status.words, ha="center", wrap=True, transform=ax.transAxes)
         return ax
-    widths = found.weights / found.weights.sum()
-    lefts = np.concatenate([[0.0], np.cumsum(widths)[:-1]])
-    if found.target is None or found.target_weights is None:
-        ax.bar(lefts, found.weights, widths, align="edge", edgecolor="white", color="C0")
+    weights, target_weights = found.weights, found.target_weights
+    if found.missing is not None:
+        weights = np.append(weights, found.missing.weight)
+    widths = weights / weights.sum()
+    lefts = np.cumsum(widths) - widths
+    if found.missing is not None:
+        lefts[-1] += _GAP
+    if found.target is None or target_weights is None:
+        ax.bar(lefts, weights, widths, align="edge", edgecolor="white", color="C0")
         ax.set_ylabel("weight")
     else:
+        if found.missing is not None:
+            target_weights = np.vstack([target_weights, found.missing.target_weights])
         with np.errstate(invalid="ignore", divide="ignore"):
-            shares = np.nan_to_num(found.target_weights / found.weights[:, np.newaxis])
+            shares = np.nan_to_num(target_weights / weights[:, np.newaxis])
         bottoms = np.zeros(len(widths))
         for code, name in enumerate(found.target.category_names()):
             ax.bar(
@@ -43,8 +54,12 @@ def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> m
         ax.set_ylim(0.0, 1.0)
         ax.set_ylabel(f"share of {found.target.name}")
         ax.legend(title=found.target.name, fontsize="small")
-    ax.set_xlim(0.0, 1.0)
-    ax.set_xticks(lefts[1:], found.border_texts, rotation=45, ha="right")
+    ticks, texts = list(lefts[1 : found.n_bins]), list(found.border_texts)
+    if found.missing is not None:
+        ticks.append(lefts[-1] + widths[-1] / 2)
+        texts.append("missing")
+    ax.set_xlim(0.0, lefts[-1] + widths[-1])
+    ax.set_xticks(ticks, texts, rotation=45, ha="right")
     ax.set_xlabel(f"{found.attribute}: cut points, over the share of the weight")
     return ax
 

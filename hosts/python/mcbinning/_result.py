@@ -30,6 +30,7 @@ class Settings:
     n_bins: int
     max_distinct: int | None
     small_bin_ratio: float | None
+    smoothing: float
 
 
 @dataclass(frozen=True)
@@ -60,7 +61,9 @@ class BinningResult(Mapping[Any, AttributeBins]):
         tell_in_time_zones(core)
         self._core = core
         self.method = cast(Method, core.method)
-        self.settings = Settings(cast(Closed, core.closed), core.n_bins, core.max_distinct, core.small_bin_ratio)
+        self.settings = Settings(
+            cast(Closed, core.closed), core.n_bins, core.max_distinct, core.small_bin_ratio, core.smoothing
+        )
         self.variables = tuple(map(Variable.from_core, core.variables))
         self.status = Status.from_core(core.status)
         self.bins = tuple(map(AttributeBins, core.results))

@@ -2,6 +2,7 @@
 
 from __future__ import annotations
 
+import math
 import numbers
 import os
 from dataclasses import dataclass
@@ -22,13 +23,15 @@ class RunSettings:
     n_bins: int
     max_distinct: int | None
     small_bin_ratio: float | None
+    smoothing: float
     right_closed: bool
     temp_dir: str
 
     @property
     def keywords(self) -> dict[str, Any]:
         """Of the core's operations."""
-        return {name: getattr(self, name) for name in ("n_bins", "max_distinct", "small_bin_ratio", "right_closed")}
+        names = ("n_bins", "max_distinct", "small_bin_ratio", "smoothing", "right_closed")
+        return {name: getattr(self, name) for name in names}
 
 
 @dataclass(frozen=True)
@@ -48,7 +51,13 @@ class Reducing:
 
 
 def check_settings(
-    closed: str, n_bins: int, max_distinct: int | None = None, small_bin_ratio: float = 0.0, *, rounding: str = "none"
+    closed: str,
+    n_bins: int,
+    max_distinct: int | None = None,
+    small_bin_ratio: float = 0.0,
+    *,
+    rounding: str = "none",
+    smoothing: float = 0.5,
 ) -> None:
     if closed not in ("right", "left"):
         raise ValueError(f"closed must be 'right' or 'left', not {closed!r}")
@@ -57,6 +66,8 @@ def check_settings(
         check_whole("max_distinct", max_distinct, 1)
     if not 0.0 <= small_bin_ratio <= 1.0:
         raise ValueError(f"small_bin_ratio must be from 0 to 1, not {small_bin_ratio}")
+    if not 0.0 <= smoothing < math.inf:
+        raise ValueError(f"smoothing must be a finite number of at least 0, not {smoothing}")
     if rounding not in ("none", "truncate", "closest"):
         raise ValueError(f"rounding must be 'none', 'truncate' or 'closest', not {rounding!r}")
 

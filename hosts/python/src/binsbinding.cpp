@@ -10,6 +10,7 @@
 #include "bins/lookup.h"
 #include "bins/measures.h"
 #include "bins/numbers.h"
+#include "bins/rows.h"
 #include "bins/sql.h"
 #include "bins/words.h"
 #include "hosts/python/src/arrays.h"
@@ -99,10 +100,32 @@ nb::object GetTargetWeights(const AttributeBins& bins)
 /// None unless the target has two categories.
 nb::object GetEvidence(const AttributeBins& bins, double Evidence::*figure)
 {
-    const std::vector<Evidence> evidence = ComputeEvidence(bins);
+    std::vector<Evidence> evidence = ComputeEvidence(bins);
     if (evidence.empty())
         return nb::none();
+    evidence.resize(bins.bins.size()); // without that of the missing
     return Collect(evidence, [figure](const Evidence& ofBin) { return ofBin.*figure; });
+}
+
+/// Of each row of the table a tuple: what it is, its label, its borders, its weight, its share, its weight in each
+/// category, and its rate, weight of evidence and information value, or None.
+nb::list GetRows(const AttributeBins& bins)
+{
+    static constexpr std::pair<const char*, BinRow::Kind> kKinds[] = {
+        {"bin", BinRow::Kind::kBin}, {"missing", BinRow::Kind::kMissing}, {"total", BinRow::Kind::kTotal}};
+    nb::list rows;
+    for (const BinRow& row : MakeRows(bins))
+    {
+        nb::object evidence = nb::none();
+        if (row.evidence)
+        {
+            evidence =
+                nb::make_tuple(row.evidence->rate, row.evidence->weightOfEvidence, row.evidence->informationValue);
+        }
+        rows.append(nb::make_tuple(GetName(kKinds, row.kind), row.label, row.bin.left, row.bin.right, row.bin.weight,
+                                   row.share, row.bin.weights, evidence));
+    }
+    return rows;
 }
 
 /// The bins as the only result of a run, of which nothing else is known.
@@ -110,6 +133,7 @@ Bins MakeAlone(const AttributeBins& bins)
 {
     Bins alone;
     alone.settings.isRightClosed = bins.isRightClosed;
+    alone.settings.smoothing = bins.smoothing;
     alone.variables.push_back(bins.attribute);
     if (bins.target)
         alone.variables.push_back(bins.target);
@@ -233,6 +257,8 @@ void BindAttributeBins(nb::module_& module)
         .def_prop_ro("rates", [](Self self) { return GetEvidence(self, &Evidence::rate); })
         .def_prop_ro("woe", [](Self self) { return GetEvidence(self, &Evidence::weightOfEvidence); })
         .def_prop_ro("iv", [](Self self) { return GetEvidence(self, &Evidence::informationValue); })
+        .def_prop_ro("rows", &GetRows)
+        .def_ro("smoothing", &AttributeBins::smoothing)
         .def_prop_ro("information_value", [](Self self) { return ToNumber(ComputeInformationValue(self)); })
         .def("find_bin", [](Self self, double value) { return FindBin(self.cutPoints, self.isRightClosed, value); })
         .def("alone", &MakeAlone);
@@ -266,6 +292,7 @@ void BindBins(nb::module_& module)
         .def_prop_ro("n_bins", [](Self self) { return self.settings.numBins; })
         .def_prop_ro("max_distinct", [](Self self) { return self.settings.maxDistinct; })
         .def_prop_ro("small_bin_ratio", [](Self self) { return self.settings.smallBinRatio; })
+        .def_prop_ro("smoothing", [](Self self) { return self.settings.smoothing; })
         .def_ro("data_name", &Bins::dataName)
         .def_rw("records", &Bins::numRecords, nb::arg().none())
         .def_rw("records_without_weight", &Bins::numRecordsWithoutWeight, nb::arg().none())

@@ -30,23 +30,24 @@ namespace
 /// Bins the attributes; in a supervised run `targets` has that of each.
 Bins BinFeed(Feed& feed, std::vector<int> attributes, std::optional<std::vector<int>> targets,
              std::optional<int> target, int numBins, std::optional<int> maxDistinct,
-             std::optional<double> smallBinRatio, bool isRightClosed, const std::optional<std::string>& dataName,
-             std::string tempDir, const nb::object& progress)
+             std::optional<double> smallBinRatio, double smoothing, bool isRightClosed,
+             const std::optional<std::string>& dataName, std::string tempDir, const nb::object& progress)
 {
     const Method method = targets ? Method::kSupervised : Method::kEqualFrequency;
     RunRequest request{std::move(attributes), {}, target, std::move(tempDir)};
     if (targets)
         request.targets = std::move(*targets);
-    return feed.Bin({method, isRightClosed, numBins, maxDistinct, smallBinRatio}, request, dataName, progress);
+    return feed.Bin({method, isRightClosed, numBins, maxDistinct, smallBinRatio, smoothing}, request, dataName,
+                    progress);
 }
 
 /// The bins that BinFeed() would give, without a result. `hasTargets` tells whether the run is supervised.
 Bins DescribeFeed(const Feed& feed, bool hasTargets, std::optional<int> target, int numBins,
-                  std::optional<int> maxDistinct, std::optional<double> smallBinRatio, bool isRightClosed,
-                  const std::optional<std::string>& dataName)
+                  std::optional<int> maxDistinct, std::optional<double> smallBinRatio, double smoothing,
+                  bool isRightClosed, const std::optional<std::string>& dataName)
 {
     const Method method = hasTargets ? Method::kSupervised : Method::kEqualFrequency;
-    return feed.Describe({method, isRightClosed, numBins, maxDistinct, smallBinRatio}, target, dataName);
+    return feed.Describe({method, isRightClosed, numBins, maxDistinct, smallBinRatio, smoothing}, target, dataName);
 }
 
 /// The step of the grid of weights, of which so many are positive, as the product of two powers of two.
@@ -139,10 +140,10 @@ NB_MODULE(_core, module)
         .def("read", &Feed::Read, "max_rows"_a)
         .def("spool", &Feed::SpoolRecords, "directory"_a)
         .def("describe", &DescribeFeed, nb::kw_only(), "has_targets"_a, "target"_a.none() = nb::none(), "n_bins"_a,
-             "max_distinct"_a.none() = nb::none(), "small_bin_ratio"_a.none() = nb::none(), "right_closed"_a,
-             "data_name"_a.none() = nb::none())
+             "max_distinct"_a.none() = nb::none(), "small_bin_ratio"_a.none() = nb::none(),
+             "smoothing"_a = Settings().smoothing, "right_closed"_a, "data_name"_a.none() = nb::none())
         .def("bin", &BinFeed, "attributes"_a, "targets"_a.none() = nb::none(), nb::kw_only(),
              "target"_a.none() = nb::none(), "n_bins"_a, "max_distinct"_a.none() = nb::none(),
-             "small_bin_ratio"_a.none() = nb::none(), "right_closed"_a, "data_name"_a.none() = nb::none(), "temp_dir"_a,
-             "progress"_a.none());
+             "small_bin_ratio"_a.none() = nb::none(), "smoothing"_a = Settings().smoothing, "right_closed"_a,
+             "data_name"_a.none() = nb::none(), "temp_dir"_a, "progress"_a.none());
 }

@@ -50,6 +50,7 @@ Bins ManyThings()
     bins.results[0].maximum = 70.25;
     bins.results[0].modelEntropy = 0.1;
     bins.results[0].numDistinct = 12;
+    bins.results[0].missing = Bin{0.0, 0.0, 1.5, {1.5, 0.0}};
     bins.results[1].status = MCBinning::MCStatus(MCBinning::BINStatusNoCutPoints, true);
     bins.results[1].status.SetDiscreteDatum(1, -7);
     bins.results[1].status.SetScaleDatum(2, std::numeric_limits<double>::quiet_NaN());
@@ -110,7 +111,8 @@ TEST(BinsAsJson, ObjectsStandOnLinesOfTheirOwnAndNumbersAreShort)
 {
     const std::string json = ToJson(ManyThings());
     for (const char* const part : {
-             "{\"closed\": \"right\", \"n_bins\": 1000, \"max_distinct\": 50, \"small_bin_ratio\": 0.25},\n",
+             "{\"closed\": \"right\", \"n_bins\": 1000, \"max_distinct\": 50, \"small_bin_ratio\": 0.25, "
+             "\"smoothing\": 0.5},\n",
              "      \"name\": \"age \\\"in years\\\"\",\n      \"label\": \"\xC3\xA9\\u0001\",\n",
              "{\"values\": [999, \"-inf\"], \"texts\": [\"unknown\"], \"interval\": [\"-inf\", -1]}",
              "      \"categories\": [0, 2.5],\n",
@@ -157,6 +159,9 @@ TEST(BinsAsJson, FaultsNameTheirPlace)
         {{"results", "1", "bins"},
          JsonValue::Array(),
          "results[1].bins: there must be one bin more than there are cut points"},
+        {{"results", "0", "missing", "weights"},
+         JsonValue::Array{1},
+         "results[0].missing.weights: there must be a weight for each category of the target"},
         {{"results", "1", "bins", "1", "weights"},
          JsonValue::Array{1},
          "results[1].bins[1].weights: there must be a weight for each category of the target"},
@@ -180,8 +185,13 @@ TEST(BinsAsCsv, HaveARowForEachBin)
     bins.results.erase(bins.results.begin());
     EXPECT_EQ("attribute,target,bin,label,left,right,closed,weight,share,rate,woe,iv,weight:0,weight:2.5\n"
               "colour,bought,0,{it's},-inf,0.5,right,8,0.6666666666666666,0.25,0,0,6,2\n"
-              "colour,bought,1,{red},0.5,inf,right,4,0.3333333333333333,0.25,0,0,3,1\n",
+              "colour,bought,1,{red},0.5,inf,right,4,0.3333333333333333,0.25,0,0,3,1\n"
+              "colour,bought,total,total,,,right,12,1,0.25,0,0,9,3\n",
               ToCsv(bins));
+    bins.results[0].missing = Bin{0.0, 0.0, 3.0, {3.0, 0.0}};
+    bins.results[0].smoothing = 0.0;
+    EXPECT_NE(std::string::npos, ToCsv(bins).find("colour,bought,missing,missing,,,right,3,0.2,0,-inf,inf,3,0\n"))
+        << ToCsv(bins);
     EXPECT_EQ("\" a\"", QuoteField(" a", ','));
     EXPECT_EQ("\"a\"\"b;\"", QuoteField("a\"b;", ';'));
     EXPECT_EQ("a;b", QuoteField("a;b", ','));

@@ -1,4 +1,4 @@
-#include "bins/measures.h"
+#include "bins/rows.h"
 
 #include "tests/support/samplebins.h"
 
@@ -35,7 +35,8 @@ TEST(Measures, GainIsTheTargetEntropyLessTheModelEntropyUnlessRoundingLeftIt)
 
 TEST(Measures, EvidenceIsOfTheSecondOfTwoCategories)
 {
-    const AttributeBins bins = SomeBins(AVariable("x"), ATarget(2), {1, 2, 3}, {{6, 2}, {2, 4}, {0, 2}, {0, 0}});
+    AttributeBins bins = SomeBins(AVariable("x"), ATarget(2), {1, 2, 3}, {{6, 2}, {2, 4}, {0, 2}, {0, 0}});
+    bins.smoothing = 0.0;
 
     const std::vector<Evidence> evidence = ComputeEvidence(bins);
 
@@ -50,9 +51,40 @@ TEST(Measures, EvidenceIsOfTheSecondOfTwoCategories)
     EXPECT_EQ(0.0, evidence[3].informationValue);
     EXPECT_EQ(std::numeric_limits<double>::infinity(), ComputeInformationValue(bins));
 
+    EXPECT_FALSE(IsSmoothed(bins));
+
     EXPECT_TRUE(ComputeEvidence(SomeBins(AVariable("x"), ATarget(3), {}, {{1, 1, 1}})).empty());
     EXPECT_TRUE(ComputeEvidence(SomeBins(AVariable("x"), ATarget(2), {1}, {{2, 0}, {1, 0}})).empty());
     EXPECT_EQ(std::nullopt, ComputeInformationValue(SomeBins(AVariable("x"), ATarget(2), {}, {})));
+}
+
+TEST(Measures, TheMissingAreAmongAllAndEmptyCellsAreSmoothed)
+{
+    AttributeBins bins = SomeBins(AVariable("x"), ATarget(2), {1}, {{6, 2}, {0, 4}});
+    bins.missing = Bin{0.0, 0.0, 4.0, {2.0, 2.0}};
+
+    const std::vector<Evidence> evidence = ComputeEvidence(bins);
+
+    ASSERT_EQ(3U, evidence.size());
+    EXPECT_EQ(std::log((2.0 / 8.0) / (6.0 / 8.0)), evidence[0].weightOfEvidence) << "no cell of it is empty";
+    EXPECT_EQ(1.0, evidence[1].rate) << "a rate is not smoothed";
+    EXPECT_EQ(std::log((4.5 / 8.0) / (0.5 / 8.0)), evidence[1].weightOfEvidence);
+    EXPECT_EQ(0.0, evidence[2].weightOfEvidence);
+    EXPECT_EQ(evidence[0].informationValue + evidence[1].informationValue, ComputeInformationValue(bins));
+    EXPECT_TRUE(IsSmoothed(bins));
+
+    const std::vector<BinRow> rows = MakeRows(bins);
+    ASSERT_EQ(4U, rows.size());
+    EXPECT_EQ("missing", rows[2].label);
+    EXPECT_EQ(0.25, rows[2].share);
+    EXPECT_EQ(BinRow::Kind::kTotal, rows[3].kind);
+    EXPECT_EQ((std::vector<double>{8.0, 8.0}), rows[3].bin.weights);
+    EXPECT_EQ(0.5, rows[3].evidence->rate);
+    EXPECT_EQ(*ComputeInformationValue(bins), rows[3].evidence->informationValue);
+
+    bins.missing->weight = 0.0;
+    EXPECT_EQ(3U, MakeRows(bins).size()) << "what has no weight has no row";
+    EXPECT_TRUE(MakeRows(SomeBins(AVariable("x"), nullptr, {}, {})).empty());
 }
 
 TEST(Measures, ResultsAreInTheOrderOfTheirGain)

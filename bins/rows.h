@@ -1,0 +1,31 @@
+#ifndef MCOBNQRT_BINS_ROWS_H
+#define MCOBNQRT_BINS_ROWS_H
+
+#include "bins/bins.h"
+#include "bins/measures.h"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+/// A row of each table of bins, whoever prints it.
+struct BinRow
+{
+    enum class Kind
+    {
+        kBin,
+        kMissing, ///< the records without a valid value
+        kTotal
+    };
+
+    Kind kind = Kind::kBin;
+    std::string label;
+    Bin bin;
+    double share = 0.0;               ///< of the total
+    std::optional<Evidence> evidence; ///< where there is any; of the total the rate and the information value
+};
+
+/// The bins, the missing if they have weight, and the total. Empty without bins.
+std::vector<BinRow> MakeRows(const AttributeBins& bins);
+
+#endif

@@ -1,0 +1,43 @@
+#ifndef MCOBNQRT_BINS_TARGETTALLY_H
+#define MCOBNQRT_BINS_TARGETTALLY_H
+
+#include "bins/bins.h"
+
+#include <mcobnqrt/ibinrecordsource.h>
+
+#include <cstddef>
+#include <memory>
+#include <optional>
+#include <vector>
+
+/// Hands the records of another source on, and adds up the weights of the targets' categories. What the bins of an
+/// attribute lack of these are the records without a value: as all sums of weights on a grid are exact, so is the
+/// difference.
+class TargetTally : public IBINRecordSource
+{
+public:
+    /// \param records stays the caller's.
+    /// \param targets indices of variables.
+    TargetTally(IBINRecordSource& records, const std::vector<std::shared_ptr<const Variable>>& variables,
+                const std::vector<int>& targets);
+
+    bool HasNext() override { return fRecords.HasNext(); }
+    const MCCommon::Record* Next() override;
+
+    /// What the bins of a result lack, once all records have passed; nothing if the result has no bins.
+    std::optional<Bin> FindMissing(const AttributeBins& bins) const;
+
+private:
+    struct Target
+    {
+        const Variable* variable;
+        int index;
+        std::vector<double> weights; ///< by code
+    };
+
+    IBINRecordSource& fRecords;
+    std::optional<int> fWeight; ///< the index of the weight
+    std::vector<Target> fTargets;
+};
+
+#endif
