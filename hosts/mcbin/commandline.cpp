@@ -207,14 +207,18 @@ void AddOutput(CLI::App& command, OutputOptions& output)
             "--format",
             [&output](const std::string& name)
             {
-                const std::map<std::string, Format> formats{
-                    {"table", Format::kTable}, {"json", Format::kJson}, {"csv", Format::kCsv}, {"sql", Format::kSql}};
+                const std::map<std::string, Format> formats{{"table", Format::kTable},
+                                                            {"html", Format::kHtml},
+                                                            {"json", Format::kJson},
+                                                            {"csv", Format::kCsv},
+                                                            {"sql", Format::kSql}};
                 output.format = formats.at(name);
             },
-            "table: to read (the default), with control characters of the data as \\x0a. json: everything, for apply "
-            "and other programs. csv: a row for each bin. "
-            "sql: a CASE expression for each attribute")
-        ->check(CLI::IsMember({"table", "json", "csv", "sql"}))
+            "table: to read (the default), with control characters of the data as \\x0a. html: the page that --report "
+            "writes. json: everything, for apply, show and other programs. csv: a row for each bin, the missing and "
+            "the "
+            "total. sql: a CASE expression for each attribute")
+        ->check(CLI::IsMember({"table", "html", "json", "csv", "sql"}))
         ->option_text("FORMAT")
         ->group("Output");
     command
@@ -227,6 +231,8 @@ void AddOutput(CLI::App& command, OutputOptions& output)
         ->check(CLI::IsMember({"standard", "duckdb"}))
         ->option_text("standard|duckdb")
         ->group("Output");
+    command.add_flag("--labels", output.areLabels, "With --format sql: intervals, not the numbers of the bins from 0")
+        ->group("Output");
     command.add_option("--report", output.report, "Write a page with tables and charts, too")
         ->check(MakeNameCheck())
         ->check(CLI::Validator(
@@ -235,7 +241,11 @@ void AddOutput(CLI::App& command, OutputOptions& output)
         ->group("Output");
     command.add_flag("--strict", output.isStrict, "End with exit code 3 if an attribute carries a warning or an error")
         ->group("Output");
-    command.add_flag("--quiet", output.isQuiet, "Show no progress")->group("Output");
+}
+
+void AddQuiet(CLI::App& command, bool& isQuiet)
+{
+    command.add_flag("--quiet", isQuiet, "Show no progress")->group("Output");
 }
 
 void AddSupervised(CLI::App& app, Request& request)
@@ -283,6 +293,7 @@ void AddSupervised(CLI::App& app, Request& request)
         ->group("Settings");
     AddSettings(command, request.bin);
     AddOutput(command, request.bin.output);
+    AddQuiet(command, request.bin.output.isQuiet);
     command.footer(kSupervisedExamples);
     command.callback(
         [&request, target, pairs]
@@ -308,6 +319,7 @@ void AddEqualFrequency(CLI::App& app, Request& request)
     AddNumBins(command, request.bin, "The number of bins to aim at; 10 if not given");
     AddSettings(command, request.bin);
     AddOutput(command, request.bin.output);
+    AddQuiet(command, request.bin.output.isQuiet);
     command.footer(kEqualFrequencyExamples);
     command.callback(
         [&request]
@@ -320,13 +332,27 @@ void AddEqualFrequency(CLI::App& app, Request& request)
         });
 }
 
+void AddBins(CLI::App& command, std::string& bins)
+{
+    command.add_option("BINS", bins, "The bins, as --format json has written them")
+        ->required()
+        ->option_text("BINS.json");
+}
+
+void AddShow(CLI::App& app, Request& request)
+{
+    CLI::App& command = *app.add_subcommand("show", "Show bins that were found before, in another form");
+    AddBins(command, request.show.bins);
+    AddOutput(command, request.show.output);
+    command.footer(kShowExamples);
+    command.callback([&request] { request.command = Request::Command::kShow; });
+}
+
 void AddApply(CLI::App& app, Request& request)
 {
     ApplyOptions& options = request.apply;
     CLI::App& command = *app.add_subcommand("apply", "Add the bins of each attribute to a file as new columns");
-    command.add_option("BINS", options.bins, "The bins, as --format json has written them")
-        ->required()
-        ->option_text("BINS.json");
+    AddBins(command, options.bins);
     AddTable(command, options.table);
     AddMissing(command, options.missingText, options.isBadMissing);
     options.output = "-";
@@ -337,7 +363,7 @@ void AddApply(CLI::App& app, Request& request)
     command.add_flag("--labels", options.areLabels, "Write intervals, not the numbers of the bins from 0")
         ->group("Output");
     command.add_flag("--in-place-columns", options.isInPlace, "Write the bins in place of the values")->group("Output");
-    command.add_flag("--quiet", options.isQuiet, "Show no progress")->group("Output");
+    AddQuiet(command, options.isQuiet);
     command.footer(kApplyExamples);
     command.callback([&request] { request.command = Request::Command::kApply; });
 }
@@ -408,6 +434,7 @@ std::unique_ptr<CLI::App> MakeApp(Request& request)
     app->footer(std::string("'mcbin COMMAND --help' tells of the options of a command.\n\n") + kExitCodes);
     AddSupervised(*app, request);
     AddEqualFrequency(*app, request);
+    AddShow(*app, request);
     AddApply(*app, request);
     app->final_callback(
         [&request]

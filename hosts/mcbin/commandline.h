@@ -14,12 +14,14 @@ struct Request
         kNone,
         kSupervised,
         kEqualFrequency,
+        kShow,
         kApply,
         kText ///< to print `text` and end
     };
 
     Command command = Command::kNone;
     BinOptions bin;     ///< of the first two commands
+    ShowOptions show;   ///< of kShow
     ApplyOptions apply; ///< of kApply
     std::string text;   ///< the help, the version or the manual page
 };

@@ -19,6 +19,12 @@ inline constexpr const char* kEqualFrequencyExamples = R"(Examples:
   mcbin equal-frequency iris.csv --n-bins 4
   zcat big.csv.gz | mcbin equal-frequency - --attributes 'amount_*' --n-bins 20 --format sql)";
 
+inline constexpr const char* kShowExamples = R"(Examples:
+  mcbin supervised loans.csv --target default --format json > bins.json
+  mcbin show bins.json
+  mcbin show bins.json --format html > bins.html
+  mcbin show bins.json --format sql --dialect duckdb --labels)";
+
 inline constexpr const char* kApplyExamples = R"(Examples:
   mcbin supervised train.csv --target bought --format json > bins.json
   mcbin apply bins.json new.csv -o new_binned.csv

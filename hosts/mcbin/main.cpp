@@ -5,6 +5,7 @@
 #include "hosts/mcbin/apply.h"
 #include "hosts/mcbin/commandline.h"
 #include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/jsoninput.h"
 #include "hosts/mcbin/input/tablereader.h"
 #include "hosts/mcbin/interrupt.h"
 #include "hosts/mcbin/output/htmlreport.h"
@@ -33,22 +34,33 @@ constexpr int kUsage = 2;
 constexpr int kFlagged = 3;
 constexpr int kInterrupted = 130;
 
+std::string MakePage(const Outcome& outcome)
+{
+    std::ostringstream page;
+    PrintHtml(page, outcome);
+    return page.str();
+}
+
 std::string Print(const Outcome& outcome, const OutputOptions& options)
 {
     switch (options.format)
     {
     case Format::kTable:
-        break;
+    {
+        std::ostringstream os;
+        PrintTables(os, outcome, {GetTerminalWidth(STDOUT_FILENO), HasColours(STDOUT_FILENO)});
+        return os.str();
+    }
+    case Format::kHtml:
+        return MakePage(outcome);
     case Format::kJson:
         return ToJson(outcome.bins);
     case Format::kCsv:
         return ToCsv(outcome.bins);
     case Format::kSql:
-        return ToSql(outcome.bins, {options.dialect, false});
+        return ToSql(outcome.bins, {options.dialect, options.areLabels});
     }
-    std::ostringstream os;
-    PrintTables(os, outcome, {GetTerminalWidth(STDOUT_FILENO), HasColours(STDOUT_FILENO)});
-    return os.str();
+    return "";
 }
 
 /// Prints a message on standard error, in one line. Messages quote names and texts of the data, so they are made
@@ -72,9 +84,7 @@ std::exception_ptr WriteReport(OutputFile& report, const Outcome& outcome)
     try
     {
         ThrowIfInterrupted();
-        std::ostringstream page;
-        PrintHtml(page, outcome);
-        report.Write(page.str());
+        report.Write(MakePage(outcome));
         report.Commit();
     }
     catch (const Failure&)
@@ -100,6 +110,34 @@ int GetExitCode(const Outcome& outcome, bool isStrict)
     return isStrict && std::any_of(outcome.bins.results.begin(), outcome.bins.results.end(), isFlagged) ? kFlagged : 0;
 }
 
+/// A name that can't be written is found out before the work.
+std::optional<OutputFile> OpenReport(const OutputOptions& options)
+{
+    return options.report.empty() ? std::nullopt : std::optional<OutputFile>(std::in_place, options.report);
+}
+
+/// Prints and writes what was asked for. \return the exit code.
+int Present(const Outcome& outcome, const OutputOptions& options, std::optional<OutputFile>& report)
+{
+    const std::exception_ptr failure = report ? WriteReport(*report, outcome) : nullptr;
+    WriteOut(Print(outcome, options));
+    for (const std::string& note : outcome.notes) Tell(note);
+    // JSON and the tables hold these attributes with their status.
+    if (options.format == Format::kSql || options.format == Format::kCsv)
+    {
+        for (const std::string& unbinned : DescribeUnbinned(outcome.bins)) Tell(unbinned);
+    }
+    if (failure)
+        std::rethrow_exception(failure);
+    return GetExitCode(outcome, options.isStrict);
+}
+
+int Show(const ShowOptions& options)
+{
+    std::optional<OutputFile> report = OpenReport(options.output);
+    return Present({ReadJson(options.bins), {}, {}}, options.output, report);
+}
+
 int Bin(const BinOptions& options)
 {
     Progress progress(IsTerminal(STDERR_FILENO) && !options.output.isQuiet);
@@ -107,22 +145,8 @@ int Bin(const BinOptions& options)
     tableOptions.isReadTwice = true;
     tableOptions.spoolDirectory = options.tempDirectory;
     TableReader table(tableOptions);
-    // A name that can't be written is found out before the work.
-    std::optional<OutputFile> report;
-    if (!options.output.report.empty())
-        report.emplace(options.output.report);
-    const Outcome outcome = FindBins(table, options, progress);
-    const std::exception_ptr failure = report ? WriteReport(*report, outcome) : nullptr;
-    WriteOut(Print(outcome, options.output));
-    for (const std::string& note : outcome.notes) Tell(note);
-    // JSON and the tables hold these attributes with their status.
-    if (options.output.format == Format::kSql || options.output.format == Format::kCsv)
-    {
-        for (const std::string& unbinned : DescribeUnbinned(outcome.bins)) Tell(unbinned);
-    }
-    if (failure)
-        std::rethrow_exception(failure);
-    return GetExitCode(outcome, options.output.isStrict);
+    std::optional<OutputFile> report = OpenReport(options.output);
+    return Present(FindBins(table, options, progress), options.output, report);
 }
 
 int Run(int argc, char** argv)
@@ -143,6 +167,8 @@ int Run(int argc, char** argv)
         WriteOut(request.text);
         return 0;
     }
+    if (request.command == Request::Command::kShow)
+        return Show(request.show);
     if (request.command != Request::Command::kApply)
         return Bin(request.bin);
     Progress progress(IsTerminal(STDERR_FILENO) && !request.apply.isQuiet);

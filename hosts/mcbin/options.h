@@ -30,6 +30,7 @@ struct ColumnOptions
 enum class Format
 {
     kTable,
+    kHtml,
     kJson,
     kCsv,
     kSql
@@ -40,8 +41,9 @@ struct OutputOptions
     Format format = Format::kTable;
     std::string report; ///< the file for the page; empty for none
     SqlDialect dialect = SqlDialect::kStandard;
-    bool isStrict = false; ///< the exit code tells of a warning
-    bool isQuiet = false;  ///< no progress line, even on a terminal
+    bool areLabels = false; ///< in SQL: the intervals, not the numbers of the bins
+    bool isStrict = false;  ///< the exit code tells of a warning
+    bool isQuiet = false;   ///< no progress line, even on a terminal
 };
 
 struct BinOptions
@@ -50,6 +52,12 @@ struct BinOptions
     ColumnOptions columns;
     Settings settings;
     std::string tempDirectory; ///< empty for the library's default
+    OutputOptions output;
+};
+
+struct ShowOptions
+{
+    std::string bins; ///< the file that was written as JSON
     OutputOptions output;
 };
 

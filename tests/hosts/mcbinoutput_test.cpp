@@ -183,6 +183,26 @@ TEST_F(McbinOutput, ThePageHasTheFiguresOfTheTables)
     EXPECT_EQ(std::string::npos, page.find("<old>"));
 }
 
+TEST_F(McbinOutput, BinsAreShownAgainAsTheRunThatFoundThemShowedThem)
+{
+    const std::string options = "--target y --missing x=7 --smoothing 1 ";
+    const std::string data = "x,c,y\n1,5,a\n2,5,a\n3,5,a\n4,5,b\n5,5,b\n6,5,b\n7,5,a\n8,5,b\n";
+    Write("bins.json", RunOn(data, "supervised", options + "--format json").out);
+    for (const char* const form : {"table", "html", "json", "csv", "sql", "sql --dialect duckdb --labels"})
+    {
+        const Outcome run = RunOn(data, "supervised", options + "--format " + form);
+        const Outcome shown = Run("show bins.json --format " + std::string(form));
+        EXPECT_FALSE(run.out.empty()) << form;
+        EXPECT_EQ(run.out, shown.out) << form;
+        EXPECT_EQ(run.err, shown.err) << form;
+    }
+    EXPECT_EQ(3, Run("show bins.json --strict --report page.html").exitCode) << "of one value, and so with a warning";
+    EXPECT_EQ(Run("show bins.json --format html").out, ReadFile(fData.File("page.html")));
+    EXPECT_NE(std::string::npos, Run("show bins.json --format sql --labels").out.find("THEN '(-inf, 3]'"));
+    EXPECT_EQ("mcbin: data.csv: line 1: this is not JSON\n", Run("show data.csv").err);
+    EXPECT_EQ(2, Run("show").exitCode);
+}
+
 TEST_F(McbinOutput, HelpAndManualPageHaveTheSameTexts)
 {
     const Outcome help = Run("supervised --help");

@@ -299,6 +299,33 @@ def test_the_missing_weigh_in_the_evidence_and_empty_cells_are_smoothed():
             mb.supervised_bins(data, "y", smoothing=smoothing)
 
 
+def test_the_best_attributes_are_selected_and_scored(iris):
+    iris["noise"] = np.random.default_rng(0).normal(size=150)
+    with pytest.warns(mb.NoCutPointsWarning):
+        result = mb.supervised_bins(iris, "species")
+    assert list(result.select(top=2)) == ["petal_width", "petal_length"]
+    assert list(result.select(min_gain=0.6)) == ["petal_width", "petal_length", "sepal_length"]
+    assert len(result.select(min_iv=0.0)) == 0 and len(result.select()) == 5
+    assert result.select(top=1).transform(iris).columns.tolist() == ["petal_width_bin"]
+    assert mb.BinningResult.from_json(result.select(top=1).to_json()).summary()["gain"].tolist() == [
+        result["petal_width"].gain
+    ]
+    features = iris.drop(columns="species")
+    assert mb.information_gain(features, iris["species"]).tolist() == [result[name].gain for name in features]
+
+    is_setosa = (iris["species"] == "setosa").to_numpy()
+    with pytest.warns(mb.NoCutPointsWarning):
+        of_two = mb.supervised_bins(features.assign(y=is_setosa), "y")
+    values = mb.information_value(features, is_setosa)
+    assert values.tolist() == [of_two[name].information_value for name in features]
+    chosen = of_two.select(min_iv=1.0, top=3)
+    assert [found.information_value for found in chosen.bins] == sorted(values, reverse=True)[:3]
+    with pytest.raises(ValueError, match="one of two classes"):
+        mb.information_value(features, iris["species"])
+    with pytest.raises(ValueError, match="top must be at least 0"):
+        result.select(top=-1)
+
+
 def test_copies_and_pickles_are_equal_to_the_last_bit(mixed):
     result = mb.supervised_bins(mixed.assign(kind=mixed["y"]), "y", missing={"x": 0.1})
     fitted = mb.SupervisedBinner(encode="interval").fit(mixed[["x", "zoned"]], mixed["y"])

@@ -5,6 +5,7 @@ The estimators work in scikit-learn, on data in memory. The functions work on st
 
 from __future__ import annotations
 
+from importlib import import_module as _import_module
 from typing import TYPE_CHECKING as _TYPE_CHECKING
 from typing import Any as _Any
 
@@ -30,6 +31,7 @@ from ._status import Status
 
 if _TYPE_CHECKING:
     from ._estimators import EqualFrequencyBinner, SupervisedBinner
+    from ._scores import information_gain, information_value
 
 __all__ = [
     "AttributeBins",
@@ -49,20 +51,28 @@ __all__ = [
     "SupervisedBinner",
     "__version__",
     "equal_frequency_bins",
+    "information_gain",
+    "information_value",
     "query_source",
     "supervised_bins",
 ]
 
 
+_OF_SKLEARN = {
+    "EqualFrequencyBinner": "_estimators",
+    "SupervisedBinner": "_estimators",
+    "information_gain": "_scores",
+    "information_value": "_scores",
+}
+
+
 def __getattr__(name: str) -> _Any:
-    """The estimators, with which scikit-learn is loaded."""
-    if name not in ("EqualFrequencyBinner", "SupervisedBinner"):
+    """The estimators and the scores, with which scikit-learn is loaded."""
+    if name not in _OF_SKLEARN:
         raise AttributeError(f"module {__name__!r} has no attribute {name!r}")
     for package in ("sklearn", "pandas"):
         _require(package, "the estimators", "sklearn")
-    from . import _estimators
-
-    return getattr(_estimators, name)
+    return getattr(_import_module(f".{_OF_SKLEARN[name]}", __name__), name)
 
 
 def __dir__() -> list[str]:

@@ -111,6 +111,8 @@ class Bins:
     def set_weight_grid(self, step: float | None) -> None: ...
     def add_part(self, part: Bins, attribute: int, target: int, n_distinct: int | None = None) -> None:
         """Adds what a run of one attribute has found, with the indices that it and its target, or -1, have here."""
+    def select(self, indices: list[int]) -> Bins:
+        """With some of the results alone, in the order of the indices."""
     def columns(self, taken: list[str]) -> list[tuple[int, str]]:
         """Of each column of bins the index of its result, and its name."""
     def to_json(self) -> str: ...

@@ -120,6 +120,56 @@ class BinningResult(Mapping[Any, AttributeBins]):
         """With the largest gain first; those without one, in their order, last."""
         return sorted(self.bins, key=lambda found: -found.gain if found.gain == found.gain else np.inf)
 
+    def select(
+        self, *, min_gain: float | None = None, min_iv: float | None = None, top: int | None = None
+    ) -> BinningResult:
+        """Keeps the attributes that tell most about their target.
+
+        Parameters
+        ----------
+        min_gain : float, default=None
+            The least gain, in bits. None: any.
+        min_iv : float, default=None
+            The least information value; results of targets that have not two categories have none, and are left out.
+            None: any.
+        top : int, default=None
+            How many to keep at most: those with the largest information value if `min_iv` is given, else with the
+            largest gain. None: all.
+
+        Returns
+        -------
+        BinningResult
+            The results that are kept, the best first.
+
+        Raises
+        ------
+        ValueError
+            `top` is below 0.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> people = pd.DataFrame({"age": range(12), "size": [3] * 12, "bought": 6 * ["no"] + 6 * ["yes"]})
+        >>> bins = mb.supervised_bins(people, target="bought", attributes=["age"])
+        >>> list(bins.select(min_iv=0.02, top=10))
+        ['age']
+        """
+        if top is not None and top < 0:
+            raise ValueError(f"top must be at least 0, not {top}")
+
+        def rank(found: AttributeBins) -> float:
+            value = found.gain if min_iv is None else found.information_value
+            return -value if value == value else np.inf
+
+        # A figure that was not found is NaN, and reaches no bound.
+        kept = [
+            index
+            for index, found in sorted(enumerate(self.bins), key=lambda pair: rank(pair[1]))
+            if (min_gain is None or found.gain >= min_gain) and (min_iv is None or found.information_value >= min_iv)
+        ]
+        return BinningResult(self._core.select(kept[:top]), self.left_out)
+
     def summary(self) -> pd.DataFrame:
         """A row for each attribute, with the largest gain first, and for each column that was left out. Targets of two
         categories have an `information_value`."""

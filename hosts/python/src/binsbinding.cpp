@@ -264,6 +264,20 @@ void BindAttributeBins(nb::module_& module)
         .def("alone", &MakeAlone);
 }
 
+/// The bins with some of the results alone, in the order of `indices`.
+Bins SelectResults(const Bins& bins, const std::vector<std::size_t>& indices)
+{
+    Bins selected = bins;
+    selected.results.clear();
+    for (const std::size_t index : indices) selected.results.push_back(bins.results.at(index));
+    if (!selected.reduction || selected.reduction->numGroups.empty())
+        return selected;
+    selected.reduction->numGroups.clear();
+    for (const std::size_t index : indices)
+        selected.reduction->numGroups.push_back(bins.reduction->numGroups.at(index));
+    return selected;
+}
+
 void BindReduction(nb::module_& module)
 {
     nb::class_<Reduction>(module, "Reduction")
@@ -305,6 +319,7 @@ void BindBins(nb::module_& module)
              { self.results.at(index).borderTexts = std::move(texts); })
         .def("set_weight_grid", &SetWeightGrid, "step"_a.none())
         .def("add_part", &AddPart, "part"_a, "attribute"_a, "target"_a, "n_distinct"_a.none() = nb::none())
+        .def("select", &SelectResults, "indices"_a)
         .def("columns", &GetBinColumns, "taken"_a)
         .def("to_json", &ToJson)
         .def("to_csv", &ToCsv)
