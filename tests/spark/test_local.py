@@ -1,5 +1,6 @@
 """Spark frames: their bins are those of a run over the rows, and so are the bins of their values."""
 
+import json
 import os
 import signal
 import threading
@@ -67,19 +68,65 @@ def test_transform_adds_the_columns_that_it_gives_elsewhere(frame):
         assert handed_on.select(expected.column_names).to_pylist() == expected.to_pylist()
 
 
-def test_transform_refuses_what_it_was_not_made_for(spark):
-    known = pa.table({"colour": ["red", "blue", "none"] * 9, "t": [0, 1, 0] * 9})
-    bins = mb.supervised_bins(known, "t", ["colour"], missing={"colour": "none"})
-    new = spark.createDataFrame([("red",), ("none",), (None,), ("green",)], "colour string")
-    codes = [row["colour_bin"] for row in bins.transform(new, unseen="missing").collect()]
-    assert codes[0] is not None and codes[1:] == [None, None, None]
-    assert bins.transform(new.limit(3)).count() == 3
-    with pytest.raises(Exception, match="a category is new"):
+def made_of(values, kind=None, **options):
+    """Bins with one cut in the middle of the values."""
+    attribute = pa.array(values, kind)
+    target = [int(i >= len(values) // 2) for i in range(len(values))]
+    table = pa.concat_tables([pa.table({"x": attribute, "t": target})] * 20)
+    return mb.supervised_bins(table, "t", ["x"], **options)
+
+
+INSTANTS = np.datetime64("1970-01-01", "us") + np.arange(8) * 43_200_000_001
+
+
+@pytest.mark.parametrize(
+    ("bins", "values"),
+    [
+        (made_of([2**53 + i for i in (-1, 0, 2, 4)]), "BIGINT: 9007199254740992, 9007199254740993, 9007199254740994"),
+        (made_of([0.1, 0.2, 0.3, 0.4]), "FLOAT: 0.1, 0.2, 0.3, 'NaN', '-0.0', NULL"),
+        (made_of([0.1, 0.2, 0.3, 0.4]), "DECIMAL(20, 17): 0.2, 0.20000000000000001, 0.20000000000000003, 0.3"),
+        (made_of([0.0, 0.0, 1.0, 1.0]), "BOOLEAN: TRUE, FALSE, NULL"),
+        (made_of([-1.5, -0.0, 0.0, 5e-324], closed="left"), "DOUBLE: -0.0D, 0.0D, 5e-324D, 'Infinity', 'NaN'"),
+        (made_of(INSTANTS), "TIMESTAMP_NTZ: '1970-01-02 12:00:00.000003', '1970-01-02 12:00:00.000004'"),
+        (made_of(INSTANTS, pa.timestamp("us", "Asia/Tokyo")), "TIMESTAMP: '1970-01-02 07:00:00.000003', '2000-01-01'"),
+        (made_of(["a\\b", "it's", "", "é"]), "STRING: '', 'é', 'it\\'s', 'a\\\\b', NULL"),
+    ],
+    ids=lambda value: value if isinstance(value, str) else "",
+)
+def test_transform_compares_as_the_package_does(spark, bins, values):
+    kind, _, texts = values.partition(": ")
+    rows = ", ".join(f"(CAST({text} AS {kind}))" for text in texts.split(", "))
+    found = bins.transform(spark.sql(f"SELECT * FROM VALUES {rows} AS rows(x)")).toArrow()
+    assert found["x_bin"].to_pylist() == bins.transform(found.select(["x"]))["x_bin"].to_pylist()
+
+
+def test_transform_knows_missing_and_unseen_categories(spark):
+    bins = made_of(["red", "red", "blue", "none"], missing={"x": "none"})
+    document = json.loads(bins.to_json())
+    document["data"]["missing_text"] = ["NA"]  # as a text file has it
+    bins = mb.BinningResult.from_json(json.dumps(document))
+    new = spark.createDataFrame([("red",), ("none",), ("NA",), (None,), ("green",)], "x string")
+    assert [row["x_bin"] for row in bins.transform(new, unseen="missing").collect()] == [1, None, None, None, None]
+    known = new.where("x IS NULL OR x <> 'green'")
+    assert [row["x_bin"] for row in bins.transform(known).collect()] == [1, None, None, None]
+    with pytest.raises(Exception, match="column 'x': green is not among the categories"):
         bins.transform(new).collect()
-    with pytest.raises(mb.DataError, match="the column holds integer, and the bins are of text"):
-        bins.transform(spark.createDataFrame([(1,)], "colour int"))
-    with pytest.raises(mb.DataError, match="there is no such column"):
-        bins.transform(spark.range(3))
+
+
+def test_transform_refuses_what_it_was_not_made_for(spark):
+    numbers, texts, instants = made_of([1.0, 2.0]), made_of(["a", "b"]), made_of(INSTANTS)
+    refusals = [
+        (numbers, "DATE '2020-01-01' AS x", "the column holds date, and the bins are of float: cast it in Spark"),
+        (texts, "1 AS x", "the column holds integer, and the bins are of text"),
+        (instants, "TIMESTAMP '2020-01-01' AS x", "timestamp with a time zone, and the bins are of timestamp without"),
+        (texts, "'A' COLLATE UNICODE_CI AS x", "its collation UNICODE_CI takes different texts for one"),
+        (numbers, "1 AS y", "there is no such column"),
+    ]
+    for bins, columns, words in refusals:
+        with pytest.raises(mb.DataError, match=f"column 'x': .*{words}"):
+            bins.transform(spark.sql(f"SELECT {columns}"))
+    with pytest.warns(mb.NoValidValuesWarning):
+        made_of([None, None], pa.float64()).transform(spark.sql("SELECT 1 AS x"))
 
 
 def test_faults_end_in_a_sentence(spark, monkeypatch):

@@ -1,4 +1,4 @@
-"""Spark as an engine, and bins as columns of a Spark frame."""
+"""Spark as an engine."""
 
 from __future__ import annotations
 
@@ -8,14 +8,10 @@ from typing import TYPE_CHECKING, Any
 
 from ._engines import Engine, engine_failed, translate
 from ._errors import DataError
-from ._features import require
 from ._shapes import quote_name
 
 if TYPE_CHECKING:
     import pyarrow as pa
-
-    from ._bins import AttributeBins
-    from ._types import Unseen
 
 _FIRST_VERSION = 4
 """That hands on Arrow tables."""
@@ -64,13 +60,7 @@ class SparkEngine(Engine):
             remove(self._view)
 
     def check_columns(self, names: Sequence[str]) -> None:
-        for field in self._frame.schema.fields:
-            collation = getattr(field.dataType, "collation", "UTF8_BINARY")
-            if field.name in names and collation != "UTF8_BINARY":
-                raise DataError(
-                    f"its collation {collation} takes different texts for one: cast it to STRING COLLATE UTF8_BINARY",
-                    field.name,
-                )
+        refuse_collations(self._frame, names)
 
     def microseconds(self, column: str) -> str:
         name = quote_name(column)
@@ -80,7 +70,7 @@ class SparkEngine(Engine):
         parts = [
             f"HOUR({name}) * 3600e6",
             f"MINUTE({name}) * 60e6",
-            f"CAST(EXTRACT(SECOND FROM {name}) AS DOUBLE) * 1e6",
+            f"CAST(EXTRACT(SECOND FROM {name}) * 1000000 AS DOUBLE)",  # of decimals: no double has all fractions
         ]
         return f"(UNIX_DATE(CAST({name} AS DATE)) * 86400e6 + {' + '.join(parts)})"
 
@@ -89,6 +79,17 @@ class SparkEngine(Engine):
 
     def close(self) -> None:
         self._session.catalog.dropTempView(self._view)
+
+
+def refuse_collations(frame: Any, names: Sequence[str]) -> None:
+    """\\raise DataError if one of these columns has texts that differ and are taken for one."""
+    for field in frame.schema.fields:
+        collation = getattr(field.dataType, "collation", "UTF8_BINARY")
+        if field.name in names and collation != "UTF8_BINARY":
+            raise DataError(
+                f"its collation {collation} takes different texts for one: cast it to STRING COLLATE UTF8_BINARY",
+                field.name,
+            )
 
 
 def _is_interrupt(error: BaseException | None) -> bool:
@@ -101,22 +102,3 @@ def _find_cause(message: str) -> str:
     lines = message.strip().splitlines() or [""]
     causes = [line.partition("Caused by: ")[2] for line in lines if "Caused by: " in line]
     return (causes or lines)[-1 if causes else 0].strip()
-
-
-def add_bins(frame: Any, chosen: Sequence[tuple[str, AttributeBins, str]], unseen: Unseen) -> Any:
-    """The frame with further columns: of each the name, the bins and their SQL, which gives NULL for an unseen category
-    as well as for a missing value."""
-    functions = require("pyspark.sql.functions", "Spark frames", "spark")
-    columns = []
-    for name, bins, case in chosen:
-        column = functions.expr(case)
-        if bins.variable.is_categorical and unseen == "error":
-            value = functions.col(f"`{bins.attribute.replace('`', '``')}`")
-            missing = [functions.lit(code) for code in bins.variable.missing_values]
-            is_missing = value.isNull() | value.isin(missing)
-            words = f"column {bins.attribute!r}: a category is new; it is not among those that the bins were made of"
-            column = functions.coalesce(
-                column, functions.when(~is_missing, functions.raise_error(functions.lit(words)))
-            )
-        columns.append(column.alias(name))
-    return frame.select("*", *columns)

@@ -14,7 +14,7 @@ from ._errors import DataError, warning_of
 from ._files import Reading
 from ._opening import open_source
 from ._sources import Source, check_names, columns_of
-from ._spark import add_bins, is_spark_frame
+from ._spark import is_spark_frame
 from ._types import MemoryLimit, Unseen
 
 if TYPE_CHECKING:
@@ -39,44 +39,21 @@ def transform(
     variables = {found.attribute: found.variable for found in result.bins if found.n_bins}
     texts = {name: variable.missing_texts for name, variable in variables.items() if variable.missing_texts}
     source = open_source(data, Reading(result.missing_text, texts, memory_limit))
-    if is_spark_frame(data):
-        check_names(source, list(variables))
-        return _add_to_spark(result, name_columns, data, labels, unseen, source)
-    feed = open_values(source, list(variables.values()), result.missing_text, unseen)
     named = name_columns([column.name for column in source.columns])
-    schema = pa.schema([(name, pa.utf8() if labels else pa.int32()) for _, name in named])
-    chosen = [(result.bins[index], list(variables).index(result.bins[index].attribute)) for index, _ in named]
     for found in result.bins:
         if not found.n_bins:
             warnings.warn(warning_of(found.attribute, found.status), stacklevel=3)
+    if is_spark_frame(data):
+        from ._sparkbins import add_bins
+
+        return add_bins(data, source, result, named, labels, unseen)
+    feed = open_values(source, list(variables.values()), result.missing_text, unseen)
+    schema = pa.schema([(name, pa.utf8() if labels else pa.int32()) for _, name in named])
+    chosen = [(result.bins[index], list(variables).index(result.bins[index].attribute)) for index, _ in named]
     batches = _batches(feed, chosen, schema, labels)
     if source.rows is None:
         return pa.RecordBatchReader.from_batches(schema, batches)
     return _like(data, pa.Table.from_batches(batches, schema))
-
-
-def _add_to_spark(
-    result: BinningResult,
-    name_columns: Callable[[list[str]], list[tuple[int, str]]],
-    frame: Any,
-    labels: bool,
-    unseen: Unseen,
-    source: Source,
-) -> Any:
-    """The frame with the columns of bins behind its own: its rows have no order by which others could be joined."""
-    from ._sql import parse
-
-    kinds = {column.name: column.kind for column in source.columns}
-    named = name_columns(list(kinds))
-    for index, _ in named:
-        variable = result.bins[index].variable
-        if (kinds[variable.name] == "text") != (variable.kind == "text"):
-            raise DataError(
-                f"the column holds {kinds[variable.name]}, and the bins are of {variable.kind}", variable.name
-            )
-    cases = [column.this.sql(dialect="spark") for column in parse(result._core, "spark", labels)]
-    chosen = [(name, result.bins[index], case) for (index, name), case in zip(named, cases)]
-    return add_bins(frame, chosen, unseen)
 
 
 def open_values(
