@@ -161,9 +161,11 @@ def test_cancelling_ends_the_jobs_of_one_engine(spark):
         while thread.is_alive() and not tracker.getActiveJobsIds():
             time.sleep(0.05)
         time.sleep(0.5)
+        assert engine.get_progress() == 0.0
         engine.cancel()
         thread.join(60)
         assert not thread.is_alive() and ended
+        assert engine.get_progress() is None
     assert spark.range(5).count() == 5
 
 
@@ -173,3 +175,16 @@ def test_ctrl_c_ends_all_that_runs(spark):
     with pytest.raises(KeyboardInterrupt):
         mb.equal_frequency_bins(slow)
     assert not spark.sparkContext.statusTracker().getActiveJobsIds() and not spark.catalog.listTables()
+
+
+def test_jobs_of_all_threads_are_in_the_group_of_the_caller(spark, frame):
+    context = spark.sparkContext
+    tracker = context.statusTracker()
+    without_group = set(tracker.getJobIdsForGroup(None))
+    context.setJobGroup("of the caller", "bins")
+    try:
+        mb.supervised_bins(frame, "t", ["whole", "cents", "flag"])
+    finally:
+        context.setLocalProperty("spark.jobGroup.id", None)
+    assert len(tracker.getJobIdsForGroup("of the caller")) >= 3
+    assert set(tracker.getJobIdsForGroup(None)) <= without_group

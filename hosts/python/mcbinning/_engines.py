@@ -40,6 +40,10 @@ class Engine:
         """The share of the running query that is done, from 0 to 1, where the engine tells it."""
         return None
 
+    def for_thread(self, work: Callable[[Any], Any]) -> Callable[[Any], Any]:
+        """The work, to be done in a thread to which belongs whatever the user has set for this one."""
+        return work
+
     def cancel(self) -> None:
         """Ends the queries that run, in whatever thread."""
 

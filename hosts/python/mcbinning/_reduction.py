@@ -9,6 +9,7 @@ from __future__ import annotations
 
 import math
 import threading
+import time
 from collections.abc import Callable, Iterator, Sequence
 from concurrent.futures import ThreadPoolExecutor
 from contextlib import contextmanager
@@ -94,13 +95,15 @@ def _map(engine: Engine, work: Callable[[Any], Any], items: Sequence[Any]) -> It
         yield from map(work, items)
         return
     with ThreadPoolExecutor(engine.workers) as pool:
-        futures = [pool.submit(work, item) for item in items]
+        futures = [pool.submit(engine.for_thread(work), item) for item in items]
         try:
             for future in futures:
                 yield future.result()
         except BaseException:
             pool.shutdown(wait=False, cancel_futures=True)
-            engine.cancel()
+            while not all(future.done() for future in futures):
+                engine.cancel()  # again and again, as a thread may have been between two queries
+                time.sleep(_SECONDS_BETWEEN_REPORTS)
             raise
 
 

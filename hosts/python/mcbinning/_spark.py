@@ -3,11 +3,12 @@
 from __future__ import annotations
 
 import uuid
-from collections.abc import Sequence
+from collections.abc import Callable, Sequence
 from typing import TYPE_CHECKING, Any
 
 from ._engines import Engine, engine_failed, translate
 from ._errors import DataError
+from ._features import require
 from ._shapes import quote_name
 
 if TYPE_CHECKING:
@@ -38,8 +39,10 @@ class SparkEngine(Engine):
         if type(frame).__module__.startswith("pyspark.sql.connect."):
             self._tagging = self._session.addTag, self._session.removeTag
             self._cancel = self._session.interruptTag
+            self._tracker = None
         else:
             context = self._session.sparkContext
+            self._tracker = context.statusTracker()
             self._tagging = context.addJobTag, context.removeJobTag
             self._cancel = context.cancelJobsWithTag
         # The tag of all jobs as well, by which they are ended.
@@ -73,6 +76,19 @@ class SparkEngine(Engine):
             f"CAST(EXTRACT(SECOND FROM {name}) * 1000000 AS DOUBLE)",  # of decimals: no double has all fractions
         ]
         return f"(UNIX_DATE(CAST({name} AS DATE)) * 86400e6 + {' + '.join(parts)})"
+
+    def for_thread(self, work: Callable[[Any], Any]) -> Callable[[Any], Any]:
+        # Job group, pool and tags. Each call has a copy of its own, which tags are added to.
+        adopt = require("pyspark.util", "Spark frames", "spark").inheritable_thread_target(self._session)
+        return adopt(work) if callable(adopt) else work  # where all threads are one to Java there is none to adopt
+
+    def get_progress(self) -> float | None:
+        """Of the stages that run in the session, by their tasks. A server does not tell of them."""
+        if self._tracker is None:
+            return None
+        stages = [self._tracker.getStageInfo(stage) for stage in self._tracker.getActiveStageIds()]
+        tasks = sum(stage.numTasks for stage in stages if stage)
+        return sum(stage.numCompletedTasks for stage in stages if stage) / tasks if tasks else None
 
     def cancel(self) -> None:
         self._cancel(self._view)
