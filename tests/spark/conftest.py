@@ -18,6 +18,7 @@ os.environ["PYSPARK_PYTHON"] = sys.executable
 
 
 def start_session(master, directory, **settings):
+    """On a master; or "server" for one in a process of its own, of which this process is a client."""
     if shutil.which("java") is None:
         pytest.skip("there is no java")
     from pyspark.sql import SparkSession
@@ -35,7 +36,8 @@ def start_session(master, directory, **settings):
         "spark.sql.session.timeZone": "America/New_York",
         "spark.log.level": "OFF",
     }
-    builder = SparkSession.builder.master(master).appName("tests")
+    builder = SparkSession.builder.appName("tests")
+    builder = builder.remote("local[2]") if master == "server" else builder.master(master)
     for key, value in (defaults | settings).items():
         builder = builder.config(key, value)
     return builder.getOrCreate()
