@@ -17,6 +17,7 @@ import pyarrow.csv as pacsv
 import pyarrow.parquet as pq
 import pytest
 import sqlglot
+from conftest import ROOT
 from mcbinning import _buckets
 from tables import KINDS, MISSING, figures, random_table
 
@@ -61,6 +62,14 @@ def test_random_tables_have_equal_figures(seed):
     check_equal(mb.equal_frequency_bins, table, KINDS, n_bins=int(rng.choice([2, 7, 300])), **common)
     pairs = [("free", "t"), ("cents", "u"), ("text", "u"), ("odd", "text"), ("u", "t")]
     check_equal(mb.supervised_bins, table, pairs=pairs, **supervised)
+
+
+def test_the_examples_have_equal_figures():
+    for file, target, weight in (("iris.csv", "species", None), ("young_men.csv", "college", "weight")):
+        table = pacsv.read_csv(ROOT / "examples" / "data" / file)
+        for options in ({}, {"max_distinct": 20, "n_bins": 15, "closed": "left", "small_bin_ratio": 0.3}):
+            check_equal(mb.supervised_bins, table, target, weight=weight, **options)
+        check_equal(mb.equal_frequency_bins, table, weight=weight, n_bins=6)
 
 
 SHAPES = {
@@ -344,7 +353,8 @@ def test_what_the_progress_function_raises_ends_the_query(tmp_path):
 def test_ctrl_c_ends_the_query_and_leaves_nothing_behind(tmp_path):
     pq.write_table(pa.table({"x": np.arange(1000.0)}), tmp_path / "rows.parquet")
     program = f"""
-import duckdb, mcbinning as mb
+import duckdb, signal, mcbinning as mb
+signal.signal(signal.SIGINT, signal.default_int_handler)  # which a process in the background ignores
 many = duckdb.sql("SELECT a.x * 1e9 + b.x * 1e4 + c.x AS x FROM '{tmp_path}/rows.parquet' a, "
                   "'{tmp_path}/rows.parquet' b, '{tmp_path}/rows.parquet' c")
 print("begun", flush=True)
