@@ -177,6 +177,16 @@ def test_ctrl_c_ends_all_that_runs(spark):
     assert not spark.sparkContext.statusTracker().getActiveJobsIds() and not spark.catalog.listTables()
 
 
+def test_microseconds_are_those_of_the_reader_of_columns(spark):
+    texts = ["0001-01-01 00:00:00", "1969-12-31 23:59:59.999999", "1970-01-01 00:00:00.000246", "1970-01-01 00:00:59.9"]
+    texts += ["2024-03-10 02:30:00.000253", "9999-12-31 23:59:59.999999"]  # an hour that New York does not have
+    for kind in ("TIMESTAMP", "TIMESTAMP_NTZ"):
+        rows = ", ".join(f"({kind} '{text}')" for text in texts)
+        with _spark.SparkEngine(spark.sql(f"SELECT * FROM VALUES {rows} AS rows(x)")) as engine:
+            found = engine.query(f"SELECT x, CAST({engine.microseconds('x')} AS DOUBLE) AS n FROM rows_").read_all()
+        assert found["n"].to_pylist() == [float(ticks) for ticks in found["x"].cast(pa.int64()).to_pylist()], kind
+
+
 def test_jobs_of_all_threads_are_in_the_group_of_the_caller(spark, frame):
     context = spark.sparkContext
     tracker = context.statusTracker()
