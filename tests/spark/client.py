@@ -9,7 +9,9 @@ import mcbinning as mb
 import pyarrow.parquet as pq
 import pytest
 from conftest import start_session
-from tables import KINDS, MISSING, figures
+from tables import MISSING, figures
+
+ATTRIBUTES = ["odd", "single", "day", "instant", "text"]
 
 
 def main(table, directory):
@@ -18,8 +20,8 @@ def main(table, directory):
     rows = pq.read_table(table)
 
     options = {"weight": "w", "missing": MISSING}
-    bins = mb.supervised_bins(frame, "t", KINDS, **options)
-    assert figures(bins) == figures(mb.supervised_bins(rows, "t", KINDS, **options))
+    bins = mb.supervised_bins(frame, "t", ATTRIBUTES, **options)
+    assert figures(bins) == figures(mb.supervised_bins(rows, "t", ATTRIBUTES, **options))
     assert bins.reduction.engine == "Spark"
 
     found = bins.transform(frame).toArrow()
