@@ -31,6 +31,7 @@ def main(table, directory):
     with pytest.raises(mb.StreamError, match=r"^Spark failed: .*DIVIDE_BY_ZERO"):
         mb.equal_frequency_bins(session.sql("SELECT 1 / (id - 3) AS x FROM RANGE(9)"))
 
+    signal.signal(signal.SIGINT, signal.default_int_handler)  # which a process in the background ignores
     slow = session.range(10**12, numPartitions=2).selectExpr("id % 7 AS x", "id % 5 AS y")
     threading.Timer(3, os.kill, (os.getpid(), signal.SIGINT)).start()
     with pytest.raises(KeyboardInterrupt):
