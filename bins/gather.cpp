@@ -47,15 +47,3 @@ void AddPart(Bins& whole, const Bins& part, int attribute, int target, std::opti
         whole.results.push_back(std::move(result));
     }
 }
-
-void SetWeightGrid(Bins& bins, std::optional<double> step)
-{
-    for (std::shared_ptr<const Variable>& variable : bins.variables)
-    {
-        if (variable->role != VariableRole::kWeight)
-            continue;
-        auto withGrid = std::make_shared<Variable>(*variable); // no result points to a weight
-        withGrid->weightGrid = step;
-        variable = std::move(withGrid);
-    }
-}

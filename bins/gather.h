@@ -13,7 +13,4 @@
 /// \param numDistinct how many different values the attribute has, where the run was given fewer.
 void AddPart(Bins& whole, const Bins& part, int attribute, int target, std::optional<std::int64_t> numDistinct);
 
-/// Tells of what the weights were made multiples: of a weight among the variables, if there is one.
-void SetWeightGrid(Bins& bins, std::optional<double> step);
-
 #endif

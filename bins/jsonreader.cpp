@@ -217,6 +217,12 @@ private:
         return bin;
     }
 
+    static void RefuseUnlessByCategory(const JsonCursor& json, const Bin& bin, const AttributeBins& result)
+    {
+        if (bin.weights.size() != (result.target ? result.target->categories.size() : 0))
+            json.At("weights").Refuse("there must be a weight for each category of the target");
+    }
+
     static Bin ReadMissingGroup(const JsonCursor& json, const AttributeBins& result)
     {
         Bin missing;
@@ -224,8 +230,7 @@ private:
         missing.weight = json.At("weight").GetNumber();
         if (!json.At("weights").IsNull())
             missing.weights = json.At("weights").GetNumbers();
-        if (missing.weights.size() != (result.target ? result.target->categories.size() : 0))
-            json.At("weights").Refuse("there must be a weight for each category of the target");
+        RefuseUnlessByCategory(json, missing, result);
         return missing;
     }
 
@@ -246,8 +251,7 @@ private:
             const double right = i < cuts.size() ? cuts[i] : kInfinity;
             if (result.bins[i].left != left || result.bins[i].right != right)
                 bins[i].Refuse("the bin does not lie between its cut points");
-            if (result.bins[i].weights.size() != (result.target ? result.target->categories.size() : 0))
-                bins[i].At("weights").Refuse("there must be a weight for each category of the target");
+            RefuseUnlessByCategory(bins[i], result.bins[i], result);
             left = right;
         }
     }

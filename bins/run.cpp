@@ -1,7 +1,6 @@
 #include "bins/run.h"
 
 #include "bins/collect.h"
-#include "bins/gather.h"
 #include "bins/targettally.h"
 
 #include <mcobnqrt/mcobnqrt.h>
@@ -96,4 +95,16 @@ void RunBinning(Bins& bins, BINVarList& variables, const std::vector<int>* attri
     else
         RunEqualFrequency(bins, variables, attributes, host);
     SetWeightGrid(bins, host.weightGrid->GetStep());
+}
+
+void SetWeightGrid(Bins& bins, std::optional<double> step)
+{
+    for (std::shared_ptr<const Variable>& variable : bins.variables)
+    {
+        if (variable->role != VariableRole::kWeight)
+            continue;
+        auto withGrid = std::make_shared<Variable>(*variable); // no result points to a weight
+        withGrid->weightGrid = step;
+        variable = std::move(withGrid);
+    }
 }

@@ -4,6 +4,7 @@
 #include "bins/bins.h"
 #include "bins/infinitevalues.h"
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -36,5 +37,8 @@ struct RunHost
 /// objects throw comes through.
 void RunBinning(Bins& bins, BINVarList& variables, const std::vector<int>* attributes, const std::vector<int>* targets,
                 const RunHost& host);
+
+/// Tells of what the weights were made multiples: of a weight among the variables, if there is one.
+void SetWeightGrid(Bins& bins, std::optional<double> step);
 
 #endif

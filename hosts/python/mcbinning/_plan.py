@@ -100,16 +100,16 @@ class Plan:
         categorical = self.categorical
         to_learn = categorical if self.weight is None else [*categorical, self.weight]
         if not to_learn:
-            return self._make_feed(self.names)
+            return self._feed_columns(self.names)
         if self.source.is_once:
-            feed = self._make_feed(self.names)
+            feed = self._feed_columns(self.names)
             feed.spool(directory)
             known = feed
             indices = {name: self.names.index(name) for name in categorical}
         else:
-            known = self._make_feed(to_learn)
+            known = self._feed_columns(to_learn)
             known.learn()
-            feed = self._make_feed(self.names)
+            feed = self._feed_columns(self.names)
             feed.set_weights(known.weights())
             indices = {name: i for i, name in enumerate(categorical)}
         for name in categorical:
@@ -139,7 +139,7 @@ class Plan:
         except (TypeError, ValueError, OverflowError) as error:
             raise DataError(f"what is declared missing can't be used: {error}", name) from error
 
-    def _make_feed(self, names: list[str]) -> _core.Feed:
+    def _feed_columns(self, names: list[str]) -> _core.Feed:
         return self.make_feed(names, self.source.open(names))
 
     def make_feed(self, names: list[str], table: _core.Table) -> _core.Feed:

@@ -11,6 +11,7 @@
 #include "bins/measures.h"
 #include "bins/numbers.h"
 #include "bins/rows.h"
+#include "bins/run.h"
 #include "bins/sql.h"
 #include "bins/words.h"
 #include "hosts/python/src/arrays.h"
