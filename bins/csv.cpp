@@ -25,6 +25,11 @@ Targets FindTargets(const Bins& bins)
     return targets;
 }
 
+std::string TellCategory(const Targets& targets, const Variable& target, std::size_t code)
+{
+    return (targets.size() > 1 ? target.name + "=" : "") + FormatCategory(target, code);
+}
+
 std::vector<std::string> MakeHead(const Targets& targets)
 {
     std::vector<std::string> head{"attribute", "target", "bin",   "label", "left", "right",
@@ -32,7 +37,17 @@ std::vector<std::string> MakeHead(const Targets& targets)
     for (const Variable* const target : targets)
     {
         for (std::size_t code = 0; code < target->categories.size(); ++code)
-            head.push_back("weight:" + (targets.size() > 1 ? target->name + "=" : "") + FormatCategory(*target, code));
+            head.push_back("weight:" + TellCategory(targets, *target, code));
+    }
+    for (const Variable* const target : targets)
+    {
+        if (target->categories.size() <= 2)
+            continue;
+        for (const char* const figure : {"rate:", "woe:", "iv:"})
+        {
+            for (std::size_t code = 0; code < target->categories.size(); ++code)
+                head.push_back(figure + TellCategory(targets, *target, code));
+        }
     }
     return head;
 }
@@ -48,6 +63,14 @@ std::string TellBorder(const BinRow& row, double border)
     return row.kind == BinRow::Kind::kBin ? FormatNumber(border) : "";
 }
 
+using Figure = double Evidence::*;
+constexpr Figure kFigures[] = {&Evidence::rate, &Evidence::weightOfEvidence, &Evidence::informationValue};
+
+std::string TellFigure(const std::optional<Evidence>& evidence, Figure figure)
+{
+    return evidence ? FormatNumber((*evidence).*figure) : "";
+}
+
 std::vector<std::string> MakeFields(const AttributeBins& bins, const BinRow& row, std::size_t index,
                                     const Targets& targets)
 {
@@ -60,12 +83,21 @@ std::vector<std::string> MakeFields(const AttributeBins& bins, const BinRow& row
                                     bins.isRightClosed ? "right" : "left",
                                     FormatNumber(row.bin.weight),
                                     FormatNumber(row.share)};
-    for (double Evidence::*const member : {&Evidence::rate, &Evidence::weightOfEvidence, &Evidence::informationValue})
-        fields.push_back(row.evidence ? FormatNumber((*row.evidence).*member) : "");
+    for (const Figure figure : kFigures) fields.push_back(TellFigure(row.evidence, figure));
     for (const Variable* const target : targets)
     {
         for (std::size_t code = 0; code < target->categories.size(); ++code)
             fields.push_back(target == bins.target.get() ? FormatNumber(row.bin.weights[code]) : "");
+    }
+    for (const Variable* const target : targets)
+    {
+        if (target->categories.size() <= 2)
+            continue;
+        for (const Figure figure : kFigures)
+        {
+            for (std::size_t code = 0; code < target->categories.size(); ++code)
+                fields.push_back(target == bins.target.get() ? TellFigure(row.evidenceByCategory[code], figure) : "");
+        }
     }
     return fields;
 }

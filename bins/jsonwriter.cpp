@@ -3,6 +3,7 @@
 #include "bins/jsonvalue.h"
 #include "bins/measures.h"
 #include "bins/numbers.h"
+#include "bins/rows.h"
 #include "bins/words.h"
 
 #include <cmath>
@@ -83,46 +84,71 @@ JsonValue ToValue(const Variable& variable)
                   {"time_zone", variable.timeZone}};
 }
 
-/// What is said of a bin, or of the missing, behind its borders. `index` is that of its evidence.
-Object MakeGroup(const Bin& bin, const AttributeBins& bins, const std::vector<Evidence>& evidence, std::size_t index)
+JsonValue ToValue(const std::optional<Evidence>& evidence, double Evidence::*figure)
 {
-    const auto figure = [&](double Evidence::*member)
-    { return index < evidence.size() ? JsonValue(evidence[index].*member) : JsonValue(); };
-    return Object{{"weight", bin.weight},
-                  {"weights", bins.target ? JsonValue(bin.weights) : JsonValue()},
-                  {"rate", figure(&Evidence::rate)},
-                  {"woe", figure(&Evidence::weightOfEvidence)},
-                  {"iv", figure(&Evidence::informationValue)}};
+    return evidence ? JsonValue((*evidence).*figure) : JsonValue();
+}
+
+/// The figure of a row: one of a target of two categories, of one of more a list by category.
+JsonValue MakeFigure(const BinRow& row, double Evidence::*figure)
+{
+    if (row.evidenceByCategory.empty())
+        return ToValue(row.evidence, figure);
+    Array figures;
+    for (const std::optional<Evidence>& evidence : row.evidenceByCategory) figures.push_back(ToValue(evidence, figure));
+    return figures;
+}
+
+/// What is said of a bin, or of the missing, behind its borders.
+Object MakeGroup(const BinRow& row, const AttributeBins& bins)
+{
+    return Object{{"weight", row.bin.weight},
+                  {"weights", bins.target ? JsonValue(row.bin.weights) : JsonValue()},
+                  {"rate", MakeFigure(row, &Evidence::rate)},
+                  {"woe", MakeFigure(row, &Evidence::weightOfEvidence)},
+                  {"iv", MakeFigure(row, &Evidence::informationValue)}};
+}
+
+/// The missing that have no weight have no row.
+BinRow MakeWeightless(const Bin& missing)
+{
+    BinRow row;
+    row.bin = missing;
+    return row;
 }
 
 JsonValue ToValue(const AttributeBins& result)
 {
-    const std::vector<Evidence> evidence = ComputeEvidence(result);
+    const std::vector<BinRow> rows = MakeRows(result);
     Array bins;
-    for (std::size_t i = 0; i < result.bins.size(); ++i)
-    {
-        Object bin{{"left", result.bins[i].left}, {"right", result.bins[i].right}};
-        for (JsonValue::Member& member : MakeGroup(result.bins[i], result, evidence, i))
-            bin.push_back(std::move(member));
-        bins.push_back(std::move(bin));
-    }
     JsonValue missing;
     if (result.missing)
-        missing = MakeGroup(*result.missing, result, evidence, result.bins.size());
-    return Object{{"attribute", result.attribute->name},
-                  {"target", result.target ? JsonValue(result.target->name) : JsonValue()},
-                  {"status", ToValue(result.status)},
-                  {"distinct_values", result.numDistinct},
-                  {"weight", result.weight},
-                  {"weight_with_missing", result.weightWithMissing},
-                  {"minimum", result.minimum},
-                  {"maximum", result.maximum},
-                  {"target_entropy", ComputeTargetEntropy(result)},
-                  {"model_entropy", result.modelEntropy},
-                  {"information_value", ComputeInformationValue(result)},
-                  {"cut_points", result.cutPoints},
-                  {"bins", bins},
-                  {"missing", missing}};
+        missing = MakeGroup(MakeWeightless(*result.missing), result);
+    for (const BinRow& row : rows)
+    {
+        if (row.kind == BinRow::Kind::kMissing)
+            missing = MakeGroup(row, result);
+        if (row.kind != BinRow::Kind::kBin)
+            continue;
+        Object bin{{"left", row.bin.left}, {"right", row.bin.right}};
+        for (JsonValue::Member& member : MakeGroup(row, result)) bin.push_back(std::move(member));
+        bins.push_back(std::move(bin));
+    }
+    return Object{
+        {"attribute", result.attribute->name},
+        {"target", result.target ? JsonValue(result.target->name) : JsonValue()},
+        {"status", ToValue(result.status)},
+        {"distinct_values", result.numDistinct},
+        {"weight", result.weight},
+        {"weight_with_missing", result.weightWithMissing},
+        {"minimum", result.minimum},
+        {"maximum", result.maximum},
+        {"target_entropy", ComputeTargetEntropy(result)},
+        {"model_entropy", result.modelEntropy},
+        {"information_value", rows.empty() ? JsonValue() : MakeFigure(rows.back(), &Evidence::informationValue)},
+        {"cut_points", result.cutPoints},
+        {"bins", bins},
+        {"missing", missing}};
 }
 
 JsonValue ToValue(const Reduction& reduction)

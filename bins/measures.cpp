@@ -7,19 +7,46 @@
 namespace
 {
 
-/// Whether the weight of evidence of a bin, or of the missing, would be infinite.
-bool IsOneSided(const Bin& bin)
+/// Weights of the event and of all other categories.
+struct Sides
 {
-    return bin.weight > 0.0 && (bin.weights[0] == 0.0 || bin.weights[1] == 0.0);
+    double events = 0.0;
+    double others = 0.0;
+
+    /// Whether the weight of evidence would be infinite.
+    bool IsOneSided() const { return (events == 0.0) != (others == 0.0); }
+};
+
+Sides Split(const std::vector<double>& weights, std::size_t event)
+{
+    Sides sides;
+    for (std::size_t code = 0; code < weights.size(); ++code)
+        (code == event ? sides.events : sides.others) += weights[code];
+    return sides;
 }
 
-Evidence MakeEvidence(const Bin& bin, double smoothing, const std::vector<double>& categoryWeights)
+Evidence MakeEvidence(const Bin& bin, std::size_t event, double smoothing, const Sides& all)
 {
-    const double added = IsOneSided(bin) ? smoothing : 0.0;
-    const double events = ComputeShare(bin.weights[1] + added, categoryWeights[1]);
-    const double others = ComputeShare(bin.weights[0] + added, categoryWeights[0]);
+    const Sides sides = Split(bin.weights, event);
+    const double added = sides.IsOneSided() ? smoothing : 0.0;
+    const double events = ComputeShare(sides.events + added, all.events);
+    const double others = ComputeShare(sides.others + added, all.others);
     const double weightOfEvidence = events == others ? 0.0 : std::log(events / others);
-    return {ComputeShare(bin.weights[1], bin.weight), weightOfEvidence, (events - others) * weightOfEvidence};
+    return {ComputeShare(sides.events, bin.weight), weightOfEvidence, (events - others) * weightOfEvidence};
+}
+
+/// In bits. The form of the formula is the library's, as the last bit depends on it.
+double ComputeBinEntropy(const Bin& bin)
+{
+    static const double kLn2 = std::log(2.0);
+    double entropy = 0.0;
+    for (const double weight : bin.weights)
+    {
+        const double share = ComputeShare(weight, bin.weight);
+        const double p = share == 0.0 ? 1.0 : share; // an absent category adds nothing
+        entropy = -(std::log(p) / kLn2 * p) + entropy;
+    }
+    return entropy;
 }
 
 /// The bins, and behind them the missing if they have weight.
@@ -74,33 +101,65 @@ std::optional<double> ComputeGain(const AttributeBins& bins)
     return bins.cutPoints.empty() || gain < kRounding * std::max(1.0, *targetEntropy) ? 0.0 : gain;
 }
 
+std::optional<double> ComputeModelEntropy(const AttributeBins& bins)
+{
+    double weight = 0.0;
+    double sum = 0.0;
+    for (const Bin& bin : bins.bins)
+    {
+        weight += bin.weight;
+        sum += ComputeBinEntropy(bin) * bin.weight;
+    }
+    return bins.target && weight > 0.0 ? std::optional(sum / weight) : std::nullopt;
+}
+
 double ComputeShare(double part, double whole)
 {
     return whole > 0.0 ? part / whole : 0.0;
 }
 
-std::vector<Evidence> ComputeEvidence(const AttributeBins& bins)
+std::optional<std::size_t> FindEvent(const AttributeBins& bins)
 {
-    std::vector<double> categoryWeights = SumByCategory(bins);
-    if (HasMissing(bins))
+    return bins.target && bins.target->categories.size() == 2 ? std::optional<std::size_t>(1) : std::nullopt;
+}
+
+std::vector<Evidence> ComputeEvidence(const AttributeBins& bins, std::size_t event)
+{
+    const std::vector<const Bin*> groups = ListGroups(bins);
+    Sides all;
+    for (const Bin* const group : groups)
     {
-        for (std::size_t code = 0; code < categoryWeights.size(); ++code)
-            categoryWeights[code] += bins.missing->weights[code];
+        const Sides sides = Split(group->weights, event);
+        all.events += sides.events;
+        all.others += sides.others;
     }
     std::vector<Evidence> evidence;
-    if (categoryWeights.size() == 2 && categoryWeights[0] > 0.0 && categoryWeights[1] > 0.0)
+    if (all.events > 0.0 && all.others > 0.0)
     {
-        for (const Bin* const group : ListGroups(bins))
-            evidence.push_back(MakeEvidence(*group, bins.smoothing, categoryWeights));
+        for (const Bin* const group : groups) evidence.push_back(MakeEvidence(*group, event, bins.smoothing, all));
     }
     return evidence;
 }
 
+std::vector<Evidence> ComputeEvidence(const AttributeBins& bins)
+{
+    const std::optional<std::size_t> event = FindEvent(bins);
+    return event ? ComputeEvidence(bins, *event) : std::vector<Evidence>();
+}
+
 bool IsSmoothed(const AttributeBins& bins)
 {
-    const std::vector<const Bin*> groups = ListGroups(bins);
-    return bins.smoothing > 0.0 && !ComputeEvidence(bins).empty() &&
-           std::any_of(groups.begin(), groups.end(), [](const Bin* group) { return IsOneSided(*group); });
+    if (bins.smoothing == 0.0 || !bins.target)
+        return false;
+    const std::size_t numEvents = FindEvent(bins) ? 1 : bins.target->categories.size(); // of two one is as good as both
+    for (std::size_t event = 0; event < numEvents; ++event)
+    {
+        const std::vector<const Bin*> groups = ListGroups(bins);
+        const auto isOneSided = [event](const Bin* group) { return Split(group->weights, event).IsOneSided(); };
+        if (!ComputeEvidence(bins, event).empty() && std::any_of(groups.begin(), groups.end(), isOneSided))
+            return true;
+    }
+    return false;
 }
 
 bool HasMissing(const AttributeBins& bins)
@@ -108,14 +167,20 @@ bool HasMissing(const AttributeBins& bins)
     return bins.missing && bins.missing->weight > 0.0;
 }
 
-std::optional<double> ComputeInformationValue(const AttributeBins& bins)
+std::optional<double> ComputeInformationValue(const AttributeBins& bins, std::size_t event)
 {
-    const std::vector<Evidence> evidence = ComputeEvidence(bins);
+    const std::vector<Evidence> evidence = ComputeEvidence(bins, event);
     if (evidence.empty())
         return std::nullopt;
     double value = 0.0;
     for (const Evidence& one : evidence) value += one.informationValue;
     return value;
+}
+
+std::optional<double> ComputeInformationValue(const AttributeBins& bins)
+{
+    const std::optional<std::size_t> event = FindEvent(bins);
+    return event ? ComputeInformationValue(bins, *event) : std::nullopt;
 }
 
 std::vector<const AttributeBins*> SortByGain(const Bins& bins)

@@ -23,7 +23,11 @@ std::optional<double> ComputeGain(const AttributeBins& bins);
 /// `part` of `whole`; 0 if the whole is.
 double ComputeShare(double part, double whole);
 
-/// What a bin, or the records without a value, say about a target of two categories, the second of which is the event.
+/// What is left of the target's entropy within the bins, in bits, by the library's own additions: the bins of a run have
+/// the model entropy that the run has told, to the last bit. Nothing without a target, bins, or weight.
+std::optional<double> ComputeModelEntropy(const AttributeBins& bins);
+
+/// What a bin, or the records without a value, say about one category of the target, the event, against all others.
 struct Evidence
 {
     /// The share of the weight that has the event.
@@ -36,8 +40,14 @@ struct Evidence
     double informationValue;
 };
 
-/// By bin, and one more behind them where records without a value have weight. Empty unless the target has two
-/// categories, and both have weight.
+/// The category that is the event where none is named: the second of two; nothing of another target.
+std::optional<std::size_t> FindEvent(const AttributeBins& bins);
+
+/// By bin, and one more behind them where records without a value have weight. Empty unless both the event, which is a
+/// code of the target, and the others have weight.
+std::vector<Evidence> ComputeEvidence(const AttributeBins& bins, std::size_t event);
+
+/// That of the event where none is named; empty without one.
 std::vector<Evidence> ComputeEvidence(const AttributeBins& bins);
 
 /// Whether the smoothing has changed some of the evidence.
@@ -47,6 +57,7 @@ bool IsSmoothed(const AttributeBins& bins);
 bool HasMissing(const AttributeBins& bins);
 
 /// Nothing where ComputeEvidence() is empty.
+std::optional<double> ComputeInformationValue(const AttributeBins& bins, std::size_t event);
 std::optional<double> ComputeInformationValue(const AttributeBins& bins);
 
 /// Results with the largest gain first, those of equal gain, or without one, in their order. Only those with cut

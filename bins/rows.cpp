@@ -16,19 +16,48 @@ BinRow MakeTotal(const std::vector<BinRow>& rows)
     total.label = "total";
     total.bin.weights.resize(rows.front().bin.weights.size());
     total.bin.left = total.bin.right = std::numeric_limits<double>::quiet_NaN();
-    if (rows.front().evidence)
-        total.evidence = Evidence{0.0, 0.0, 0.0};
     for (const BinRow& row : rows)
     {
         total.bin.weight += row.bin.weight;
         for (std::size_t code = 0; code < row.bin.weights.size(); ++code)
             total.bin.weights[code] += row.bin.weights[code];
-        if (row.evidence)
-            total.evidence->informationValue += row.evidence->informationValue;
     }
-    if (total.evidence)
-        total.evidence->rate = ComputeShare(total.bin.weights[1], total.bin.weight);
     return total;
+}
+
+/// Of the row of the total.
+Evidence SumEvidence(const std::vector<Evidence>& evidence, const Bin& total, std::size_t event)
+{
+    Evidence sum{ComputeShare(total.weights[event], total.weight), 0.0, 0.0};
+    for (const Evidence& one : evidence) sum.informationValue += one.informationValue;
+    return sum;
+}
+
+/// Puts the evidence of the event, and that of the total, into the rows, where there is any.
+template<class Put>
+void FillEvidence(std::vector<BinRow>& rows, const AttributeBins& bins, std::size_t event, Put put)
+{
+    std::vector<Evidence> evidence = ComputeEvidence(bins, event);
+    if (evidence.empty())
+        return;
+    evidence.push_back(SumEvidence(evidence, rows.back().bin, event));
+    for (std::size_t i = 0; i < rows.size(); ++i) put(rows[i], evidence[i]);
+}
+
+void FillEvidence(std::vector<BinRow>& rows, const AttributeBins& bins)
+{
+    if (const std::optional<std::size_t> event = FindEvent(bins))
+    {
+        FillEvidence(rows, bins, *event, [](BinRow& row, const Evidence& evidence) { row.evidence = evidence; });
+        return;
+    }
+    const std::size_t numCategories = bins.target ? bins.target->categories.size() : 0;
+    for (BinRow& row : rows) row.evidenceByCategory.resize(numCategories);
+    for (std::size_t code = 0; code < numCategories; ++code)
+    {
+        FillEvidence(rows, bins, code,
+                     [code](BinRow& row, const Evidence& evidence) { row.evidenceByCategory[code] = evidence; });
+    }
 }
 
 } // namespace
@@ -38,14 +67,20 @@ std::vector<BinRow> MakeRows(const AttributeBins& bins)
     std::vector<BinRow> rows;
     if (!bins.HasBins())
         return rows;
+    const auto add = [&rows](BinRow::Kind kind, const std::string& label, const Bin& bin)
+    {
+        BinRow row;
+        row.kind = kind;
+        row.label = label;
+        row.bin = bin;
+        rows.push_back(std::move(row));
+    };
     const std::vector<std::string> labels = MakeLabels(bins);
-    for (std::size_t i = 0; i < bins.bins.size(); ++i)
-        rows.push_back({BinRow::Kind::kBin, labels[i], bins.bins[i], 0.0, std::nullopt});
+    for (std::size_t i = 0; i < bins.bins.size(); ++i) add(BinRow::Kind::kBin, labels[i], bins.bins[i]);
     if (HasMissing(bins))
-        rows.push_back({BinRow::Kind::kMissing, "missing", *bins.missing, 0.0, std::nullopt});
-    const std::vector<Evidence> evidence = ComputeEvidence(bins);
-    for (std::size_t i = 0; i < evidence.size(); ++i) rows[i].evidence = evidence[i];
+        add(BinRow::Kind::kMissing, "missing", *bins.missing);
     rows.push_back(MakeTotal(rows));
     for (BinRow& row : rows) row.share = ComputeShare(row.bin.weight, rows.back().bin.weight);
+    FillEvidence(rows, bins);
     return rows;
 }

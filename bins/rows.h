@@ -21,8 +21,11 @@ struct BinRow
     Kind kind = Kind::kBin;
     std::string label;
     Bin bin;
-    double share = 0.0;               ///< of the total
-    std::optional<Evidence> evidence; ///< where there is any; of the total the rate and the information value
+    double share = 0.0; ///< of the total
+    /// Of the second category of two, where there is any; of the total the rate and the information value.
+    std::optional<Evidence> evidence;
+    /// Of each category of more than two against all others; empty of other targets.
+    std::vector<std::optional<Evidence>> evidenceByCategory;
 };
 
 /// The bins, the missing if they have weight, and the total. Empty without bins.

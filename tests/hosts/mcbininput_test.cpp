@@ -93,7 +93,7 @@ TEST_F(McbinInput, OrderOfRowsMakesNoDifference)
     const Outcome outcome = Run("supervised " + iris + " --target species --format csv");
 
     EXPECT_NE(std::string::npos,
-              outcome.out.find("petal_length,species,1,\"(1.9, 4.7]\",1.9,4.7,right,45,0.3,,,,0,44,1\n"));
+              outcome.out.find("petal_length,species,1,\"(1.9, 4.7]\",1.9,4.7,right,45,0.3,,,,0,44,1,0,0.97"));
     EXPECT_EQ(outcome.out, Run("supervised sorted.csv --target species --format csv").out);
 }
 

@@ -80,7 +80,10 @@ TEST_F(McbinOutput, MoreCategoriesThanShadesShareTheLastOne)
 
     EXPECT_NE(std::string::npos, outcome.out.find("  █ adult ▓ pupil ▒ retired & <old> ░ others\n")) << outcome.out;
     EXPECT_NE(std::string::npos,
-              outcome.out.find("  bin         weight   share  adult  child  pupil  retired & <old>  student\n"))
+              outcome.out.find("  bin         weight   share   adult   child   pupil  retired & <old>  student\n"))
+        << outcome.out;
+    EXPECT_NE(std::string::npos,
+              outcome.out.find("  IV                          3.9479  4.3777  5.2589           5.2589   5.2589\n"))
         << outcome.out;
 }
 
@@ -171,11 +174,12 @@ TEST_F(McbinOutput, ThePageHasTheFiguresOfTheTables)
     const std::string page = ReadFile(fData.File("page.html"));
 
     // Of each bin its weight and those of its categories: column 8 and, after the share, 10 to 14.
-    const std::string bins = page.substr(page.find("<table class=\"bins\">"), page.find("</section>"));
+    const std::size_t begin = page.find("<table class=\"bins\">");
+    const std::string bins = page.substr(begin, page.find("</table>", begin) - begin);
     const std::string cells = CollectNumbers(bins);
     const Outcome expected =
         Shell("mcbin supervised data.csv --target kind --format csv | grep '^age' | sed 's/\"[^\"]*\"//' | "
-              "cut -d, -f8,13- | tr , '\\n'");
+              "cut -d, -f8,13-17 | tr , '\\n'");
     EXPECT_EQ(expected.out, cells);
     EXPECT_NE(std::string::npos, page.find("retired &amp; &lt;old&gt;"));
     EXPECT_EQ(std::string::npos, page.find("<script"));
@@ -258,14 +262,16 @@ TEST_F(McbinOutputOnTerminal, TablesFitTheTerminalAndStandStraightWithWideCharac
     };
 
     // Of many categories the heaviest keep their columns, of two the rate tells more than both.
-    EXPECT_EQ(R"(  bin             weight   share  大阪  others
-  (-inf, 11000]       12   19.7%     0      12  ░░░░░░░░░░░░
-  (11000, 23000]      12   19.7%    12       0  ▒▒▒▒▒▒▒▒▒▒▒▒
-  (23000, 35000]      12   19.7%     0      12  ▓▓▓▓▓▓▓▓▓▓▓▓
-  (35000, 47000]      12   19.7%     0      12  ░░░░░░░░░░░░
-  (47000, +inf)       13   21.3%     1      12  ███████████▒
-  total               61  100.0%    13      48
+    EXPECT_EQ(R"(  bin             weight   share    大阪  others
+  (-inf, 11000]       12   19.7%       0      12  ░░░░░░░░░░
+  (11000, 23000]      12   19.7%      12       0  ▒▒▒▒▒▒▒▒▒▒
+  (23000, 35000]      12   19.7%       0      12  ▓▓▓▓▓▓▓▓▓▓
+  (35000, 47000]      12   19.7%       0      12  ░░░░░░░░░░
+  (47000, +inf)       13   21.3%       1      12  █████████▒
+  total               61  100.0%      13      48
+  IV                              5.7815       -
   █ a very long name of a category ▓ emoji😀 ▒ 大阪 ░ others
+  0.5 added where a category has no weight
 )",
               print("--target place", 60));
     EXPECT_EQ(R"(  bin                        weight   share    rate

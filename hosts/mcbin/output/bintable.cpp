@@ -124,9 +124,27 @@ std::vector<std::string> MakeCells(const Content& content, std::size_t index, co
     if (extent.numRates > 0)
         cells.push_back(fmt::format("{:.1f}%", 100.0 * row.evidence->rate));
     if (extent.numRates > 1)
-        cells.push_back(FormatWeightOfEvidence(row));
+        cells.push_back(FormatWeightOfEvidence(row, *row.evidence));
     if (extent.numRates > 2)
         cells.push_back(fmt::format("{:.4f}", row.evidence->informationValue));
+    return cells;
+}
+
+/// Under the categories of a target of more than two the information value of each against all others.
+/// Empty where there is none, or no category has a column.
+std::vector<std::string> MakeInformationValues(const BinRow& total, std::size_t numColumns)
+{
+    const std::vector<std::size_t> codes = FindHeaviest(total.bin.weights, numColumns);
+    if (codes.empty() || total.evidenceByCategory.empty())
+        return {};
+    std::vector<std::string> cells{"IV", "", ""};
+    for (const std::size_t code : codes)
+    {
+        const std::optional<Evidence>& evidence = total.evidenceByCategory[code];
+        cells.push_back(evidence ? fmt::format("{:.4f}", evidence->informationValue) : "");
+    }
+    if (codes.size() < total.evidenceByCategory.size())
+        cells.emplace_back("-");
     return cells;
 }
 
@@ -165,33 +183,51 @@ std::optional<std::size_t> GetRoom(const Rows& rows, const Screen& screen)
     return taken > width && screen.width ? std::nullopt : std::optional(width - std::min(width, taken));
 }
 
-} // namespace
+constexpr std::size_t kGap = 2; // in front of the bar
 
-void PrintBinTable(std::ostream& os, const AttributeBins& bins, const Screen& screen)
+/// Narrows the extent until the rows fit the screen.
+Rows FitRows(const Content& content, const Screen& screen, Extent& extent)
 {
-    constexpr std::size_t kGap = 2; // in front of the bar
-    const Content content(bins);
-    Extent extent = MakeWidest(content, screen);
-    Rows rows = MakeCells(content, extent);
-    const auto fits = [&]
+    const auto fits = [&](const Rows& rows)
     {
         const std::optional<std::size_t> room = GetRoom(rows, screen);
         return room && (!extent.hasBar || *room >= kGap + kNarrowestBar);
     };
-    while (!fits() && Narrow(extent)) rows = MakeCells(content, extent);
+    Rows rows = MakeCells(content, extent);
+    while (!fits(rows) && Narrow(extent)) rows = MakeCells(content, extent);
+    const std::vector<std::string> values = MakeInformationValues(content.rows.back(), extent.numCategories);
+    if (values.empty())
+        return rows;
+    Rows withValues = rows;
+    withValues.push_back(values);
+    return fits(withValues) ? withValues : rows;
+}
 
+/// What there is to say of the evidence that is shown.
+void PrintNotes(std::ostream& os, const AttributeBins& bins, const Extent& extent, bool hasValues)
+{
+    if (extent.numRates > 0)
+        os << "  " << DescribeEvidence(bins) << '\n';
+    if (const std::string words = DescribeSmoothing(bins); (extent.numRates > 1 || hasValues) && !words.empty())
+        os << "  " << words << '\n';
+}
+
+} // namespace
+
+void PrintBinTable(std::ostream& os, const AttributeBins& bins, const Screen& screen)
+{
+    const Content content(bins);
+    Extent extent = MakeWidest(content, screen);
+    const Rows rows = FitRows(content, screen, extent);
     const std::size_t room = GetRoom(rows, screen).value_or(0);
     const std::vector<std::size_t> widths = GetWidths(rows);
     const ShareBar bar(bins, extent.hasBar ? std::min(room - kGap, kWidestBar) : 0, screen.hasColours);
     os << Align(rows.front(), widths) << '\n';
-    for (std::size_t i = 0; i < content.rows.size(); ++i)
+    for (std::size_t i = 1; i < rows.size(); ++i)
     {
-        const bool isTotal = content.rows[i].kind == BinRow::Kind::kTotal;
-        os << Align(rows[i + 1], widths) << (isTotal ? "" : bar.Draw(content.rows[i].bin)) << '\n';
+        const bool hasBar = i < content.rows.size(); // neither the total nor what stands below it
+        os << Align(rows[i], widths) << (hasBar ? bar.Draw(content.rows[i - 1].bin) : "") << '\n';
     }
     os << bar.GetLegend();
-    if (extent.numRates > 0)
-        os << "  " << DescribeEvidence(bins) << '\n';
-    if (const std::string words = DescribeSmoothing(bins); extent.numRates > 1 && !words.empty())
-        os << "  " << words << '\n';
+    PrintNotes(os, bins, extent, rows.size() > content.rows.size() + 1);
 }

@@ -51,8 +51,9 @@ std::string DescribeWithoutWeight(const Bins& bins)
 
 std::string DescribeEvidence(const AttributeBins& bins)
 {
-    return fmt::format("rate and WoE of {}; information value {:.4f}", Quote(bins.target->categories[1]),
-                       *ComputeInformationValue(bins));
+    if (const std::optional<double> value = ComputeInformationValue(bins))
+        return fmt::format("rate and WoE of {}; information value {:.4f}", Quote(bins.target->categories[1]), *value);
+    return "";
 }
 
 std::string DescribeSmoothing(const AttributeBins& bins)
@@ -60,9 +61,9 @@ std::string DescribeSmoothing(const AttributeBins& bins)
     return IsSmoothed(bins) ? FormatNumber(bins.smoothing) + " added where a category has no weight" : "";
 }
 
-std::string FormatWeightOfEvidence(const BinRow& row)
+std::string FormatWeightOfEvidence(const BinRow& row, const Evidence& evidence)
 {
-    return row.kind == BinRow::Kind::kTotal ? "" : fmt::format("{:+.3f}", row.evidence->weightOfEvidence);
+    return row.kind == BinRow::Kind::kTotal ? "" : fmt::format("{:+.3f}", evidence.weightOfEvidence);
 }
 
 std::vector<std::string> ListCategories(const AttributeBins& bins, std::size_t bin)

@@ -21,14 +21,14 @@ std::string DescribeValues(const AttributeBins& bins);
 /// How many records were left out, as in "3 records"; empty if none was.
 std::string DescribeWithoutWeight(const Bins& bins);
 
-/// Of which category the rate and the weight of evidence are, and the information value.
+/// Of which category the rate and the weight of evidence are, and the information value; empty where there is none.
 std::string DescribeEvidence(const AttributeBins& bins);
 
 /// How the weights of evidence are smoothed; empty if none had to be.
 std::string DescribeSmoothing(const AttributeBins& bins);
 
-/// Of a row with evidence; empty of the total, which has none.
-std::string FormatWeightOfEvidence(const BinRow& row);
+/// Of a row with this evidence; empty of the total, which has no weight of evidence.
+std::string FormatWeightOfEvidence(const BinRow& row, const Evidence& evidence);
 
 /// The categories that a bin of a categorical attribute holds; of another attribute none.
 std::vector<std::string> ListCategories(const AttributeBins& bins, std::size_t bin);

@@ -1,5 +1,6 @@
 #include "hosts/mcbin/output/htmlreport.h"
 
+#include "bins/labels.h"
 #include "bins/numbers.h"
 #include "bins/rows.h"
 #include "bins/words.h"
@@ -93,18 +94,51 @@ void PrintBinsHead(std::ostream& os, const AttributeBins& bins, bool hasEvidence
     os << (hasEvidence ? "<th>rate</th><th>WoE</th><th>IV</th>" : "") << "</tr>\n";
 }
 
-void PrintRow(std::ostream& os, const BinRow& row)
+void PrintLabel(std::ostream& os, const BinRow& row)
 {
     os << (row.kind == BinRow::Kind::kBin ? "<tr>" : "<tr class=\"" + row.label + "\">") << "<td>"
-       << EscapeHtml(row.label) << "</td><td>" << FormatWeight(row.bin.weight)
-       << fmt::format("</td><td>{:.1f}%</td>", 100.0 * row.share);
-    for (const double weight : row.bin.weights) os << "<td>" << FormatWeight(weight) << "</td>";
-    if (row.evidence)
+       << EscapeHtml(row.label) << "</td>";
+}
+
+void PrintEvidence(std::ostream& os, const BinRow& row, const std::optional<Evidence>& evidence)
+{
+    if (evidence)
     {
-        os << fmt::format("<td>{:.1f}%</td><td>{}</td><td>{:.4f}</td>", 100.0 * row.evidence->rate,
-                          FormatWeightOfEvidence(row), row.evidence->informationValue);
+        os << fmt::format("<td>{:.1f}%</td><td>{}</td><td>{:.4f}</td>", 100.0 * evidence->rate,
+                          FormatWeightOfEvidence(row, *evidence), evidence->informationValue);
     }
+}
+
+void PrintRow(std::ostream& os, const BinRow& row)
+{
+    PrintLabel(os, row);
+    os << "<td>" << FormatWeight(row.bin.weight) << fmt::format("</td><td>{:.1f}%</td>", 100.0 * row.share);
+    for (const double weight : row.bin.weights) os << "<td>" << FormatWeight(weight) << "</td>";
+    PrintEvidence(os, row, row.evidence);
     os << "</tr>\n";
+}
+
+/// Of a target of more than two categories, folded away.
+void PrintEvidenceByCategory(std::ostream& os, const AttributeBins& bins, const std::vector<BinRow>& rows)
+{
+    os << "<details><summary>Each category against the rest</summary>\n<div class=\"scroll\"><table>\n<tr><th></th>";
+    const std::vector<std::optional<Evidence>>& first = rows.front().evidenceByCategory;
+    for (std::size_t code = 0; code < first.size(); ++code)
+    {
+        if (first[code])
+            os << "<th colspan=\"3\">" << EscapeHtml(FormatCategory(*bins.target, code)) << "</th>";
+    }
+    os << "</tr>\n<tr><th>bin</th>";
+    for (const std::optional<Evidence>& evidence : first)
+        os << (evidence ? "<th>rate</th><th>WoE</th><th>IV</th>" : "");
+    os << "</tr>\n";
+    for (const BinRow& row : rows)
+    {
+        PrintLabel(os, row);
+        for (const std::optional<Evidence>& evidence : row.evidenceByCategory) PrintEvidence(os, row, evidence);
+        os << "</tr>\n";
+    }
+    os << "</table></div></details>\n";
 }
 
 void PrintBins(std::ostream& os, const AttributeBins& bins)
@@ -115,12 +149,13 @@ void PrintBins(std::ostream& os, const AttributeBins& bins)
     PrintBinsHead(os, bins, hasEvidence);
     for (const BinRow& row : rows) PrintRow(os, row);
     os << "</table></div>\n";
-    if (hasEvidence)
+    if (const std::string evidence = DescribeEvidence(bins); !evidence.empty())
     {
         const std::string smoothing = DescribeSmoothing(bins);
-        os << "<p class=\"note\">" << EscapeHtml(DescribeEvidence(bins)) << (smoothing.empty() ? "" : "; ") << smoothing
-           << ".</p>\n";
+        os << "<p class=\"note\">" << EscapeHtml(evidence) << (smoothing.empty() ? "" : "; ") << smoothing << ".</p>\n";
     }
+    if (!rows.front().evidenceByCategory.empty())
+        PrintEvidenceByCategory(os, bins, rows);
 }
 
 void PrintFigures(std::ostream& os, const AttributeBins& bins)

@@ -86,7 +86,7 @@ class Missing:
     @classmethod
     def of_rows(cls, rows: list[Any]) -> Missing | None:
         """None where no such record has weight."""
-        for kind, _, _, _, weight, _, target_weights, evidence in rows:
+        for kind, _, _, _, weight, _, target_weights, evidence, _ in rows:
             if kind == "missing":
                 return cls(weight, tuple(target_weights), *(evidence or (None,) * 3))
         return None
@@ -129,6 +129,8 @@ class AttributeBins:
         """By bin: its part of the information value, (p - q) ln(p / q); None unless the target has two categories."""
         self.information_value = core.information_value
         """The sum over the bins and the missing; NaN unless the target has two categories."""
+        self.information_values = tuple(core.information_values)
+        """By category of the target: that of the category against all others."""
         self.smoothing = core.smoothing
         """What is added to both weights of a bin, for its weight of evidence, where one of them is 0."""
         self.missing = Missing.of_rows(core.rows)
@@ -166,7 +168,8 @@ class AttributeBins:
 
     def to_pandas(self) -> pd.DataFrame:
         """A row for each bin: its ends, its weight and share, and its weight in each category of the target; of a
-        target of two categories `rate`, `woe` and `iv`, too. Behind the bins a row for the missing, if they have
+        target of two categories `rate`, `woe` and `iv`, too, and of one of more each of them for each category against
+        all others. Behind the bins a row for the missing, if they have
         weight, and one for the total; they have no number."""
         pandas = require("pandas", "data frames", "pandas")
         rows = self._core.rows
@@ -187,6 +190,10 @@ class AttributeBins:
         if self.rates is not None:
             evidence = [row[7] or (np.nan,) * 3 for row in rows]
             columns |= {name: [row[i] for row in evidence] for i, name in enumerate(("rate", "woe", "iv"))}
+        elif self.target is not None and rows and rows[0][8]:
+            for i, figure in enumerate(("rate", "woe", "iv")):
+                for code, name in enumerate(self.target.category_names()):
+                    columns[f"{figure}[{name}]"] = [row[8][code][i] if row[8][code] else np.nan for row in rows]
         frame: pd.DataFrame = pandas.DataFrame(columns)
         return frame
 

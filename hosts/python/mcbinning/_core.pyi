@@ -9,6 +9,7 @@ import numpy.typing as npt
 _Floats = npt.NDArray[np.float64]
 __version__: str
 
+_Evidence = tuple[float, float, float]
 _Status = tuple[int, str, tuple[int, int, int], tuple[float, float, float]]
 
 def temp_directory(named: str) -> str: ...
@@ -68,10 +69,13 @@ class AttributeBins:
     iv: _Floats | None
     information_value: float
     smoothing: float
-    rows: list[tuple[str, str, float, float, float, float, list[float], tuple[float, float, float] | None]]
+    information_values: list[float]
+    rows: list[
+        tuple[str, str, float, float, float, float, list[float], _Evidence | None, list[_Evidence | None]]
+    ]
     """Of each bin, the missing if they have weight, and the total: "bin", "missing" or "total", the label, the borders,
     the weight and its share of the total, the weight in each category of the target, and rate, weight of evidence and
-    information value."""
+    information value, which a target of more than two categories has for each of them."""
 
     def find_bin(self, value: float) -> int: ...
     def alone(self) -> Bins:

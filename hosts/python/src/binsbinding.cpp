@@ -98,7 +98,15 @@ nb::object GetTargetWeights(const AttributeBins& bins)
     return ToArray(std::move(flat), std::max<std::size_t>(bins.target->categories.size(), 1));
 }
 
-/// None unless the target has two categories.
+/// Rate, weight of evidence and information value, or None.
+nb::object ToTuple(const std::optional<Evidence>& evidence)
+{
+    if (!evidence)
+        return nb::none();
+    return nb::make_tuple(evidence->rate, evidence->weightOfEvidence, evidence->informationValue);
+}
+
+/// Of the event, or of the only one that there can be; None where there is no evidence.
 nb::object GetEvidence(const AttributeBins& bins, double Evidence::*figure)
 {
     std::vector<Evidence> evidence = ComputeEvidence(bins);
@@ -108,8 +116,18 @@ nb::object GetEvidence(const AttributeBins& bins, double Evidence::*figure)
     return Collect(evidence, [figure](const Evidence& ofBin) { return ofBin.*figure; });
 }
 
+/// By category of the target.
+std::vector<double> GetInformationValues(const AttributeBins& bins)
+{
+    std::vector<double> values;
+    const std::size_t numCategories = bins.target ? bins.target->categories.size() : 0;
+    for (std::size_t code = 0; code < numCategories; ++code)
+        values.push_back(ToNumber(ComputeInformationValue(bins, code)));
+    return values;
+}
+
 /// Of each row of the table a tuple: what it is, its label, its borders, its weight, its share, its weight in each
-/// category, and its rate, weight of evidence and information value, or None.
+/// category, its evidence, or None, and its evidence by category of a target of more than two.
 nb::list GetRows(const AttributeBins& bins)
 {
     static constexpr std::pair<const char*, BinRow::Kind> kKinds[] = {
@@ -117,14 +135,10 @@ nb::list GetRows(const AttributeBins& bins)
     nb::list rows;
     for (const BinRow& row : MakeRows(bins))
     {
-        nb::object evidence = nb::none();
-        if (row.evidence)
-        {
-            evidence =
-                nb::make_tuple(row.evidence->rate, row.evidence->weightOfEvidence, row.evidence->informationValue);
-        }
+        nb::list byCategory;
+        for (const std::optional<Evidence>& evidence : row.evidenceByCategory) byCategory.append(ToTuple(evidence));
         rows.append(nb::make_tuple(GetName(kKinds, row.kind), row.label, row.bin.left, row.bin.right, row.bin.weight,
-                                   row.share, row.bin.weights, evidence));
+                                   row.share, row.bin.weights, ToTuple(row.evidence), byCategory));
     }
     return rows;
 }
@@ -261,6 +275,7 @@ void BindAttributeBins(nb::module_& module)
         .def_prop_ro("rows", &GetRows)
         .def_ro("smoothing", &AttributeBins::smoothing)
         .def_prop_ro("information_value", [](Self self) { return ToNumber(ComputeInformationValue(self)); })
+        .def_prop_ro("information_values", &GetInformationValues)
         .def("find_bin", [](Self self, double value) { return FindBin(self.cutPoints, self.isRightClosed, value); })
         .def("alone", &MakeAlone);
 }

@@ -100,3 +100,23 @@ TEST(Measures, ResultsAreInTheOrderOfTheirGain)
     const auto* const first = bins.results.data();
     EXPECT_EQ((std::vector<const AttributeBins*>{first + 1, first, first + 2}), SortByGain(bins));
 }
+
+TEST(Measures, EachOfSeveralCategoriesIsTheEventAgainstTheRest)
+{
+    AttributeBins bins = SomeBins(AVariable("x"), ATarget(4), {1}, {{6, 2, 0, 0}, {2, 4, 2, 0}});
+    bins.missing = Bin{0.0, 0.0, 4.0, {0, 2, 2, 0}};
+
+    const std::vector<Evidence> evidence = ComputeEvidence(bins, 1);
+    ASSERT_EQ(3u, evidence.size());
+    EXPECT_EQ(0.25, evidence[0].rate);
+    EXPECT_EQ(std::log((2.0 / 8.0) / (6.0 / 12.0)), evidence[0].weightOfEvidence);
+    EXPECT_EQ(0.0, evidence[1].weightOfEvidence - std::log((4.0 / 8.0) / (4.0 / 12.0)));
+    EXPECT_TRUE(ComputeEvidence(bins).empty()) << "no category is the event unless it is named";
+    EXPECT_TRUE(ComputeEvidence(bins, 3).empty()) << "it has no weight";
+    EXPECT_TRUE(IsSmoothed(bins)); // the third category is not in the first bin
+
+    const std::vector<BinRow> rows = MakeRows(bins);
+    EXPECT_EQ(0.4, rows.back().evidenceByCategory[0]->rate);
+    EXPECT_EQ(ComputeInformationValue(bins, 2), rows.back().evidenceByCategory[2]->informationValue);
+    EXPECT_FALSE(rows.front().evidenceByCategory[3]);
+}
