@@ -18,8 +18,9 @@ Binner::Binner(const AttributeBins& bins, const std::vector<std::string>& missin
     }
     for (std::size_t code = 0; code < variable.categories.size(); ++code)
     {
-        fBinsByCategory.emplace(variable.categories[code],
-                                FindBin(bins.cutPoints, bins.isRightClosed, static_cast<double>(code)));
+        const auto value = static_cast<double>(code);
+        fFoundByCategory.emplace(variable.categories[code],
+                                 Found{FindBin(bins.cutPoints, bins.isRightClosed, value), false, value});
     }
 }
 
@@ -31,12 +32,12 @@ Binner::Found Binner::Find(std::string_view field)
         return FindCategory(field);
     const std::optional<double> value = ParseNumber(field);
     if (!value)
-        return {std::nullopt, true};
+        return {std::nullopt, true, 0.0};
     if (IsMissing(*value))
         return {};
     if (fBins.attribute->kind == VariableKind::kNumericCategorical)
         return FindCategory(FormatCategoryNumber(*value)); // "1.0" is the category 1
-    return {FindBin(fBins.cutPoints, fBins.isRightClosed, *value), false};
+    return {FindBin(fBins.cutPoints, fBins.isRightClosed, *value), false, *value};
 }
 
 bool Binner::IsMissing(double value) const
@@ -49,8 +50,6 @@ bool Binner::IsMissing(double value) const
 Binner::Found Binner::FindCategory(std::string_view field)
 {
     fKey = field;
-    const auto found = fBinsByCategory.find(fKey);
-    if (found == fBinsByCategory.end())
-        return {std::nullopt, true};
-    return {found->second, false};
+    const auto found = fFoundByCategory.find(fKey);
+    return found == fFoundByCategory.end() ? Found{std::nullopt, true, 0.0} : found->second;
 }

@@ -18,6 +18,7 @@ public:
     {
         std::optional<std::size_t> bin; ///< from 0; nothing if the value is missing or bad
         bool isBad = false;             ///< no number where one should be, or a category never seen
+        double value = 0.0;             ///< that is in the bin: the number, or the code of the category
     };
 
     /// `missingTexts` count as missing beside what the attribute declares; a number in them stands for all ways to
@@ -33,7 +34,7 @@ private:
     const AttributeBins& fBins;
     std::vector<std::string> fMissingTexts;
     std::vector<double> fMissingNumbers; ///< the attribute's, and those among the texts
-    std::unordered_map<std::string, std::size_t> fBinsByCategory;
+    std::unordered_map<std::string, Found> fFoundByCategory;
     std::string fKey; ///< kept for its memory
 };
 

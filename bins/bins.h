@@ -79,7 +79,8 @@ struct AttributeBins
     std::shared_ptr<const Variable> target;    ///< null without one
     bool isRightClosed = true;                 ///< a bin is (left, right], otherwise [left, right)
     MCBinning::MCStatus status;
-    std::int64_t numDistinct = 0;   ///< different valid values
+    /// Different valid values; nothing where records were only counted in bins that were there.
+    std::optional<std::int64_t> numDistinct;
     double weight = 0.0;            ///< of the records with a valid value, and a valid target if there is one
     double weightWithMissing = 0.0; ///< of all records
     std::optional<double> minimum;  ///< of the valid values; nothing where there is none, as with an error
@@ -95,8 +96,12 @@ struct AttributeBins
     std::optional<Bin> missing;
     /// What is added to both weights of a bin, to tell the weight of evidence, where it has no events or no others.
     double smoothing = 0.5;
+    bool isEdited = false; ///< a person has changed the bins after they were found
 
     bool HasBins() const { return !bins.empty(); }
+
+    /// Adds the next bin between its cut points.
+    void AddBin(double ownWeight, std::vector<double> ownWeights);
 };
 
 enum class Method

@@ -2,13 +2,10 @@
 
 #include <mcobnqrt/mcobnqrt.h>
 
-#include <limits>
 #include <utility>
 
 namespace
 {
-
-constexpr double kInfinity = std::numeric_limits<double>::infinity();
 
 /// Null if no variable has the index.
 std::shared_ptr<const Variable> FindVariable(const Bins& bins, int index)
@@ -48,17 +45,6 @@ AttributeBins MakeAttributeBins(const Bins& bins, const LibraryResult& result,
     return made;
 }
 
-void AddBin(AttributeBins& bins, double weight, std::vector<double> weights)
-{
-    const std::size_t index = bins.bins.size();
-    Bin bin;
-    bin.left = index == 0 ? -kInfinity : bins.cutPoints[index - 1];
-    bin.right = index == bins.cutPoints.size() ? kInfinity : bins.cutPoints[index];
-    bin.weight = weight;
-    bin.weights = std::move(weights);
-    bins.bins.push_back(std::move(bin));
-}
-
 /// The weights of a row of cells by category. The row has no cells for the last categories if no record that counts is
 /// of them.
 std::vector<double> GetCategoryWeights(const std::vector<double>& row, const Variable& target)
@@ -79,7 +65,7 @@ void AddResult(Bins& bins, const BINAttributeTargetResults& result, const std::v
     for (const std::vector<double>& row : result.GetCellCounts())
     {
         if (!row.empty()) // as it is where nothing was binned
-            AddBin(made, row.front(), GetCategoryWeights(row, *made.target));
+            made.AddBin(row.front(), GetCategoryWeights(row, *made.target));
     }
     if (made.HasBins())
         made.modelEntropy = DecodeFigure(result.GetModelEntropy());
@@ -91,6 +77,6 @@ void AddResult(Bins& bins, const BINAttributeResults& result, const std::vector<
     AttributeBins made = MakeAttributeBins(bins, result, values);
     if (!made.attribute)
         return;
-    for (const double weight : result.GetCellCounts()) AddBin(made, weight, {});
+    for (const double weight : result.GetCellCounts()) made.AddBin(weight, {});
     bins.results.push_back(std::move(made));
 }

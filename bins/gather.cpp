@@ -43,7 +43,8 @@ void AddPart(Bins& whole, const Bins& part, int attribute, int target, std::opti
         result.attribute = GetVariable(whole, attribute);
         result.target = GetVariable(whole, target);
         result.status = Renumber(result.status, attribute, target);
-        result.numDistinct = numDistinct.value_or(result.numDistinct);
+        if (numDistinct)
+            result.numDistinct = numDistinct;
         whole.results.push_back(std::move(result));
     }
 }

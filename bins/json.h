@@ -23,9 +23,16 @@ JsonValue MakeDocument(const Bins& bins);
 /// The text of the document.
 std::string ToJson(const Bins& bins);
 
+/// What becomes of bins whose cut points were edited by hand, so that they are not those of the bins any more.
+enum class Edits
+{
+    kRefused,
+    kRecut ///< they are marked as edited, and have no weight until records are counted in them
+};
+
 /// The bins of a document of this version or of an earlier one.
 /// \throw JsonFault if the document is not of the form, or contradicts itself.
-Bins ReadBins(const JsonValue& document);
+Bins ReadBins(const JsonValue& document, Edits edits = Edits::kRefused);
 
 /// The fault of a text that is not JSON, for all hosts to tell alike. `line` counts from 1.
 JsonFault MakeNotJson(long line);

@@ -39,6 +39,13 @@ std::vector<JsonCursor> JsonCursor::GetElements() const
     return elements;
 }
 
+bool JsonCursor::GetBoolean() const
+{
+    if (!std::holds_alternative<bool>(fValue->held))
+        RefuseKind("true or false");
+    return std::get<bool>(fValue->held);
+}
+
 const std::string& JsonCursor::GetString() const
 {
     const auto* const text = std::get_if<std::string>(&fValue->held);

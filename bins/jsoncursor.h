@@ -28,6 +28,7 @@ public:
     bool IsNull() const { return std::holds_alternative<std::nullptr_t>(fValue->held); }
     bool IsString() const { return std::holds_alternative<std::string>(fValue->held); }
 
+    bool GetBoolean() const;
     const std::string& GetString() const;
     std::vector<std::string> GetStrings() const;
     /// A whole number from `least` to `most`.

@@ -1,3 +1,4 @@
+#include "bins/edit.h"
 #include "bins/json.h"
 #include "bins/jsoncursor.h"
 #include "bins/jsonnames.h"
@@ -14,7 +15,7 @@ namespace
 class Reader
 {
 public:
-    explicit Reader(std::int64_t version) : fVersion(version) {}
+    Reader(std::int64_t version, Edits edits) : fVersion(version), fEdits(edits) {}
 
     Bins Read(const JsonCursor& document)
     {
@@ -172,11 +173,15 @@ private:
     {
         AttributeBins result;
         result.isRightClosed = fBins.settings.isRightClosed;
+        result.smoothing = fBins.settings.smoothing;
         result.attribute = FindVariable(json.At("attribute"));
         if (!json.At("target").IsNull())
             result.target = FindVariable(json.At("target"));
         result.status = ReadStatus(json.At("status"));
-        result.numDistinct = json.At("distinct_values").GetInteger(0);
+        if (const auto numDistinct = json.Find("distinct_values"))
+            result.numDistinct = numDistinct->GetInteger(0);
+        if (const auto edited = json.Find("edited"))
+            result.isEdited = edited->GetBoolean();
         result.weight = json.At("weight").GetNumber();
         result.weightWithMissing = json.At("weight_with_missing").GetNumber();
         result.minimum = json.At("minimum").GetFigure();
@@ -184,8 +189,10 @@ private:
         result.modelEntropy = json.At("model_entropy").GetFigure();
         result.cutPoints = json.At("cut_points").GetNumbers();
         for (const JsonCursor& bin : json.At("bins").GetElements()) result.bins.push_back(ReadBin(bin, result));
+        RefuseUnlessRising(json, result);
+        if (fEdits == Edits::kRecut && !result.bins.empty() && !IsBetweenCutPoints(result))
+            return Recut(result, result.cutPoints);
         RefuseIfInconsistent(json, result);
-        result.smoothing = fBins.settings.smoothing;
         if (const auto missing = json.Find("missing"))
             result.missing = ReadMissingGroup(*missing, result);
         return result;
@@ -234,14 +241,32 @@ private:
         return missing;
     }
 
+    static void RefuseUnlessRising(const JsonCursor& json, const AttributeBins& result)
+    {
+        const std::vector<double>& cuts = result.cutPoints;
+        const auto isNotBelow = [](double a, double b) { return !(a < b); };
+        if (std::adjacent_find(cuts.begin(), cuts.end(), isNotBelow) != cuts.end())
+            json.At("cut_points").Refuse("cut points must rise");
+    }
+
+    static bool IsBetweenCutPoints(const AttributeBins& result)
+    {
+        const std::vector<double>& cuts = result.cutPoints;
+        if (result.bins.size() != cuts.size() + 1)
+            return false;
+        for (std::size_t i = 0; i < cuts.size(); ++i)
+        {
+            if (result.bins[i].right != cuts[i] || result.bins[i + 1].left != cuts[i])
+                return false;
+        }
+        return true;
+    }
+
     /// The bins lie between the cut points, which so can't be NaN, and hold a weight for each category of the target.
     static void RefuseIfInconsistent(const JsonCursor& json, const AttributeBins& result)
     {
         constexpr double kInfinity = std::numeric_limits<double>::infinity();
         const std::vector<double>& cuts = result.cutPoints;
-        const auto isNotBelow = [](double a, double b) { return !(a < b); };
-        if (std::adjacent_find(cuts.begin(), cuts.end(), isNotBelow) != cuts.end())
-            json.At("cut_points").Refuse("cut points must rise");
         if (result.bins.size() != (result.bins.empty() && cuts.empty() ? 0 : cuts.size() + 1))
             json.At("bins").Refuse("there must be one bin more than there are cut points");
         const std::vector<JsonCursor> bins = json.At("bins").GetElements();
@@ -275,12 +300,13 @@ private:
     static int ReadInt(const JsonCursor& json) { return static_cast<int>(json.GetInteger(INT_MIN, INT_MAX)); }
 
     std::int64_t fVersion;
+    Edits fEdits;
     Bins fBins;
 };
 
 } // namespace
 
-Bins ReadBins(const JsonValue& document)
+Bins ReadBins(const JsonValue& document, Edits edits)
 {
     const JsonCursor cursor(document);
     const bool isObject = std::holds_alternative<JsonValue::Object>(document.held);
@@ -294,7 +320,7 @@ Bins ReadBins(const JsonValue& document)
             .Refuse("version " + std::to_string(version) + " is not known here, but those up to " +
                     std::to_string(kSchemaVersion) + " are");
     }
-    return Reader(version).Read(cursor);
+    return Reader(version, edits).Read(cursor);
 }
 
 JsonFault MakeNotJson(long line)

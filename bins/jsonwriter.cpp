@@ -138,6 +138,7 @@ JsonValue ToValue(const AttributeBins& result)
         {"attribute", result.attribute->name},
         {"target", result.target ? JsonValue(result.target->name) : JsonValue()},
         {"status", ToValue(result.status)},
+        {"edited", result.isEdited},
         {"distinct_values", result.numDistinct},
         {"weight", result.weight},
         {"weight_with_missing", result.weightWithMissing},

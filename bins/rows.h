@@ -15,6 +15,7 @@ struct BinRow
     {
         kBin,
         kMissing, ///< the records without a valid value
+        kUnseen,  ///< those of a category that the bins were made without
         kTotal
     };
 

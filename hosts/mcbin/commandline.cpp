@@ -76,6 +76,12 @@ CLI::Option* AddList(CLI::App& command, const std::string& name, std::vector<std
     return AddRepeated(command, name, list, description, what)->delimiter(',');
 }
 
+/// The name of one column.
+CLI::Option* AddName(CLI::App& command, const std::string& option, std::string& name, const std::string& description)
+{
+    return command.add_option(option, name, description)->check(MakeNameCheck())->option_text("NAME")->group("Columns");
+}
+
 /// An option that also goes by the name of an earlier release, which the help doesn't tell.
 template<class Value>
 CLI::Option* AddRenamed(CLI::App& command, const std::string& name, const std::string& earlierName, Value& value,
@@ -85,9 +91,8 @@ CLI::Option* AddRenamed(CLI::App& command, const std::string& name, const std::s
     return command.add_option(name, value, description)->check(check);
 }
 
-void AddTable(CLI::App& command, TableOptions& table)
+void AddDelimiter(CLI::App& command, TableOptions& table)
 {
-    command.add_option("DATA", table.file, kData)->required()->option_text("FILE");
     command
         .add_option_function<std::string>(
             "--delimiter", [&table](const std::string& name) { table.delimiter = ParseDelimiter(name); },
@@ -95,6 +100,12 @@ void AddTable(CLI::App& command, TableOptions& table)
         ->check(MakeDelimiterCheck())
         ->option_text("CHAR")
         ->group("Input");
+}
+
+void AddTable(CLI::App& command, TableOptions& table)
+{
+    command.add_option("DATA", table.file, kData)->required()->option_text("FILE");
+    AddDelimiter(command, table);
 }
 
 void AddMissing(CLI::App& command, std::vector<std::string>& missingText, bool& isBadMissing)
@@ -139,12 +150,8 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
         ->group("Columns");
     AddRepeated(command, "--exclude", columns.exclude, "Columns not to bin; names or patterns", "NAME,...")
         ->group("Columns");
-    command
-        .add_option("--weight", columns.weight,
-                    "The column that tells how many cases a row stands for. A row without a weight is left out")
-        ->check(MakeNameCheck())
-        ->option_text("NAME")
-        ->group("Columns");
+    AddName(command, "--weight", columns.weight,
+            "The column that tells how many cases a row stands for. A row without a weight is left out");
     AddRounding(command, columns);
     AddRepeated(
         command, "--categorical", columns.categorical,
@@ -169,30 +176,40 @@ void AddNumBins(CLI::App& command, BinOptions& options, const std::string& descr
         ->group("Settings");
 }
 
-void AddSettings(CLI::App& command, BinOptions& options)
+CLI::Option* AddClosed(CLI::App& command, Settings& settings)
 {
-    command
+    return command
         .add_option_function<std::string>(
-            "--closed", [&options](const std::string& side) { options.settings.isRightClosed = side == "right"; },
+            "--closed", [&settings](const std::string& side) { settings.isRightClosed = side == "right"; },
             "Which end of an interval belongs to it; right if not given")
         ->check(CLI::IsMember({"right", "left"}))
         ->option_text("right|left")
         ->group("Settings");
+}
+
+void AddTempDirectory(CLI::App& command, std::string& tempDirectory)
+{
     command
         .add_option_function<std::string>(
-            "--temp-dir", [&options](const std::string& directory) { options.tempDirectory = directory; },
+            "--temp-dir", [&tempDirectory](const std::string& directory) { tempDirectory = directory; },
             "Where the temporary files go, which hold all records; the directory in TMPDIR, else /tmp, if not given")
         ->check(MakeNameCheck())
         ->option_text("DIR")
         ->group("Settings");
 }
 
+void AddSettings(CLI::App& command, BinOptions& options)
+{
+    AddClosed(command, options.settings);
+    AddTempDirectory(command, options.tempDirectory);
+}
+
 /// A temporary directory that can't be used ends the tool as any other wrong use of it does.
-void SettleTempDirectory(BinOptions& options)
+void SettleTempDirectory(std::string& tempDirectory)
 {
     try
     {
-        options.tempDirectory = ChooseTempDirectory(options.tempDirectory, "--temp-dir");
+        tempDirectory = ChooseTempDirectory(tempDirectory, "--temp-dir");
     }
     catch (const TempDirectoryUnusable& error)
     {
@@ -254,14 +271,9 @@ void AddSupervised(CLI::App& app, Request& request)
         "supervised", "Cut the columns of numbers where they separate the categories of a target best");
     AddTable(command, request.bin.table);
     CLI::Option* const target =
-        command
-            .add_option(
-                "--target", request.bin.columns.target,
-                "The column whose categories are to be separated, from 2 to 256; a column of numbers is cut into "
-                "bins first, as the last example shows")
-            ->check(MakeNameCheck())
-            ->option_text("NAME")
-            ->group("Columns");
+        AddName(command, "--target", request.bin.columns.target,
+                "The column whose categories are to be separated, from 2 to 256; a column of numbers is cut into bins "
+                "first, as the last example shows");
     CLI::Option* const pairs =
         AddList(command, "--pairs", request.bin.columns.pairs,
                 "Several targets in one pass: what is to be binned for which; the attribute may be a pattern",
@@ -302,7 +314,7 @@ void AddSupervised(CLI::App& app, Request& request)
                 throw CLI::RequiredError("--target, or --pairs,");
             request.command = Request::Command::kSupervised;
             request.bin.settings.method = Method::kSupervised;
-            SettleTempDirectory(request.bin);
+            SettleTempDirectory(request.bin.tempDirectory);
             if (request.bin.settings.numBins == 0)
                 request.bin.settings.numBins = kPreBins;
             request.bin.settings.smallBinRatio = request.bin.settings.smallBinRatio.value_or(0.0);
@@ -326,7 +338,7 @@ void AddEqualFrequency(CLI::App& app, Request& request)
         {
             request.command = Request::Command::kEqualFrequency;
             request.bin.settings.method = Method::kEqualFrequency;
-            SettleTempDirectory(request.bin);
+            SettleTempDirectory(request.bin.tempDirectory);
             if (request.bin.settings.numBins == 0)
                 request.bin.settings.numBins = kUsualBins;
         });
@@ -346,6 +358,64 @@ void AddShow(CLI::App& app, Request& request)
     AddOutput(command, request.show.output);
     command.footer(kShowExamples);
     command.callback([&request] { request.command = Request::Command::kShow; });
+}
+
+/// Without bins the data stand alone, and cut points make the bins.
+void SettleEvaluation(EvaluateOptions& options, const std::vector<std::string>& files)
+{
+    const std::size_t numWanted = options.cuts.empty() ? 2 : 1;
+    if (files.size() != numWanted)
+    {
+        throw CLI::ValidationError(options.cuts.empty() ? "BINS.json and DATA are needed, or --cuts and DATA"
+                                                        : "with --cuts there is only DATA, as these make the bins");
+    }
+    if (options.output.format == Format::kSql)
+        throw CLI::ValidationError("--format: an evaluation has no form in SQL; 'mcbin show' has one of its bins");
+    options.bins = options.cuts.empty() ? files.front() : "";
+    options.table.file = files.back();
+    SettleTempDirectory(options.tempDirectory);
+}
+
+void AddEvaluate(CLI::App& app, Request& request)
+{
+    EvaluateOptions& options = request.evaluate;
+    CLI::App& command = *app.add_subcommand(
+        "evaluate", "Count a file in bins that were found before, and tell how far it has moved from their data");
+    const auto files = std::make_shared<std::vector<std::string>>();
+    command
+        .add_option("FILES", *files,
+                    "The bins, as --format json has written them, whose cut points may have been "
+                    "edited since; and the data, a delimited text file or - for standard input")
+        ->required()
+        ->option_text("[BINS.json] DATA");
+    AddDelimiter(command, options.table);
+    AddRepeated(command, "--cuts", options.cuts,
+                "Makes the bins of cut points alone, without a file of bins; may be repeated", "COLUMN=18,25,40")
+        ->group("Columns");
+    AddName(command, "--target", options.columns.target,
+            "The column of the target, if it is not called as it was; without such a column rates are left out");
+    AddName(command, "--weight", options.columns.weight, "The column of the weight, if it is not called as it was");
+    AddMissing(command, options.columns.missingText, options.columns.isBadMissing);
+    command
+        .add_option_function<std::string>(
+            "--save", [&options](const std::string& file) { options.save = file; },
+            "Write the bins as they were counted, too, as --format json writes bins")
+        ->check(MakeNameCheck())
+        ->option_text("FILE.json")
+        ->group("Output");
+    AddClosed(command, options.settings)
+        ->description("With --cuts: which end of an interval belongs to it; right if "
+                      "not given");
+    AddTempDirectory(command, options.tempDirectory);
+    AddOutput(command, options.output);
+    AddQuiet(command, options.output.isQuiet);
+    command.footer(kEvaluateExamples);
+    command.callback(
+        [&request, files]
+        {
+            request.command = Request::Command::kEvaluate;
+            SettleEvaluation(request.evaluate, *files);
+        });
 }
 
 void AddApply(CLI::App& app, Request& request)
@@ -435,6 +505,7 @@ std::unique_ptr<CLI::App> MakeApp(Request& request)
     AddSupervised(*app, request);
     AddEqualFrequency(*app, request);
     AddShow(*app, request);
+    AddEvaluate(*app, request);
     AddApply(*app, request);
     app->final_callback(
         [&request]

@@ -15,15 +15,17 @@ struct Request
         kSupervised,
         kEqualFrequency,
         kShow,
+        kEvaluate,
         kApply,
         kText ///< to print `text` and end
     };
 
     Command command = Command::kNone;
-    BinOptions bin;     ///< of the first two commands
-    ShowOptions show;   ///< of kShow
-    ApplyOptions apply; ///< of kApply
-    std::string text;   ///< the help, the version or the manual page
+    BinOptions bin;           ///< of the first two commands
+    ShowOptions show;         ///< of kShow
+    EvaluateOptions evaluate; ///< of kEvaluate
+    ApplyOptions apply;       ///< of kApply
+    std::string text;         ///< the help, the version or the manual page
 };
 
 /// What is wrong with a command line, in words for the user.

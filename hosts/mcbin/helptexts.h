@@ -25,6 +25,12 @@ inline constexpr const char* kShowExamples = R"(Examples:
   mcbin show bins.json --format html > bins.html
   mcbin show bins.json --format sql --dialect duckdb --labels)";
 
+inline constexpr const char* kEvaluateExamples = R"(Examples:
+  mcbin supervised loans.csv --target default --format json > bins.json
+  mcbin evaluate bins.json loans_of_this_year.csv --report drift.html
+  mcbin evaluate bins.json loans_of_this_year.csv --strict --format json > drift.json
+  mcbin evaluate loans.csv --cuts age=18,25,40 --target default --save bins.json)";
+
 inline constexpr const char* kApplyExamples = R"(Examples:
   mcbin supervised train.csv --target bought --format json > bins.json
   mcbin apply bins.json new.csv -o new_binned.csv
@@ -34,7 +40,7 @@ inline constexpr const char* kExitCodes = R"(Exit codes:
   0    done
   1    failure: a file, a row or the data cannot be used, or the output cannot be written
   2    the command line is wrong
-  3    with --strict: done, but an attribute carries a warning or an error
+  3    with --strict: done, but an attribute carries a warning or an error, or its population has moved
   130  interrupted; what was found before that has been printed, and no file is written)";
 
 #endif

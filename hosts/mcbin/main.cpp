@@ -4,10 +4,13 @@
 #include "bins/sql.h"
 #include "hosts/mcbin/apply.h"
 #include "hosts/mcbin/commandline.h"
+#include "hosts/mcbin/evaluate.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/jsoninput.h"
 #include "hosts/mcbin/input/tablereader.h"
 #include "hosts/mcbin/interrupt.h"
+#include "hosts/mcbin/output/evaluationpage.h"
+#include "hosts/mcbin/output/evaluationtable.h"
 #include "hosts/mcbin/output/htmlreport.h"
 #include "hosts/mcbin/output/outputfile.h"
 #include "hosts/mcbin/output/tableoutput.h"
@@ -34,11 +37,21 @@ constexpr int kUsage = 2;
 constexpr int kFlagged = 3;
 constexpr int kInterrupted = 130;
 
-std::string MakePage(const Outcome& outcome)
+/// The page of bins or of an evaluation.
+template<class Shown>
+std::string MakePage(const Shown& shown)
 {
     std::ostringstream page;
-    PrintHtml(page, outcome);
+    PrintHtml(page, shown);
     return page.str();
+}
+
+template<class Shown>
+std::string MakeTables(const Shown& shown)
+{
+    std::ostringstream os;
+    PrintTables(os, shown, {GetTerminalWidth(STDOUT_FILENO), HasColours(STDOUT_FILENO)});
+    return os.str();
 }
 
 std::string Print(const Outcome& outcome, const OutputOptions& options)
@@ -46,11 +59,7 @@ std::string Print(const Outcome& outcome, const OutputOptions& options)
     switch (options.format)
     {
     case Format::kTable:
-    {
-        std::ostringstream os;
-        PrintTables(os, outcome, {GetTerminalWidth(STDOUT_FILENO), HasColours(STDOUT_FILENO)});
-        return os.str();
-    }
+        return MakeTables(outcome);
     case Format::kHtml:
         return MakePage(outcome);
     case Format::kJson:
@@ -59,6 +68,24 @@ std::string Print(const Outcome& outcome, const OutputOptions& options)
         return ToCsv(outcome.bins);
     case Format::kSql:
         return ToSql(outcome.bins, {options.dialect, options.areLabels});
+    }
+    return "";
+}
+
+std::string Print(const Evaluation& evaluation, const OutputOptions& options)
+{
+    switch (options.format)
+    {
+    case Format::kTable:
+        return MakeTables(evaluation);
+    case Format::kHtml:
+        return MakePage(evaluation);
+    case Format::kJson:
+        return ToJson(evaluation);
+    case Format::kCsv:
+        return ToCsv(evaluation);
+    case Format::kSql: // the command line has refused it
+        break;
     }
     return "";
 }
@@ -79,12 +106,13 @@ void WriteOut(const std::string& text)
 
 /// Writes the page unless a signal has asked for the end: the page of a whole run is worth more than that of a part.
 /// \return the failure, to be thrown once the tables are printed: a full disk is no reason to lose them.
-std::exception_ptr WriteReport(OutputFile& report, const Outcome& outcome)
+template<class Shown>
+std::exception_ptr WriteReport(OutputFile& report, const Shown& shown)
 {
     try
     {
         ThrowIfInterrupted();
-        report.Write(MakePage(outcome));
+        report.Write(MakePage(shown));
         report.Commit();
     }
     catch (const Failure&)
@@ -111,9 +139,9 @@ int GetExitCode(const Outcome& outcome, bool isStrict)
 }
 
 /// A name that can't be written is found out before the work.
-std::optional<OutputFile> OpenReport(const OutputOptions& options)
+std::optional<OutputFile> OpenFile(const std::string& name)
 {
-    return options.report.empty() ? std::nullopt : std::optional<OutputFile>(std::in_place, options.report);
+    return name.empty() ? std::nullopt : std::optional<OutputFile>(std::in_place, name);
 }
 
 /// Prints and writes what was asked for. \return the exit code.
@@ -134,8 +162,29 @@ int Present(const Outcome& outcome, const OutputOptions& options, std::optional<
 
 int Show(const ShowOptions& options)
 {
-    std::optional<OutputFile> report = OpenReport(options.output);
+    std::optional<OutputFile> report = OpenFile(options.output.report);
     return Present({ReadJson(options.bins), {}, {}}, options.output, report);
+}
+
+int Evaluate(const EvaluateOptions& options)
+{
+    Progress progress(IsTerminal(STDERR_FILENO) && !options.output.isQuiet);
+    std::optional<OutputFile> report = OpenFile(options.output.report);
+    std::optional<OutputFile> save = OpenFile(options.save);
+    Evaluated evaluated = EvaluateBins(options, progress);
+    if (save)
+    {
+        save->Write(ToJson(evaluated.evaluation.second));
+        save->Commit();
+    }
+    if (options.bins.empty()) // there is nothing to compare with
+        return Present({evaluated.evaluation.second, {}, evaluated.notes}, options.output, report);
+    const std::exception_ptr failure = report ? WriteReport(*report, evaluated.evaluation) : nullptr;
+    WriteOut(Print(evaluated.evaluation, options.output));
+    for (const std::string& note : evaluated.notes) Tell(note);
+    if (failure)
+        std::rethrow_exception(failure);
+    return options.output.isStrict && IsFlagged(evaluated.evaluation) ? kFlagged : 0;
 }
 
 int Bin(const BinOptions& options)
@@ -145,7 +194,7 @@ int Bin(const BinOptions& options)
     tableOptions.isReadTwice = true;
     tableOptions.spoolDirectory = options.tempDirectory;
     TableReader table(tableOptions);
-    std::optional<OutputFile> report = OpenReport(options.output);
+    std::optional<OutputFile> report = OpenFile(options.output.report);
     return Present(FindBins(table, options, progress), options.output, report);
 }
 
@@ -169,6 +218,8 @@ int Run(int argc, char** argv)
     }
     if (request.command == Request::Command::kShow)
         return Show(request.show);
+    if (request.command == Request::Command::kEvaluate)
+        return Evaluate(request.evaluate);
     if (request.command != Request::Command::kApply)
         return Bin(request.bin);
     Progress progress(IsTerminal(STDERR_FILENO) && !request.apply.isQuiet);

@@ -61,6 +61,18 @@ struct ShowOptions
     OutputOptions output;
 };
 
+struct EvaluateOptions
+{
+    std::string bins;              ///< the file that was written as JSON; empty if `cuts` make the bins
+    std::vector<std::string> cuts; ///< each COLUMN=18,25,40
+    TableOptions table;
+    ColumnOptions columns; ///< of which the target, the weight and what is missing matter
+    Settings settings;     ///< of bins that are made from cut points
+    std::string tempDirectory;
+    std::string save; ///< the file for the bins as they were counted; empty for none
+    OutputOptions output;
+};
+
 struct ApplyOptions
 {
     std::string bins; ///< the file that was written as JSON

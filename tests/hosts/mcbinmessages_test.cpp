@@ -155,7 +155,7 @@ TEST_F(McbinMessages, AMistypedCommandIsToldAsSuch)
     }
     EXPECT_NE(std::string::npos, Run("equal_frequency data.csv").err.find("did you mean 'equal-frequency'?"));
     EXPECT_NE(std::string::npos, Run("aplly b.json data.csv").err.find("did you mean 'apply'?"));
-    EXPECT_EQ("mcbin: no such command: 'data.csv'; there are supervised, equal-frequency, show, apply" + more,
+    EXPECT_EQ("mcbin: no such command: 'data.csv'; there are supervised, equal-frequency, show, evaluate, apply" + more,
               Run("data.csv").err);
 }
 

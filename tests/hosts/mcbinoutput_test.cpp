@@ -148,6 +148,7 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "attribute": "x",
       "target": "y",
       "status": {"code": 120017, "severity": "warning", "words": "no cut point separates the categories of the target well enough", "discrete": [0, 0, 0], "scale": [0, 0, 0]},
+      "edited": false,
       "distinct_values": 2,
       "weight": 2,
       "weight_with_missing": 5,

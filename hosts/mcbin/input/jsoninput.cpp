@@ -69,14 +69,14 @@ private:
 
 } // namespace
 
-Bins ReadJson(const std::string& path)
+Bins ReadJson(const std::string& path, Edits edits)
 {
     const std::string text = ReadAll(path);
     try
     {
         Handler handler(text);
         Json::sax_parse(text, &handler);
-        return ReadBins(handler.GetValue());
+        return ReadBins(handler.GetValue(), edits);
     }
     catch (const JsonFault& fault)
     {

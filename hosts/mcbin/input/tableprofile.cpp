@@ -54,9 +54,7 @@ void ProfileWeight(const TableReader& table, ColumnPlan& plan, std::size_t posit
         NoteText(column, field, line);
     if (plan.isBadMissing || std::isnan(weight) || column.IsMissing(weight))
         return;
-    throw table.MakeFailure(line, position,
-                            "the weight " + Quote(Shorten(field)) + (weight < 0.0 ? " is negative" : " is infinite") +
-                                "; --bad missing leaves such rows out");
+    throw table.MakeNotAWeight(line, position, field, weight);
 }
 
 void ProfileCategory(const TableReader& table, Column& column, std::size_t position, std::string_view field, long line)

@@ -101,3 +101,10 @@ Failure TableReader::MakeNotANumber(long line, std::size_t column, std::string_v
                    "with --bad missing for all such fields"
                  : " is not a number: it has " + Join(ornaments, " and ") + ", and numbers are written as in 1234.5"));
 }
+
+Failure TableReader::MakeNotAWeight(long line, std::size_t column, std::string_view field, double weight) const
+{
+    return MakeFailure(line, column,
+                       "the weight " + Quote(Shorten(field)) + (weight < 0.0 ? " is negative" : " is infinite") +
+                           "; --bad missing leaves such rows out");
+}

@@ -53,6 +53,9 @@ public:
     /// The failure of a field that should be a number.
     Failure MakeNotANumber(long line, std::size_t column, std::string_view field) const;
 
+    /// The failure of a number that is negative or infinite, and so no weight.
+    Failure MakeNotAWeight(long line, std::size_t column, std::string_view field, double weight) const;
+
 private:
     CsvReader fReader;
     std::string fHeader;

@@ -3,6 +3,7 @@
 #include "bins/numbers.h"
 #include "bins/rows.h"
 #include "bins/utf8.h"
+#include "hosts/mcbin/output/columns.h"
 #include "hosts/mcbin/output/describe.h"
 #include "hosts/mcbin/output/sharebar.h"
 #include "hosts/mcbin/text.h"
@@ -17,8 +18,6 @@
 
 namespace
 {
-
-using Rows = std::vector<std::vector<std::string>>;
 
 constexpr std::size_t kWidestBar = 30;
 constexpr std::size_t kNarrowestBar = 10;
@@ -146,24 +145,6 @@ std::vector<std::string> MakeInformationValues(const BinRow& total, std::size_t 
     if (codes.size() < total.evidenceByCategory.size())
         cells.emplace_back("-");
     return cells;
-}
-
-std::vector<std::size_t> GetWidths(const std::vector<std::vector<std::string>>& rows)
-{
-    std::vector<std::size_t> widths(rows.front().size());
-    for (const std::vector<std::string>& row : rows)
-    {
-        for (std::size_t i = 0; i < row.size(); ++i) widths[i] = std::max(widths[i], GetWidth(row[i]));
-    }
-    return widths;
-}
-
-/// The cells of a row in their columns: the first to the left, the others to the right.
-std::string Align(const std::vector<std::string>& row, const std::vector<std::size_t>& widths)
-{
-    std::string line = "  " + PadRight(row.front(), widths.front());
-    for (std::size_t i = 1; i < row.size(); ++i) line += "  " + PadLeft(row[i], widths[i]);
-    return line;
 }
 
 Rows MakeCells(const Content& content, const Extent& extent)

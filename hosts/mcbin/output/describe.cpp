@@ -1,5 +1,6 @@
 #include "hosts/mcbin/output/describe.h"
 
+#include "bins/evaluation.h"
 #include "bins/labels.h"
 #include "bins/numbers.h"
 #include "bins/text.h"
@@ -17,6 +18,12 @@ std::vector<std::size_t> FindHeaviest(const std::vector<double>& weights, std::s
     codes.resize(std::min(codes.size(), number));
     std::sort(codes.begin(), codes.end());
     return codes;
+}
+
+std::string MakeHeading(const AttributeBins& bins)
+{
+    const std::string name = Printable(bins.attribute->name);
+    return bins.target ? name + " by " + Printable(bins.target->name) : name;
 }
 
 std::vector<const AttributeBins*> FindUncut(const Bins& bins)
@@ -39,8 +46,27 @@ std::string DescribeValues(const AttributeBins& bins)
         return isCode ? Quote(Shorten(FormatCategory(attribute, static_cast<std::size_t>(*value))))
                       : FormatFigure(value);
     };
-    return std::to_string(bins.numDistinct) + (attribute.IsCategorical() ? " categories" : " distinct values") +
-           " from " + format(bins.minimum) + " to " + format(bins.maximum);
+    const std::string what = attribute.IsCategorical() ? "categories" : "distinct values";
+    const std::string number = bins.numDistinct ? std::to_string(*bins.numDistinct) + " " + what : "values";
+    return number + " from " + format(bins.minimum) + " to " + format(bins.maximum) + (bins.isEdited ? ", edited" : "");
+}
+
+std::vector<std::string> DescribeStrangers(const Evaluation& evaluation, std::size_t index)
+{
+    const AttributeBins& first = evaluation.GetFirst(index);
+    const Strangers& strangers = evaluation.strangers[index];
+    std::vector<std::string> descriptions;
+    const auto describe = [&](double weight, const char* where, const std::optional<double>& end)
+    {
+        if (weight > 0.0)
+        {
+            descriptions.push_back("weight of values " + (where + (" " + FormatValue(*end, *first.attribute))) +
+                                   ", which the bins were made without: " + FormatWeight(weight));
+        }
+    };
+    describe(strangers.below, "below", first.minimum);
+    describe(strangers.above, "above", first.maximum);
+    return descriptions;
 }
 
 std::string DescribeWithoutWeight(const Bins& bins)

@@ -6,13 +6,12 @@
 #include "bins/words.h"
 #include "hosts/mcbin/outcome.h"
 #include "hosts/mcbin/output/describe.h"
-#include "hosts/mcbin/output/pagestyle.h"
+#include "hosts/mcbin/output/page.h"
 #include "hosts/mcbin/output/svgchart.h"
 #include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
 
-#include <filesystem>
 #include <ostream>
 #include <string>
 #include <vector>
@@ -25,26 +24,15 @@ bool HasTarget(const Bins& bins)
     return bins.settings.method == Method::kSupervised;
 }
 
-std::string MakeHeading(const AttributeBins& bins)
-{
-    const std::string name = EscapeHtml(bins.attribute->name);
-    return bins.target ? name + " <small>by " + EscapeHtml(bins.target->name) + "</small>" : name;
-}
-
 std::string FormatMissing(const AttributeBins& bins)
 {
     return FormatWeight(bins.weightWithMissing - bins.weight);
 }
 
-/// Of a file: its name without the directories.
-std::string MakeTitle(const Bins& bins)
-{
-    return "Bins of " + EscapeHtml(std::filesystem::path(bins.dataName.value_or("")).filename().string());
-}
-
 void PrintTitle(std::ostream& os, const Bins& bins)
 {
-    os << "<h1>" << MakeTitle(bins) << "</h1>\n<p>"
+    BeginPage(os, "Bins of " + MakeDataTitle(bins));
+    os << "<p>"
        << (HasTarget(bins) ? "Cut where the categories of the target are separated best"
                            : "Cut into bins of about equal weight")
        << "; bins hold their " << (bins.settings.isRightClosed ? "right" : "left") << " border.";
@@ -55,7 +43,7 @@ void PrintTitle(std::ostream& os, const Bins& bins)
 
 void PrintOverviewRow(std::ostream& os, const AttributeBins& bins, bool hasTarget, std::size_t rank)
 {
-    os << "<tr><td><a href=\"#a" << rank << "\">" << MakeHeading(bins) << "</a></td>";
+    os << "<tr><td><a href=\"#a" << rank << "\">" << MakeHtmlHeading(bins) << "</a></td>";
     if (hasTarget)
     {
         const double gain = ComputeGain(bins).value_or(0.0);
@@ -68,7 +56,9 @@ void PrintOverviewRow(std::ostream& os, const AttributeBins& bins, bool hasTarge
         const std::optional<double> value = ComputeInformationValue(bins);
         os << "<td>" << (value ? fmt::format("{:.4f}", *value) : "") << "</td>";
     }
-    os << "<td>" << bins.bins.size() << "</td><td>" << bins.numDistinct
+    os << "<td>";
+    PrintSpark(os, bins);
+    os << "</td><td>" << bins.bins.size() << "</td><td>" << (bins.numDistinct ? std::to_string(*bins.numDistinct) : "")
        << fmt::format("</td><td>{:.1f}%</td></tr>\n",
                       100.0 * ComputeShare(bins.weightWithMissing - bins.weight, bins.weightWithMissing));
 }
@@ -79,7 +69,7 @@ void PrintOverview(std::ostream& os, const std::vector<const AttributeBins*>& re
         return;
     os << "<div class=\"scroll\"><table id=\"overview\">\n<tr><th>attribute</th>"
        << (hasTarget ? "<th>gain, bits</th><th>of the entropy</th><th>IV</th>" : "")
-       << "<th>bins</th><th>distinct</th><th>missing</th></tr>\n";
+       << "<th>by bin</th><th>bins</th><th>distinct</th><th>missing</th></tr>\n";
     for (std::size_t i = 0; i < results.size(); ++i) PrintOverviewRow(os, *results[i], hasTarget, i + 1);
     os << "</table></div>\n";
 }
@@ -174,7 +164,7 @@ void PrintFigures(std::ostream& os, const AttributeBins& bins)
 
 void PrintAttribute(std::ostream& os, const AttributeBins& bins, std::size_t rank)
 {
-    os << "<section id=\"a" << rank << "\">\n<h2>" << MakeHeading(bins) << "</h2>\n";
+    os << "<section id=\"a" << rank << "\">\n<h2>" << MakeHtmlHeading(bins) << "</h2>\n";
     PrintFigures(os, bins);
     PrintChart(os, bins);
     PrintBins(os, bins);
@@ -188,7 +178,7 @@ void PrintUncut(std::ostream& os, const Outcome& outcome)
     {
         os << "<h2>Without cut points</h2>\n<ul>\n";
         for (const AttributeBins* const result : uncut)
-            os << "<li>" << MakeHeading(*result) << ": " << EscapeHtml(DescribeStatus(result->status)) << "</li>\n";
+            os << "<li>" << MakeHtmlHeading(*result) << ": " << EscapeHtml(DescribeStatus(result->status)) << "</li>\n";
         os << "</ul>\n";
     }
     if (const std::string words = DescribeWithoutWeight(outcome.bins); !words.empty())
@@ -201,14 +191,10 @@ void PrintUncut(std::ostream& os, const Outcome& outcome)
 
 void PrintHtml(std::ostream& os, const Outcome& outcome)
 {
-    os << "<!DOCTYPE html>\n<html lang=\"en\">\n<head>\n<meta charset=\"utf-8\">\n"
-          "<meta name=\"viewport\" content=\"width=device-width, initial-scale=1\">\n"
-          "<meta name=\"color-scheme\" content=\"light dark\">\n<title>"
-       << MakeTitle(outcome.bins) << "</title>\n<style>" << kPageStyle << "</style>\n</head>\n<body>\n";
     PrintTitle(os, outcome.bins);
     const std::vector<const AttributeBins*> results = SortByGain(outcome.bins);
     PrintOverview(os, results, HasTarget(outcome.bins));
     for (std::size_t i = 0; i < results.size(); ++i) PrintAttribute(os, *results[i], i + 1);
     PrintUncut(os, outcome);
-    os << "</body>\n</html>\n";
+    EndPage(os);
 }

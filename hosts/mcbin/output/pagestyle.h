@@ -21,13 +21,19 @@ table { border-collapse: collapse; font-size: .9rem; font-variant-numeric: tabul
 th, td { padding: .25rem .7rem; text-align: right; white-space: nowrap; border-bottom: 1px solid var(--line); }
 th { color: var(--soft); font-weight: 600; }
 th:first-child, td:first-child { text-align: left; padding-left: 0; }
-.meter { position: relative; min-width: 7rem; }
+.meter { position: relative; min-width: 5rem; }
 .meter span { position: absolute; left: .3rem; top: 20%; height: 60%; max-width: calc(100% - .6rem); background: var(--meter);
   z-index: -1; border-radius: 2px; }
 svg { display: block; width: 100%; max-width: 40rem; height: auto; }
 svg text { fill: var(--soft); font: 11px system-ui, sans-serif; }
 svg .axis { stroke: var(--line); }
 svg .weight { fill: var(--bar); }
+svg .first { fill: var(--soft); } svg .second { fill: var(--c0); }
+svg polyline { fill: none; stroke-width: 1.5; } svg .curve { stroke: var(--c5); } svg circle.curve { fill: var(--c5); }
+svg polyline.first { stroke: var(--soft); } svg polyline.second { stroke: var(--c0); }
+svg.spark { display: inline-block; width: 4.5rem; height: 1.1rem; vertical-align: middle; }
+.flag { color: var(--c5); font-weight: 600; }
+td.flag { white-space: normal; text-align: left; }
 .key { display: flex; flex-wrap: wrap; gap: .1rem 1rem; margin: .3rem 0; padding: 0; list-style: none; font-size: .9rem; }
 .key i { display: inline-block; width: .8em; height: .8em; margin-right: .4em; border-radius: 2px; }
 .c0 { fill: var(--c0); background: var(--c0); } .c1 { fill: var(--c1); background: var(--c1); }
@@ -35,6 +41,7 @@ svg .weight { fill: var(--bar); }
 .c4 { fill: var(--c4); background: var(--c4); } .c5 { fill: var(--c5); background: var(--c5); }
 .c6 { fill: var(--c6); background: var(--c6); } .c7 { fill: var(--c7); background: var(--c7); }
 @media (max-width: 36rem) { th, td { padding: .25rem .4rem; font-size: .8rem; } .meter { min-width: 4.5rem; } }
+details { margin: .6rem 0; } summary { cursor: pointer; color: var(--soft); }
 @media print { section { break-inside: avoid; } }
 )";
 

@@ -3,11 +3,13 @@
 #include "bins/numbers.h"
 #include "bins/rows.h"
 #include "hosts/mcbin/output/describe.h"
+#include "hosts/mcbin/output/svg.h"
 #include "hosts/mcbin/text.h"
 
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <cmath>
 #include <ostream>
 #include <string>
 #include <vector>
@@ -18,7 +20,8 @@ namespace
 // Lengths in units of the picture, which is scaled to the width of the page or of a telephone.
 constexpr double kWidth = 480.0;
 constexpr double kLeft = 44.0;
-constexpr double kRight = 8.0;
+constexpr double kRight = 36.0; ///< room for the scale of the weights of evidence
+constexpr double kEvidenceMargin = 4.0;
 constexpr double kTop = 8.0;
 constexpr double kStackHeight = 150.0;
 constexpr double kGap = 10.0; ///< between the stacks and the weights
@@ -72,25 +75,6 @@ void PrintKey(std::ostream& os, const Variable& target, const std::vector<std::s
     os << "</ul>\n";
 }
 
-void PrintRectangle(std::ostream& os, const std::string& kind, double x, double y, double width, double height,
-                    const std::string& title)
-{
-    os << fmt::format("<rect class=\"{}\" x=\"{:.2f}\" y=\"{:.2f}\" width=\"{:.2f}\" height=\"{:.2f}\"><title>{}"
-                      "</title></rect>\n",
-                      kind, x, y, width, height, EscapeHtml(title));
-}
-
-void PrintText(std::ostream& os, double x, double y, const char* anchor, const std::string& text)
-{
-    os << fmt::format("<text x=\"{:.2f}\" y=\"{:.2f}\" text-anchor=\"{}\">{}</text>\n", x, y, anchor, EscapeHtml(text));
-}
-
-void PrintLine(std::ostream& os, double y)
-{
-    os << fmt::format("<line class=\"axis\" x1=\"{:.2f}\" y1=\"{:.2f}\" x2=\"{:.2f}\" y2=\"{:.2f}\"/>\n", kLeft, y,
-                      kWidth - kRight, y);
-}
-
 void PrintAxes(std::ostream& os, const Layout& layout, double heaviest)
 {
     if (layout.stackHeight > 0.0)
@@ -98,11 +82,11 @@ void PrintAxes(std::ostream& os, const Layout& layout, double heaviest)
         for (const int percent : {0, 50, 100})
         {
             const double y = kTop + layout.stackHeight * (1.0 - percent / 100.0);
-            PrintLine(os, y);
+            PrintAxis(os, kLeft, kWidth - kRight, y);
             PrintText(os, kLeft - 5.0, y + 4.0, "end", fmt::format("{}%", percent));
         }
     }
-    PrintLine(os, layout.weightTop + kWeightHeight);
+    PrintAxis(os, kLeft, kWidth - kRight, layout.weightTop + kWeightHeight);
     PrintText(os, kLeft - 5.0, layout.weightTop + 10.0, "end", fmt::format("{:.4g}", heaviest));
     PrintText(os, kLeft - 5.0, layout.weightTop + kWeightHeight + 2.0, "end", "0");
 }
@@ -122,6 +106,36 @@ void PrintStack(std::ostream& os, const Variable& target, const Bin& bin, const 
                        fmt::format("{}: {} {}, {:.1f}%", label, target.categories[i], FormatWeight(bin.weights[i]),
                                    100.0 * share));
     }
+}
+
+/// The weights of evidence as a line over the weights of the bins; its middle is 0.
+void PrintWeightsOfEvidence(std::ostream& os, const std::vector<Point>& middles, const std::vector<BinRow>& rows,
+                            const Layout& layout)
+{
+    double largest = 0.0;
+    for (const BinRow& row : rows)
+    {
+        const double size = row.evidence ? std::fabs(row.evidence->weightOfEvidence) : 0.0;
+        if (std::isfinite(size))
+            largest = std::max(largest, size);
+    }
+    if (largest == 0.0)
+        return;
+    const double middle = layout.weightTop + kWeightHeight / 2;
+    std::vector<Point> ofBins;
+    std::vector<Point> ofOthers;
+    for (std::size_t i = 0; i < rows.size(); ++i)
+    {
+        const double evidence = std::clamp(rows[i].evidence->weightOfEvidence, -largest, largest);
+        const double y = middle - evidence / largest * (kWeightHeight / 2 - kEvidenceMargin);
+        const std::string title =
+            fmt::format("{}: WoE {}", rows[i].label, FormatWeightOfEvidence(rows[i], *rows[i].evidence));
+        (rows[i].kind == BinRow::Kind::kBin ? ofBins : ofOthers).push_back({middles[i].x, y, title});
+    }
+    PrintCurve(os, "curve", ofBins);
+    for (const Point& point : ofOthers) PrintCurve(os, "curve", {point});
+    PrintText(os, kWidth - kRight + 3.0, middle - kWeightHeight / 2 + 10.0, "start", fmt::format("{:.2g}", largest));
+    PrintText(os, kWidth - kRight + 3.0, middle + kWeightHeight / 2 + 2.0, "start", fmt::format("{:.2g}", -largest));
 }
 
 /// The cut points under the borders of the bins, as many as have room.
@@ -157,6 +171,7 @@ void PrintChart(std::ostream& os, const AttributeBins& bins)
                       layout.height, EscapeHtml(bins.attribute->name));
     PrintAxes(os, layout, heaviest);
     double x = kLeft;
+    std::vector<Point> middles;
     for (const BinRow& row : rows)
     {
         const Bin& bin = row.bin;
@@ -170,8 +185,39 @@ void PrintChart(std::ostream& os, const AttributeBins& bins)
         const double height = kWeightHeight * ComputeShare(bin.weight, heaviest);
         PrintRectangle(os, "weight", x, layout.weightTop + kWeightHeight - height, layout.binWidth - 1.0, height,
                        fmt::format("{}: weight {}, {:.1f}%", row.label, FormatWeight(bin.weight), 100.0 * row.share));
+        middles.push_back({x + layout.binWidth / 2, 0.0, ""});
         x += layout.binWidth;
     }
+    if (rows.front().evidence)
+        PrintWeightsOfEvidence(os, middles, rows, layout);
     PrintCutPoints(os, bins, layout);
     os << "</svg>\n";
+}
+
+void PrintSpark(std::ostream& os, const AttributeBins& bins)
+{
+    constexpr double kSparkWidth = 72.0;
+    constexpr double kSparkHeight = 18.0;
+    constexpr double kMargin = 2.0;
+    std::vector<double> figures;
+    for (const BinRow& row : MakeRows(bins))
+    {
+        if (row.kind == BinRow::Kind::kBin)
+            figures.push_back(row.evidence ? row.evidence->rate : row.bin.weight);
+    }
+    const auto [least, largest] = std::minmax_element(figures.begin(), figures.end());
+    const double range = *largest > *least ? *largest - *least : 1.0;
+    const double step = (kSparkWidth - 2 * kMargin) / static_cast<double>(figures.size());
+    std::vector<Point> points;
+    for (std::size_t i = 0; i < figures.size(); ++i)
+    {
+        const double y = kSparkHeight - kMargin - (figures[i] - *least) / range * (kSparkHeight - 2 * kMargin);
+        const double x = kMargin + step * static_cast<double>(i);
+        points.push_back({x, y, ""}); // a step for each bin
+        points.push_back({x + step, y, ""});
+    }
+    os << fmt::format("<svg class=\"spark\" viewBox=\"0 0 {:.0f} {:.0f}\" role=\"img\" aria-label=\"from bin to bin\">",
+                      kSparkWidth, kSparkHeight);
+    PrintCurve(os, "curve", points);
+    os << "</svg>";
 }

@@ -20,12 +20,6 @@
 namespace
 {
 
-std::string MakeHeading(const AttributeBins& bins)
-{
-    const std::string name = Printable(bins.attribute->name);
-    return bins.target ? name + " by " + Printable(bins.target->name) : name;
-}
-
 void PrintHeading(std::ostream& os, const AttributeBins& bins, const Screen& screen)
 {
     const std::string heading = MakeHeading(bins);

@@ -1,0 +1,53 @@
+#ifndef MCOBNQRT_BINS_BINTALLY_H
+#define MCOBNQRT_BINS_BINTALLY_H
+
+#include "bins/binner.h"
+#include "bins/bins.h"
+
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+/// Of records that were counted in bins: what does not fit these bins.
+struct Strangers
+{
+    Bin unseen;                                ///< whose category the bins were made without; it has no borders
+    std::vector<std::string> unseenCategories; ///< the first few of these, as they came
+    double below = 0.0;                        ///< weight of the values below the least that the bins were made of
+    double above = 0.0;                        ///< weight of the values above the largest
+};
+
+/// Counts records in bins that are there already.
+class BinTally
+{
+public:
+    /// \param bins stays the caller's and outlives the object. Its weights are not looked at.
+    /// \param hasTarget whether the records have a category of the target of `bins`.
+    BinTally(const AttributeBins& bins, bool hasTarget);
+
+    /// Counts one record.
+    /// \param found where its value belongs.
+    /// \param code of its category; nothing if that is missing, or not known. Not looked at without a target.
+    /// \param weight above 0, and one of those whose sums are exact.
+    void Add(const Binner::Found& found, std::optional<std::size_t> code, double weight);
+
+    /// Tells of a category that the bins were made without. After some it does nothing.
+    void NameUnseen(std::string_view category);
+
+    /// The bins with what was counted.
+    AttributeBins GetBins() const;
+
+    const Strangers& GetStrangers() const { return fStrangers; }
+
+private:
+    void AddValue(double value, double weight);
+
+    const AttributeBins& fKnown;
+    AttributeBins fBins; ///< counted
+    Strangers fStrangers;
+    bool fHasTarget;
+};
+
+#endif
