@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <utility>
 
 namespace
 {
@@ -69,6 +70,17 @@ void AddUnseen(std::vector<EvaluationRow>& rows, const Bin& unseen, std::size_t 
 }
 
 } // namespace
+
+Evaluation BeginEvaluation(Bins first)
+{
+    Evaluation evaluation;
+    evaluation.second.componentVersion = first.componentVersion;
+    evaluation.second.settings = first.settings;
+    evaluation.second.missingTexts = first.missingTexts;
+    evaluation.second.variables = first.variables;
+    evaluation.first = std::move(first);
+    return evaluation;
+}
 
 std::vector<EvaluationRow> MakeRows(const Evaluation& evaluation, std::size_t index)
 {

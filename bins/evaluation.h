@@ -23,6 +23,9 @@ struct Evaluation
     const AttributeBins& GetSecond(std::size_t index) const { return second.results[index]; }
 };
 
+/// An evaluation in which nothing has been counted yet.
+Evaluation BeginEvaluation(Bins first);
+
 /// A row of a table of both populations.
 struct EvaluationRow
 {

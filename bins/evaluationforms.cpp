@@ -1,6 +1,7 @@
 #include "bins/csv.h"
 #include "bins/evaluation.h"
 #include "bins/json.h"
+#include "bins/jsonnames.h"
 #include "bins/jsonvalue.h"
 #include "bins/numbers.h"
 #include "bins/text.h"
@@ -16,22 +17,6 @@ using Object = JsonValue::Object;
 constexpr const char* kEvaluationSchema = "mcobnqrt-evaluation";
 constexpr int kEvaluationVersion = 1;
 
-const char* GetName(BinRow::Kind kind)
-{
-    switch (kind)
-    {
-    case BinRow::Kind::kBin:
-        return "bin";
-    case BinRow::Kind::kMissing:
-        return "missing";
-    case BinRow::Kind::kUnseen:
-        return "unseen";
-    case BinRow::Kind::kTotal:
-        return "total";
-    }
-    return "";
-}
-
 JsonValue MakeAttribute(const Evaluation& evaluation, std::size_t index)
 {
     const AttributeBins& bins = evaluation.GetFirst(index);
@@ -40,8 +25,9 @@ JsonValue MakeAttribute(const Evaluation& evaluation, std::size_t index)
     const std::vector<EvaluationRow> rows = MakeRows(evaluation, index);
     for (std::size_t i = 0; i + 1 < rows.size(); ++i)
     {
-        parts.push_back(Object{
-            {"row", GetName(rows[i].first.kind)}, {"label", rows[i].first.label}, {"stability", rows[i].stability}});
+        parts.push_back(Object{{"row", GetName(kRowNames, rows[i].first.kind)},
+                               {"label", rows[i].first.label},
+                               {"stability", rows[i].stability}});
     }
     return Object{{"attribute", bins.attribute->name},
                   {"target", bins.target ? JsonValue(bins.target->name) : JsonValue()},
@@ -95,7 +81,7 @@ std::string ToCsv(const Evaluation& evaluation)
         for (std::size_t j = 0; j < rows.size(); ++j)
         {
             const BinRow::Kind kind = rows[j].second.kind;
-            const std::string number = kind == BinRow::Kind::kBin ? std::to_string(j) : GetName(kind);
+            const std::string number = kind == BinRow::Kind::kBin ? std::to_string(j) : GetName(kRowNames, kind);
             std::vector<std::string> fields{bins.attribute->name, bins.target ? bins.target->name : "", number,
                                             rows[j].first.label};
             AppendPopulation(fields, rows[j].first);

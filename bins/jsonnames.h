@@ -2,6 +2,7 @@
 #define MCOBNQRT_BINS_JSONNAMES_H
 
 #include "bins/bins.h"
+#include "bins/rows.h"
 
 #include <utility>
 
@@ -25,6 +26,11 @@ inline constexpr Names<VariableRole, 3> kRoleNames = {
 
 inline constexpr Names<ValueKind, 3> kValueKindNames = {
     {"boolean", ValueKind::kBoolean}, {"date", ValueKind::kDate}, {"timestamp", ValueKind::kTimestamp}};
+
+inline constexpr Names<BinRow::Kind, 4> kRowNames = {{"bin", BinRow::Kind::kBin},
+                                                     {"missing", BinRow::Kind::kMissing},
+                                                     {"unseen", BinRow::Kind::kUnseen},
+                                                     {"total", BinRow::Kind::kTotal}};
 
 /// Whether numbers of distinct values are exact.
 inline constexpr Names<bool, 2> kDistinctNames = {{"exact", true}, {"approximate", false}};

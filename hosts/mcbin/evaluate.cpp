@@ -72,7 +72,7 @@ public:
     Evaluator(TableReader& table, Bins first, const EvaluateOptions& options)
         : fTable(table), fOptions(options), fMissingTexts(first.missingTexts)
     {
-        fEvaluated.evaluation.first = std::move(first);
+        fEvaluated.evaluation = BeginEvaluation(std::move(first));
         const std::vector<std::string>& further = options.columns.missingText;
         fMissingTexts.insert(fMissingTexts.end(), further.begin(), further.end());
         for (std::size_t i = 0; i < GetFirst().results.size(); ++i)
@@ -134,34 +134,39 @@ private:
         return column;
     }
 
-    /// Adds the weight to the variables of the second population, if it has one.
+    /// Tells the variables of the second population what its weight is, if it has one.
     RowWeights MakeWeights(Progress& progress)
     {
-        const std::string& wanted = fOptions.columns.weight;
-        Variable weight;
-        weight.kind = VariableKind::kWeight;
-        weight.role = VariableRole::kWeight;
-        weight.rounding = fOptions.columns.rounding;
-        for (const std::shared_ptr<const Variable>& variable : GetFirst().variables)
-        {
-            if (variable->role == VariableRole::kWeight)
-                weight = *variable;
-            else
-                GetSecond().variables.push_back(variable);
-        }
-        if (!wanted.empty())
-            weight.name = wanted;
-        else if (!weight.name.empty() && !HasColumn(fTable, weight.name))
+        std::vector<std::shared_ptr<const Variable>>& variables = GetSecond().variables;
+        auto position = std::find_if(variables.begin(), variables.end(),
+                                     [](const auto& variable) { return variable->role == VariableRole::kWeight; });
+        if (position == variables.end() && fOptions.columns.weight.empty())
+            return {};
+        if (position == variables.end())
+            position = variables.insert(position, MakeUnknownWeight());
+        Variable weight = **position;
+        if (!fOptions.columns.weight.empty())
+            weight.name = fOptions.columns.weight;
+        else if (!HasColumn(fTable, weight.name))
         {
             fEvaluated.notes.push_back("there is no column " + Quote(weight.name) +
                                        ", the weight of the bins, so each row weighs 1");
-            weight.name.clear();
-        }
-        if (weight.name.empty())
+            variables.erase(position);
             return {};
-        GetSecond().variables.push_back(std::make_shared<const Variable>(weight));
+        }
+        *position = std::make_shared<const Variable>(weight);
         GetSecond().numRecordsWithoutWeight = 0;
         return {fTable, weight, fMissingTexts, fOptions.columns.isBadMissing, progress};
+    }
+
+    /// Of bins that had none.
+    std::shared_ptr<const Variable> MakeUnknownWeight() const
+    {
+        auto weight = std::make_shared<Variable>();
+        weight->kind = VariableKind::kWeight;
+        weight->role = VariableRole::kWeight;
+        weight->rounding = fOptions.columns.rounding;
+        return weight;
     }
 
     void CountRow(const CsvRow& row, double weight)
@@ -199,8 +204,6 @@ private:
     void Collect(const RowWeights& weights)
     {
         Bins& second = GetSecond();
-        second.componentVersion = GetFirst().componentVersion;
-        second.settings = GetFirst().settings;
         second.missingTexts = fMissingTexts;
         second.dataName = fTable.GetName();
         second.numRecords = fNumRecords;

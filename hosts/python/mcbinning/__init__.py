@@ -24,6 +24,7 @@ from ._errors import (
     SingleValueWarning,
     StreamError,
 )
+from ._evaluation import AttributeEvaluation, Evaluation
 from ._features import require as _require
 from ._functions import equal_frequency_bins, supervised_bins
 from ._result import BinningResult
@@ -35,12 +36,14 @@ if _TYPE_CHECKING:
 
 __all__ = [
     "AttributeBins",
+    "AttributeEvaluation",
     "BadBinTableWarning",
     "BinningError",
     "BinningResult",
     "BinningWarning",
     "DataError",
     "EqualFrequencyBinner",
+    "Evaluation",
     "NoCutPointsWarning",
     "NoValidValuesWarning",
     "NotBinnedWarning",

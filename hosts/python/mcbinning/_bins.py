@@ -20,6 +20,8 @@ if TYPE_CHECKING:
     import matplotlib.axes
     import pandas as pd
 
+    from ._result import BinningResult
+
 
 @dataclass(frozen=True)
 class Variable:
@@ -95,8 +97,9 @@ class Missing:
 class AttributeBins:
     """The bins of one attribute, against one target or none."""
 
-    def __init__(self, core: _core.AttributeBins) -> None:
+    def __init__(self, core: _core.AttributeBins, result: BinningResult | None = None) -> None:
         self._core = core
+        self._result = result
         self.variable = Variable.from_core(core.variable)
         self.target = None if core.target is None else Variable.from_core(core.target)
         self.status = Status.from_core(core.status)
@@ -108,6 +111,7 @@ class AttributeBins:
         self.target_weights = core.target_weights
         """By bin and category of the target."""
         self.n_distinct = core.n_distinct
+        """None where records were only counted in bins that were there."""
         self.weight = core.weight
         """Of the records with a valid value, and a valid target if there is one."""
         self.weight_with_missing = core.weight_with_missing
@@ -134,9 +138,12 @@ class AttributeBins:
         self.smoothing = core.smoothing
         """What is added to both weights of a bin, for its weight of evidence, where one of them is 0."""
         self.missing = Missing.of_rows(core.rows)
+        self.edited = core.edited
+        """Whether a person has changed the bins after they were found."""
 
     def __reduce__(self) -> tuple[Any, ...]:
-        return _restore_bins, (self._core.alone().to_json(),)
+        restore = _restore_bins if self._result is None else type(self._result).restore_alone
+        return restore, (self._core.alone().to_json(),)
 
     @property
     def attribute(self) -> str:
@@ -193,7 +200,7 @@ class AttributeBins:
         elif self.target is not None and rows and rows[0][8]:
             for i, figure in enumerate(("rate", "woe", "iv")):
                 for code, name in enumerate(self.target.category_names()):
-                    columns[f"{figure}[{name}]"] = [row[8][code][i] if row[8][code] else np.nan for row in rows]
+                    columns[f"{figure}[{name}]"] = [(row[8][code] or (np.nan,) * 3)[i] for row in rows]
         frame: pd.DataFrame = pandas.DataFrame(columns)
         return frame
 
@@ -201,6 +208,120 @@ class AttributeBins:
         """The bin of each value, from 0; one past the last bin for a NaN. A value outside the range seen falls into an
         outer bin. Of a categorical attribute the values are codes."""
         return _values.bin_numbers(values, self.cut_points, self.closed)
+
+    def merge(self, first: int, last: int) -> BinningResult:
+        """Joins neighbouring bins. Their weights are added, so that no data are needed.
+
+        Parameters
+        ----------
+        first : int
+            The number of the first bin that is joined, from 0.
+        last : int
+            The number of the last one.
+
+        Returns
+        -------
+        BinningResult
+            The whole result, with these bins joined.
+
+        Raises
+        ------
+        ValueError
+            There are no such bins.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=4)
+        >>> bins["income"].merge(1, 2)["income"].labels
+        ['(-inf, 24.5]', '(24.5, 74.5]', '(74.5, +inf)']
+        """
+        result, index = self._find()
+        if first < 0:
+            raise ValueError(f"bins have numbers from 0, so {first} is none")
+        return type(result)(result._core.merge(index, first, last), result.left_out)
+
+    def split(self, at: float, data: Any) -> BinningResult:
+        """Cuts a bin in two.
+
+        Parameters
+        ----------
+        at : float
+            The new cut point.
+        data : table, stream, path or list of paths
+            What is counted on its sides, as `BinningResult.evaluate` takes it.
+
+        Returns
+        -------
+        BinningResult
+            The whole result, with this cut point.
+
+        Raises
+        ------
+        ValueError
+            There is such a cut point already.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> people = pd.DataFrame({"income": range(100)})
+        >>> bins = mb.equal_frequency_bins(people, n_bins=2)
+        >>> bins["income"].split(10, people)["income"].weights.tolist()
+        [11.0, 39.0, 50.0]
+        """
+        cuts = self.cut_points.tolist()
+        if at in cuts:
+            raise ValueError(f"{at} is a cut point already")
+        return self._recut(sorted([*cuts, at]), data)
+
+    def move(self, cut: float, to: float, data: Any) -> BinningResult:
+        """Puts another cut point in the place of one.
+
+        Parameters
+        ----------
+        cut : float
+            One of the cut points.
+        to : float
+            The new one, between its neighbours.
+        data : table, stream, path or list of paths
+            What is counted on its sides, as `BinningResult.evaluate` takes it.
+
+        Returns
+        -------
+        BinningResult
+            The whole result, with this cut point.
+
+        Raises
+        ------
+        ValueError
+            There is no such cut point, or the new one is not between its neighbours.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> people = pd.DataFrame({"income": range(100)})
+        >>> bins = mb.equal_frequency_bins(people, n_bins=2)
+        >>> bins["income"].move(49.5, 60, people)["income"].weights.tolist()
+        [61.0, 39.0]
+        """
+        cuts = self.cut_points.tolist()
+        if cut not in cuts:
+            raise ValueError(f"{cut} is no cut point; there are {cuts}")
+        cuts[cuts.index(cut)] = to
+        return self._recut(cuts, data)
+
+    def _recut(self, cuts: list[float], data: Any) -> BinningResult:
+        result, index = self._find()
+        return result.with_cuts({list(result)[index]: cuts}, data)
+
+    def _find(self) -> tuple[BinningResult, int]:
+        """The result that these bins belong to, and their index in it."""
+        if self._result is None:
+            raise ValueError("these bins belong to no result that could be changed")
+        return self._result, next(index for index, found in enumerate(self._result.bins) if found is self)
 
     def plot(self, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
         """The share of each category of the target, bin by bin; a bin is as wide as its weight."""

@@ -10,6 +10,7 @@ _Floats = npt.NDArray[np.float64]
 __version__: str
 
 _Evidence = tuple[float, float, float]
+_Row = tuple[str, str, float, float, float, float, list[float], _Evidence | None, list[_Evidence | None]]
 _Status = tuple[int, str, tuple[int, int, int], tuple[float, float, float]]
 
 def temp_directory(named: str) -> str: ...
@@ -56,7 +57,7 @@ class AttributeBins:
     labels: list[str]
     weights: _Floats
     target_weights: _Floats | None
-    n_distinct: int
+    n_distinct: int | None
     weight: float
     weight_with_missing: float
     minimum: float
@@ -69,10 +70,9 @@ class AttributeBins:
     iv: _Floats | None
     information_value: float
     smoothing: float
+    edited: bool
     information_values: list[float]
-    rows: list[
-        tuple[str, str, float, float, float, float, list[float], _Evidence | None, list[_Evidence | None]]
-    ]
+    rows: list[_Row]
     """Of each bin, the missing if they have weight, and the total: "bin", "missing" or "total", the label, the borders,
     the weight and its share of the total, the weight in each category of the target, and rate, weight of evidence and
     information value, which a target of more than two categories has for each of them."""
@@ -117,11 +117,29 @@ class Bins:
         """Adds what a run of one attribute has found, with the indices that it and its target, or -1, have here."""
     def select(self, indices: list[int]) -> Bins:
         """With some of the results alone, in the order of the indices."""
+    def merge(self, index: int, first: int, last: int) -> Bins: ...
+    def recut(self, index: int, cut_points: list[float]) -> Bins:
+        """With other cut points of one result; without weights there unless they are a part of those it has."""
+    def replace(self, index: int, other: Bins, other_index: int) -> Bins: ...
     def columns(self, taken: list[str]) -> list[tuple[int, str]]:
         """Of each column of bins the index of its result, and its name."""
     def to_json(self) -> str: ...
     def to_csv(self) -> str: ...
     def to_sql(self, duckdb: bool, labels: bool) -> str: ...
+
+class Evaluation:
+    first: Bins
+    second: Bins
+    indices: list[int]
+    weight_of_unseen_targets: float
+
+    def rows(self, index: int) -> list[tuple[_Row, _Row, float | None]]: ...
+    def flags(self, index: int) -> list[str]: ...
+    def outside(self, index: int) -> tuple[float, float]:
+        """The weights of values below and above those that the bins were made of."""
+    def unseen(self, index: int) -> tuple[float, list[str]]: ...
+    def to_json(self) -> str: ...
+    def to_csv(self) -> str: ...
 
 class Feed:
     def __init__(self, table: Table | None) -> None: ...
@@ -133,7 +151,8 @@ class Feed:
         column: int = -1,
         array: npt.NDArray[Any] | None = None,
         rounding: str = "none",
-    ) -> None: ...
+    ) -> int:
+        """The index of the field."""
     def declare_missing(
         self, index: int, values: list[float], interval: tuple[float, float] | None, texts: list[str]
     ) -> None: ...
@@ -145,6 +164,8 @@ class Feed:
     def set_weights(self, weights: tuple[int, float]) -> None: ...
     def read(self, max_rows: int) -> list[_Floats]: ...
     def spool(self, directory: str) -> None: ...
+    def count(self, first: Bins, counted: list[tuple[int, int, int | None]], data_name: str | None) -> Evaluation:
+        """Counts all records; `counted` are indices of results, of the field of each, and of its target's."""
     def describe(
         self,
         *,

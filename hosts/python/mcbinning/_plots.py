@@ -13,6 +13,7 @@ if TYPE_CHECKING:
     import matplotlib.figure
 
     from ._bins import AttributeBins
+    from ._evaluation import AttributeEvaluation
     from ._result import BinningResult
 
 
@@ -84,3 +85,26 @@ def _title(found: AttributeBins) -> str:
         return found.attribute
     gain = round(found.gain, 4) + 0.0  # without a minus in front of what is nothing
     return f"{found.attribute}: gain {gain:.4f} bits"
+
+
+def plot_evaluation(evaluation: AttributeEvaluation, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
+    plt = require("matplotlib.pyplot", "plots", "plot")
+
+    if ax is None:
+        ax = plt.subplots(layout="constrained")[1]
+    frame = evaluation.to_pandas().iloc[:-1]
+    positions = np.arange(len(frame))
+    rates = [name for name in ("first_rate", "second_rate") if name in frame]
+    lines = ax.twinx() if rates else None
+    for offset, colour, name, label in ((-0.2, "0.6", "first", "then"), (0.2, "C0", "second", "now")):
+        ax.bar(positions + offset, frame[f"{name}_share"], 0.4, color=colour, label=label)
+        if lines is not None and f"{name}_rate" in rates:
+            lines.plot(positions, frame[f"{name}_rate"].astype(float), "o-", color=colour, markeredgecolor="white")
+    if lines is not None:
+        lines.set_ylim(bottom=0.0)
+        lines.set_ylabel("rate")
+    ax.set_xticks(positions, frame["interval"], rotation=45, ha="right")
+    ax.set_ylabel("share of the weight")
+    ax.set_title(f"{evaluation.attribute}: stability index {evaluation.stability:.4f}", fontsize="medium")
+    ax.legend(fontsize="small")
+    return ax

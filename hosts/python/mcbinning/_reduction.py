@@ -263,7 +263,7 @@ class _Reducer:
         groups = dealt.groups.rename_columns([*names, ""])
         feed = self._make_feed(groups.schema, iter(groups.to_batches()), attribute, target)
         bins = self._bin(feed, target, replace(settings, max_distinct=None if target is None else 1))
-        n_distinct = [max(found.n_distinct + dealt.n_untold, 0) for found in bins.results]
+        n_distinct = [max((found.n_distinct or 0) + dealt.n_untold, 0) for found in bins.results]
         return _Part(bins, groups.num_rows, *n_distinct)
 
     def _bin(self, feed: _core.Feed, target: str | None, settings: RunSettings) -> _core.Bins:

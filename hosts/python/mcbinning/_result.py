@@ -3,7 +3,7 @@
 from __future__ import annotations
 
 import os
-from collections.abc import Iterator, Mapping
+from collections.abc import Iterator, Mapping, Sequence
 from dataclasses import dataclass
 from typing import TYPE_CHECKING, Any, cast
 
@@ -22,6 +22,8 @@ if TYPE_CHECKING:
     import matplotlib.figure
     import pandas as pd
     import pyarrow as pa
+
+    from ._evaluation import Evaluation
 
 
 @dataclass(frozen=True)
@@ -66,7 +68,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         )
         self.variables = tuple(map(Variable.from_core, core.variables))
         self.status = Status.from_core(core.status)
-        self.bins = tuple(map(AttributeBins, core.results))
+        self.bins = tuple(AttributeBins(found, self) for found in core.results)
         self.left_out = dict(left_out or {})
         """What each column holds that was not named, and is not of a kind that is binned unless it is, such as text."""
         self.data_name = core.data_name
@@ -80,6 +82,11 @@ class BinningResult(Mapping[Any, AttributeBins]):
 
     def __reduce__(self) -> tuple[Any, ...]:
         return _restore, (self.to_json(), self.left_out)
+
+    @classmethod
+    def restore_alone(cls, text: str) -> AttributeBins:
+        """The bins of a pickle, as the only ones of a result."""
+        return cls(read_bins(text)).bins[0]
 
     @property
     def weight_grid(self) -> float | None:
@@ -235,7 +242,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         >>> mb.BinningResult.from_json(bins.to_json())["income"].labels
         ['(-inf, 49.5]', '(49.5, +inf)']
         """
-        return _write(self._core.to_json(), path)
+        return write_text(self._core.to_json(), path)
 
     def to_csv(self, path: str | os.PathLike[str] | None = None) -> str:
         """Writes a row for each bin as CSV, as `mcbin --format csv` does.
@@ -258,7 +265,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         >>> len(bins.to_csv().splitlines())
         3
         """
-        return _write(self._core.to_csv(), path)
+        return write_text(self._core.to_csv(), path)
 
     @classmethod
     def from_json(cls, source: str | os.PathLike[str]) -> BinningResult:
@@ -374,6 +381,119 @@ class BinningResult(Mapping[Any, AttributeBins]):
 
         return transform(self, self._core.columns, data, labels, unseen, memory_limit)
 
+    def evaluate(
+        self,
+        data: Any,
+        target: Any = None,
+        weight: Any = None,
+        *,
+        memory_limit: MemoryLimit | None = None,
+        temp_dir: str | os.PathLike[str] | None = None,
+    ) -> Evaluation:
+        """Counts other data in these bins, and tells how far their population has moved.
+
+        Parameters
+        ----------
+        data : table, stream, path or list of paths
+            As `supervised_bins` takes them, with the columns of all attributes. Any number of records.
+        target : str, default=None
+            The column of the target. None: that of the name which it had, or none where the data lack it; there are no
+            rates then.
+        weight : str, default=None
+            The column of the weight. None: that of the name which it had.
+        memory_limit : int or str, default=None
+            The most memory that the reading of a file may take, as in `supervised_bins`.
+        temp_dir : path, default=None
+            The directory of the temporary file that weighted data go through which can be read only once.
+
+        Returns
+        -------
+        Evaluation
+            A mapping with the keys of the result. The data that the bins were made of give these again, to the last
+            bit.
+
+        Raises
+        ------
+        DataError
+            A column is missing or of another type; `column` and `row` tell where.
+
+        Warns
+        -----
+        UserWarning
+            The data lack the weight that the bins had.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> bins = mb.equal_frequency_bins(pd.DataFrame({"income": range(100)}), n_bins=2)
+        >>> evaluation = bins.evaluate(pd.DataFrame({"income": [12, 17, 70, 190]}))
+        >>> evaluation["income"].second.weights.tolist(), evaluation["income"].weight_above
+        ([2.0, 2.0], 1.0)
+        >>> evaluation["income"].stability
+        0.0
+        """
+        from ._counting import count
+        from ._evaluation import Evaluation
+
+        chosen = [index for index, found in enumerate(self.bins) if found.n_bins]
+        return Evaluation(count(self, chosen, data, target, weight, memory_limit, temp_dir))
+
+    def with_cuts(self, cuts: Mapping[Any, Sequence[float]], data: Any = None) -> BinningResult:
+        """Bins between cut points of a person's choice.
+
+        Parameters
+        ----------
+        cuts : dict
+            By attribute, or pair of attribute and target: all cut points, which rise. Dates are days and timestamps
+            microseconds since 1970; between categories they are codes.
+        data : table, stream, path or list of paths, default=None
+            Where there are new cut points, what is counted between them, as `evaluate` takes it. None: all cut points
+            are among those that there are, so that bins are only joined.
+
+        Returns
+        -------
+        BinningResult
+            With the other attributes as they were. Those that were changed are `edited`.
+
+        Raises
+        ------
+        KeyError
+            There is no such attribute.
+        TypeError
+            There are new cut points, and no data.
+        ValueError
+            Cut points do not rise.
+
+        Examples
+        --------
+        >>> import mcbinning as mb
+        >>> import pandas as pd
+        >>> people = pd.DataFrame({"income": range(100)})
+        >>> bins = mb.equal_frequency_bins(people, n_bins=4)
+        >>> bins.with_cuts({"income": [20, 60]}, people)["income"].weights.tolist()
+        [21.0, 40.0, 39.0]
+        >>> bins.with_cuts({"income": [49.5]})["income"].weights.tolist()
+        [50.0, 50.0]
+        """
+        core, uncounted = self._core, []
+        for key, cut_points in cuts.items():
+            index = next(i for i, found in enumerate(self.bins) if found is self[key])
+            wanted = [float(cut_point) for cut_point in cut_points]
+            core = core.recut(index, wanted)
+            if not set(wanted) <= set(self.bins[index].cut_points.tolist()):
+                uncounted.append(index)
+        if not uncounted:
+            return BinningResult(core, self.left_out)
+        if data is None:
+            raise TypeError("what lies between new cut points has to be counted, so data must be given")
+        from ._counting import count
+
+        counted = count(BinningResult(core), uncounted, data).second
+        for number, index in enumerate(uncounted):
+            core = core.replace(index, counted, number)
+        return BinningResult(core, self.left_out)
+
     def plot(self, attribute: Any = None, ax: matplotlib.axes.Axes | None = None) -> matplotlib.axes.Axes:
         """Draws one attribute; the one of the largest gain if none is named."""
         return (self.by_gain()[0] if attribute is None else self[attribute]).plot(ax)
@@ -407,7 +527,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         return f"{len(self)} results" + (f", {len(self.left_out)} columns left out" if self.left_out else "")
 
 
-def _write(text: str, path: str | os.PathLike[str] | None) -> str:
+def write_text(text: str, path: str | os.PathLike[str] | None) -> str:
     if path is not None:
         with open(path, "w", encoding="utf-8", newline="") as file:
             file.write(text)

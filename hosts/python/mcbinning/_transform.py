@@ -63,22 +63,27 @@ def open_values(
     names = [variable.name for variable in variables]
     check_names(source, names)
     table = source.open(names)
-    columns = columns_of(table)
-    positions = [column.name for column in columns]
     feed = _core.Feed(table)
-    for index, variable in enumerate(variables):
-        position = positions.index(variable.name)
-        feed.add_field(variable.name, "category" if variable.is_categorical else "attribute", column=position)
-        values = list(variable.missing_values)
-        if columns[position].kind == "text":
-            feed.declare_missing(index, [], None, [*map(str, values), *missing_text])
-        else:
-            feed.declare_missing(index, _as_numbers(values, variable), variable.missing_interval, [])
-        if variable.categories is not None:
-            feed.set_categories(
-                index, _as_in_column(list(variable.categories), variable, columns[position].kind), unseen
-            )
+    for variable in variables:
+        add_variable(feed, table, variable, variable.name, missing_text, unseen)
     return feed
+
+
+def add_variable(
+    feed: _core.Feed, table: _core.Table, variable: Variable, name: str, missing_text: Sequence[str], unseen: str
+) -> None:
+    """Adds a field with the values of a variable, which are in the table's column of this name."""
+    columns = columns_of(table)
+    position = [column.name for column in columns].index(name)
+    use = "weight" if variable.role == "weight" else "category" if variable.is_categorical else "attribute"
+    index = feed.add_field(name, use, column=position, rounding=variable.rounding or "none")
+    values = list(variable.missing_values)
+    if columns[position].kind == "text":
+        feed.declare_missing(index, [], None, [*map(str, values), *missing_text])
+    else:
+        feed.declare_missing(index, _as_numbers(values, variable), variable.missing_interval, [])
+    if variable.categories is not None:
+        feed.set_categories(index, _as_in_column(list(variable.categories), variable, columns[position].kind), unseen)
 
 
 def _as_in_column(categories: list[Any], variable: Variable, kind: str) -> list[Any]:

@@ -2,6 +2,7 @@
 
 #include "bins/bins.h"
 #include "bins/csv.h"
+#include "bins/edit.h"
 #include "bins/gather.h"
 #include "bins/json.h"
 #include "bins/jsonbuilder.h"
@@ -15,6 +16,7 @@
 #include "bins/sql.h"
 #include "bins/words.h"
 #include "hosts/python/src/arrays.h"
+#include "hosts/python/src/rowtuples.h"
 
 #include <nanobind/ndarray.h>
 #include <nanobind/stl/optional.h>
@@ -98,14 +100,6 @@ nb::object GetTargetWeights(const AttributeBins& bins)
     return ToArray(std::move(flat), std::max<std::size_t>(bins.target->categories.size(), 1));
 }
 
-/// Rate, weight of evidence and information value, or None.
-nb::object ToTuple(const std::optional<Evidence>& evidence)
-{
-    if (!evidence)
-        return nb::none();
-    return nb::make_tuple(evidence->rate, evidence->weightOfEvidence, evidence->informationValue);
-}
-
 /// Of the event, or of the only one that there can be; None where there is no evidence.
 nb::object GetEvidence(const AttributeBins& bins, double Evidence::*figure)
 {
@@ -126,20 +120,10 @@ std::vector<double> GetInformationValues(const AttributeBins& bins)
     return values;
 }
 
-/// Of each row of the table a tuple: what it is, its label, its borders, its weight, its share, its weight in each
-/// category, its evidence, or None, and its evidence by category of a target of more than two.
 nb::list GetRows(const AttributeBins& bins)
 {
-    static constexpr std::pair<const char*, BinRow::Kind> kKinds[] = {
-        {"bin", BinRow::Kind::kBin}, {"missing", BinRow::Kind::kMissing}, {"total", BinRow::Kind::kTotal}};
     nb::list rows;
-    for (const BinRow& row : MakeRows(bins))
-    {
-        nb::list byCategory;
-        for (const std::optional<Evidence>& evidence : row.evidenceByCategory) byCategory.append(ToTuple(evidence));
-        rows.append(nb::make_tuple(GetName(kKinds, row.kind), row.label, row.bin.left, row.bin.right, row.bin.weight,
-                                   row.share, row.bin.weights, ToTuple(row.evidence), byCategory));
-    }
+    for (const BinRow& row : MakeRows(bins)) rows.append(ToTuple(row));
     return rows;
 }
 
@@ -274,6 +258,7 @@ void BindAttributeBins(nb::module_& module)
         .def_prop_ro("iv", [](Self self) { return GetEvidence(self, &Evidence::informationValue); })
         .def_prop_ro("rows", &GetRows)
         .def_ro("smoothing", &AttributeBins::smoothing)
+        .def_ro("edited", &AttributeBins::isEdited)
         .def_prop_ro("information_value", [](Self self) { return ToNumber(ComputeInformationValue(self)); })
         .def_prop_ro("information_values", &GetInformationValues)
         .def("find_bin", [](Self self, double value) { return FindBin(self.cutPoints, self.isRightClosed, value); })
@@ -292,6 +277,27 @@ Bins SelectResults(const Bins& bins, const std::vector<std::size_t>& indices)
     for (const std::size_t index : indices)
         selected.reduction->numGroups.push_back(bins.reduction->numGroups.at(index));
     return selected;
+}
+
+Bins MergeResult(const Bins& bins, std::size_t index, std::size_t first, std::size_t last)
+{
+    return ReplaceResult(bins, index, MergeBins(bins.results.at(index), first, last));
+}
+
+/// Cut points that are a part of those there join bins, and keep their weights; others leave bins without weight.
+Bins RecutResult(const Bins& bins, std::size_t index, const std::vector<double>& cutPoints)
+{
+    const AttributeBins& known = bins.results.at(index);
+    std::vector<std::size_t> kept;
+    for (const double cutPoint : cutPoints)
+    {
+        const auto found = std::find(known.cutPoints.begin(), known.cutPoints.end(), cutPoint);
+        if (found != known.cutPoints.end())
+            kept.push_back(static_cast<std::size_t>(found - known.cutPoints.begin()));
+    }
+    const AttributeBins recut = Recut(known, cutPoints); // refuses what is no list of cut points
+    const bool isJoined = kept.size() == cutPoints.size() && known.HasBins();
+    return ReplaceResult(bins, index, isJoined ? JoinBins(known, kept) : recut);
 }
 
 void BindReduction(nb::module_& module)
@@ -336,6 +342,13 @@ void BindBins(nb::module_& module)
         .def("set_weight_grid", &SetWeightGrid, "step"_a.none())
         .def("add_part", &AddPart, "part"_a, "attribute"_a, "target"_a, "n_distinct"_a.none() = nb::none())
         .def("select", &SelectResults, "indices"_a)
+        .def("merge", &MergeResult, "index"_a, "first"_a, "last"_a)
+        .def("recut", &RecutResult, "index"_a, "cut_points"_a)
+        .def(
+            "replace",
+            [](Self self, std::size_t index, Self other, std::size_t otherIndex)
+            { return ReplaceResult(self, index, other.results.at(otherIndex)); },
+            "index"_a, "other"_a, "other_index"_a)
         .def("columns", &GetBinColumns, "taken"_a)
         .def("to_json", &ToJson)
         .def("to_csv", &ToCsv)

@@ -62,6 +62,8 @@ Field::Unseen UnseenOf(const std::string& unseen)
         return Field::Unseen::kError;
     if (unseen == "missing")
         return Field::Unseen::kMissing;
+    if (unseen == "kept")
+        return Field::Unseen::kKept;
     throw nb::value_error("no such treatment of unseen categories");
 }
 
@@ -128,8 +130,8 @@ WeightTally Tally(BlockSource& source, const std::vector<Field>& fields)
 
 } // namespace
 
-void Feed::AddField(const std::string& name, const std::string& use, int column, const std::optional<Array>& array,
-                    const std::string& rounding)
+std::size_t Feed::AddField(const std::string& name, const std::string& use, int column,
+                           const std::optional<Array>& array, const std::string& rounding)
 {
     Field field;
     field.name = name;
@@ -146,6 +148,7 @@ void Feed::AddField(const std::string& name, const std::string& use, int column,
     }
     fFields.push_back(std::move(field));
     fArrays.push_back(array);
+    return fFields.size() - 1;
 }
 
 void Feed::DeclareMissing(std::size_t index, const std::vector<double>& values,
@@ -268,6 +271,24 @@ Bins Feed::Bin(const Settings& settings, const RunRequest& request, const std::o
     }
     interrupts.Rethrow();
     return bins;
+}
+
+Evaluation Feed::Count(Bins first, const std::vector<Counted>& counted, const std::optional<std::string>& dataName)
+{
+    std::optional<TableBlocks> table;
+    if (!fSpool)
+        table.emplace(GetBatches(), fFields);
+    WeightTally tally = fWeights.value_or(WeightTally());
+    if (const std::optional<std::size_t> index = FindWeight(fFields))
+        tally.rounding = fFields[*index].rounding;
+    Evaluation evaluation;
+    {
+        const nb::gil_scoped_release released;
+        PolledBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table);
+        evaluation = CountRecords(std::move(first), counted, blocks, fFields, WeightGrid(tally));
+    }
+    evaluation.second.dataName = dataName;
+    return evaluation;
 }
 
 Batches* Feed::GetBatches() const

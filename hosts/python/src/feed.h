@@ -5,6 +5,7 @@
 #include "bins/weightgrid.h"
 #include "hosts/python/src/arrays.h"
 #include "hosts/python/src/batches.h"
+#include "hosts/python/src/counting.h"
 #include "hosts/python/src/field.h"
 #include "hosts/python/src/runs.h"
 #include "hosts/python/src/spool.h"
@@ -34,8 +35,9 @@ public:
     explicit Feed(nanobind::object table) : fTable(std::move(table)) {}
 
     /// Its values are in a column of the table or in the array, which has one for each record.
-    void AddField(const std::string& name, const std::string& use, int column, const std::optional<Array>& array,
-                  const std::string& rounding);
+    /// \return its index.
+    std::size_t AddField(const std::string& name, const std::string& use, int column, const std::optional<Array>& array,
+                         const std::string& rounding);
 
     void DeclareMissing(std::size_t index, const std::vector<double>& values,
                         std::optional<std::pair<double, double>> interval, const std::vector<std::string>& texts);
@@ -73,6 +75,9 @@ public:
     /// \param progress is called with a phase and an index, or None.
     Bins Bin(const Settings& settings, const RunRequest& request, const std::optional<std::string>& dataName,
              const nanobind::object& progress);
+
+    /// Counts the records in bins that are there already.
+    Evaluation Count(Bins first, const std::vector<Counted>& counted, const std::optional<std::string>& dataName);
 
 private:
     Batches* GetBatches() const;

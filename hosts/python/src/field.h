@@ -29,7 +29,8 @@ struct Field
     {
         kChanged, ///< an error: the data changed between two readings
         kError,   ///< an error: the bins were made without it
-        kMissing  ///< a missing value
+        kMissing, ///< a missing value
+        kKept     ///< has the code behind all others, and its name is kept
     };
 
     std::string name;
@@ -48,6 +49,7 @@ struct Field
     /// All categories are known, and `unseen` tells what another one is.
     bool isComplete = false;
     Unseen unseen = Unseen::kChanged;
+    std::vector<std::string> unseenNames; ///< the first few of the unseen categories that are kept
 
     /// Of a weight.
     WeightRounding rounding = WeightRounding::kNone;

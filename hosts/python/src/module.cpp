@@ -4,6 +4,7 @@
 #include "hosts/python/src/binsbinding.h"
 #include "hosts/python/src/capsules.h"
 #include "hosts/python/src/columntype.h"
+#include "hosts/python/src/evaluationbinding.h"
 #include "hosts/python/src/faults.h"
 #include "hosts/python/src/feed.h"
 
@@ -12,12 +13,14 @@
 #include <nanobind/stl/optional.h>
 #include <nanobind/stl/pair.h>
 #include <nanobind/stl/string.h>
+#include <nanobind/stl/tuple.h>
 #include <nanobind/stl/vector.h>
 
 #include <exception>
 #include <optional>
 #include <string>
 #include <system_error>
+#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -48,6 +51,16 @@ Bins DescribeFeed(const Feed& feed, bool hasTargets, std::optional<int> target, 
 {
     const Method method = hasTargets ? Method::kSupervised : Method::kEqualFrequency;
     return feed.Describe({method, isRightClosed, numBins, maxDistinct, smallBinRatio, smoothing}, target, dataName);
+}
+
+/// `counted` has of each result its index, the index of its attribute's field, and that of its target's or None.
+Evaluation CountFeed(Feed& feed, Bins first,
+                     const std::vector<std::tuple<std::size_t, std::size_t, std::optional<std::size_t>>>& counted,
+                     const std::optional<std::string>& dataName)
+{
+    std::vector<Counted> fields;
+    for (const auto& [result, attribute, target] : counted) fields.push_back({result, attribute, target});
+    return feed.Count(std::move(first), fields, dataName);
 }
 
 /// The step of the grid of weights, of which so many are positive, as the product of two powers of two.
@@ -112,6 +125,7 @@ NB_MODULE(_core, module)
     module.def("temp_directory", [](const std::string& named) { return ChooseTempDirectory(named, "temp_dir="); });
     module.def("grid_factors", &GetGridFactors, "positive"_a, "largest"_a);
     BindBins(module);
+    BindEvaluation(module);
 
     nb::class_<Table>(module, "Table")
         .def_static(
@@ -139,6 +153,7 @@ NB_MODULE(_core, module)
         .def("learn", &Feed::Learn)
         .def("read", &Feed::Read, "max_rows"_a)
         .def("spool", &Feed::SpoolRecords, "directory"_a)
+        .def("count", &CountFeed, "first"_a, "counted"_a, "data_name"_a.none())
         .def("describe", &DescribeFeed, nb::kw_only(), "has_targets"_a, "target"_a.none() = nb::none(), "n_bins"_a,
              "max_distinct"_a.none() = nb::none(), "small_bin_ratio"_a.none() = nb::none(),
              "smoothing"_a = Settings().smoothing, "right_closed"_a, "data_name"_a.none() = nb::none())

@@ -1,5 +1,6 @@
 #include "hosts/python/src/tableblocks.h"
 
+#include "bins/numbers.h"
 #include "hosts/python/src/faults.h"
 
 #include <mcobnqrt/mccommon.h>
@@ -34,10 +35,32 @@ std::string Describe(double number)
     return "the category " + std::string(text.data(), end.ptr);
 }
 
+std::string GetName(std::string_view text)
+{
+    return std::string(text);
+}
+
+std::string GetName(double number)
+{
+    return FormatNumber(number);
+}
+
+/// The code behind all others. Notes the name, unless there are enough of them.
+double KeepUnseen(Field& field, const std::string& name)
+{
+    constexpr std::size_t kEnough = 10;
+    std::vector<std::string>& names = field.unseenNames;
+    if (names.size() < kEnough && std::find(names.begin(), names.end(), name) == names.end())
+        names.push_back(name);
+    return static_cast<double>(field.GetNumCategories());
+}
+
 double EncodeUnseen(const Field& field, const std::string& category, std::int64_t row)
 {
     switch (field.unseen)
     {
+    case Field::Unseen::kKept: // has been told apart
+        break;
     case Field::Unseen::kMissing:
         return kMissingCode;
     case Field::Unseen::kError:
@@ -55,6 +78,8 @@ double EncodeCategory(Field& field, Table& table, const View& category, std::int
 {
     if (const std::optional<std::size_t> code = table.Find(category))
         return static_cast<double>(*code);
+    if (field.isComplete && field.unseen == Field::Unseen::kKept)
+        return KeepUnseen(field, GetName(category));
     if (field.isComplete)
         return EncodeUnseen(field, Describe(category), row);
     if (table.GetSize() >= kMaxCategories)

@@ -1,0 +1,158 @@
+"""Bins that are counted again, in their own data and in others, and bins that a person changes."""
+
+from __future__ import annotations
+
+import json
+import pickle
+import subprocess
+
+import duckdb
+import mcbinning as mb
+import numpy as np
+import pandas as pd
+import polars as pl
+import pyarrow as pa
+import pytest
+
+pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
+
+
+@pytest.fixture
+def people() -> pd.DataFrame:
+    rng = np.random.default_rng(5)
+    age = rng.integers(18, 80, 3000).astype(float)
+    frame = pd.DataFrame({"age": age, "town": rng.choice(["north", "south", "west"], 3000), "w": rng.random(3000)})
+    frame["y"] = np.where(age + 20 * rng.normal(size=3000) + 9 * (frame["town"] == "west") > 50, "yes", "no")
+    frame.loc[::17, "age"] = np.nan
+    frame["w"] = frame["w"].astype("Float64")
+    frame.loc[::23, "w"] = pd.NA
+    frame.loc[::29, "y"] = None
+    return frame
+
+
+@pytest.fixture
+def bins(people) -> mb.BinningResult:
+    return mb.supervised_bins(people, "y", ["age", "town"], "w")
+
+
+def same(left: mb.AttributeBins, right: mb.AttributeBins) -> bool:
+    frames = left.to_pandas(), right.to_pandas()
+    figures = [(found.gain, found.minimum, found.maximum, found.weight_with_missing) for found in (left, right)]
+    return frames[0].equals(frames[1]) and figures[0] == figures[1]
+
+
+@pytest.mark.parametrize(
+    "form",
+    [
+        lambda frame, path: frame,
+        lambda frame, path: pl.from_pandas(frame),
+        lambda frame, path: pa.Table.from_pandas(frame).to_reader(),
+        lambda frame, path: frame.to_parquet(path) or path,
+        lambda frame, path: frame.sample(frac=1.0, random_state=1),
+    ],
+    ids=["pandas", "polars", "a stream", "a file", "another order"],
+)
+def test_the_data_that_bins_were_made_of_give_them_again(people, bins, form, tmp_path):
+    evaluation = bins.evaluate(form(people, tmp_path / "people.parquet"))
+
+    assert list(evaluation) == list(bins) and not evaluation.flags
+    for key, evaluated in evaluation.items():
+        assert same(evaluated.first, evaluated.second) and evaluated.stability == 0.0
+        assert same(bins[key], evaluated.second)
+    assert evaluation.second.records == 3000
+    assert evaluation.second.records_without_weight == bins.records_without_weight
+    assert evaluation.second.weight_grid == bins.weight_grid
+
+
+def test_the_tool_writes_the_evaluation_that_the_package_does(mcbin, people, tmp_path, monkeypatch):
+    monkeypatch.chdir(tmp_path)
+    people.to_csv("first.csv", index=False)
+    moved = people[people["age"] > 30].assign(town=lambda frame: frame["town"].replace("west", "far, far"))
+    moved.loc[moved.index[3], ["y", "w"]] = ["perhaps", 0.5]
+    moved.loc[moved.index[4], ["age", "y", "w"]] = [99.0, "yes", 0.5]
+    moved.to_csv("second.csv", index=False)
+    wanted = ["--attributes", "age,town", "--categorical", "town", "--weight", "w", "--format", "json"]
+    made = subprocess.run([mcbin, "supervised", "first.csv", "--target", "y", *wanted], capture_output=True, check=True)
+    (tmp_path / "bins.json").write_bytes(made.stdout)
+
+    evaluation = mb.BinningResult.from_json("bins.json").evaluate("second.csv")
+    for form, text in (("json", evaluation.to_json()), ("csv", evaluation.to_csv())):
+        call = [mcbin, "evaluate", "bins.json", "second.csv", "--format", form]
+        assert subprocess.run(call, capture_output=True, check=True).stdout.decode() == text
+    assert evaluation["town"].unseen_categories == ("far, far",) and evaluation["age"].weight_above == 0.5
+    assert evaluation.weight_of_unseen_targets == 0.5
+    assert set(evaluation.flags) == {"age", "town"}
+    assert json.loads(evaluation.to_json())["attributes"][1]["unseen"]["categories"] == ["far, far"]
+
+
+def test_figures_are_told_by_row_and_by_attribute(people, bins):
+    half = people[people["age"].isna() | (people["age"] > 40)]
+    evaluation = bins.evaluate(half)
+
+    frame = evaluation["age"].to_pandas()
+    parts = frame["stability"].iloc[:-1]
+    assert parts.sum() == pytest.approx(evaluation["age"].stability) and frame["interval"].iloc[-1] == "total"
+    one = frame.iloc[-2]  # the missing
+    shift = (one["second_share"] - one["first_share"]) * np.log(one["second_share"] / one["first_share"])
+    assert one["stability"] == pytest.approx(shift)
+    summary = evaluation.summary()
+    assert summary["attribute"].tolist() == ["age", "town"] and "shifted" in summary["flags"][0]
+    assert evaluation["age"].plot().get_title().startswith("age: stability index")
+    assert "flagged" in repr(evaluation) and "<table" in evaluation._repr_html_()
+    assert len(evaluation.to_pandas()) == len(frame) + len(evaluation["town"].to_pandas())
+
+
+def test_what_the_data_lack_is_told(people, bins):
+    with pytest.warns(UserWarning, match="no column 'w', the weight of the bins"):
+        evaluation = bins.evaluate(people.drop(columns=["y", "w"]))
+    assert evaluation["age"].second.target is None and evaluation["age"].second.weight == people["age"].count()
+
+    renamed = bins.evaluate(people.rename(columns={"y": "went", "w": "heft"}), target="went", weight="heft")
+    assert same(renamed["age"].first, renamed["age"].second)
+    with pytest.raises(mb.DataError, match="there is no such column"):
+        bins.evaluate(people, target="went")
+    with pytest.raises(mb.DataError, match="age"):
+        bins.evaluate(people.drop(columns="age"))
+    negative = people.assign(w=-1.0)
+    with pytest.raises(mb.DataError, match="the weight is negative"):
+        bins.evaluate(negative)
+
+
+def test_bins_that_a_person_changes_recount_to_what_sql_counts(people):
+    bins = mb.supervised_bins(people, "y", ["age", "town"])
+    cuts = bins["age"].cut_points.tolist()
+    merged = bins["age"].merge(0, 1)
+    moved = merged["age"].move(cuts[1], cuts[1] + 0.5, people)["age"].split(70, people)
+
+    assert merged["age"].edited and not merged["town"].edited and not bins["age"].edited
+    assert merged["age"].weights[0] == bins["age"].weights[:2].sum() and merged["age"].gain < bins["age"].gain
+    assert same(merged["town"], bins["town"]) and moved["age"].n_distinct is None
+    query = f"SELECT age_bin, COUNT(*) FROM ({moved.to_sql('duckdb', 'people')}) WHERE y IS NOT NULL"
+    counted = duckdb.sql(f"{query} AND age IS NOT NULL GROUP BY 1 ORDER BY 1").fetchall()
+    assert [number for _, number in counted] == moved["age"].weights.tolist()
+
+    for again in (mb.BinningResult.from_json(moved.to_json()), pickle.loads(pickle.dumps(moved))):
+        assert again["age"].edited and same(again["age"], moved["age"])
+    alone = pickle.loads(pickle.dumps(bins["age"])).merge(0, 1)
+    assert list(alone) == ["age"] and same(alone["age"], merged["age"])
+
+
+def test_cut_points_of_a_person_s_choice(people, bins):
+    given = bins.with_cuts({"age": [30, 50], "town": []}, people)
+    assert given["age"].cut_points.tolist() == [30.0, 50.0] and given["town"].n_bins == 1
+    assert given["age"].weight == bins["age"].weight and given["age"].target_entropy == bins["age"].target_entropy
+
+    assert same(bins.with_cuts({"age": bins["age"].cut_points})["age"], bins["age"])
+    with pytest.raises(TypeError, match="data must be given"):
+        bins.with_cuts({"age": [31.5]})
+    for cuts in ([2, 1], [1, 1], [np.nan]):
+        with pytest.raises(ValueError, match="cut points must rise"):
+            bins.with_cuts({"age": cuts}, people)
+    with pytest.raises(KeyError):
+        bins.with_cuts({"size": [1]}, people)
+    with pytest.raises(ValueError, match="bins from 0 to"):
+        bins["age"].merge(1, 99)
+    with pytest.raises(ValueError, match="is no cut point"):
+        bins["age"].move(1.25, 2, people)
+    with pytest.raises(ValueError, match="is a cut point already"):
+        bins["age"].split(bins["age"].cut_points[0], people)
