@@ -10,11 +10,13 @@ from typing import TYPE_CHECKING, Any
 from . import _core
 from ._bins import AttributeBins
 from ._features import require
-from ._result import BinningResult, write_text
+from ._json import write_text
 
 if TYPE_CHECKING:
     import matplotlib.axes
     import pandas as pd
+
+    from ._result import BinningResult
 
 
 @dataclass(frozen=True)
@@ -80,10 +82,10 @@ class Evaluation(Mapping[Any, AttributeEvaluation]):
     In a notebook it shows itself as its `summary()`.
     """
 
-    def __init__(self, core: _core.Evaluation) -> None:
+    def __init__(self, core: _core.Evaluation, first: BinningResult, second: BinningResult) -> None:
         self._core = core
-        self.first = BinningResult(core.first)
-        self.second = BinningResult(core.second)
+        self.first = first
+        self.second = second
         self.weight_of_unseen_targets = core.weight_of_unseen_targets
         """Of the records with a category of a target that the bins do not know, which are left out."""
         self._keys = [list(self.first)[index] for index in core.indices]

@@ -24,6 +24,13 @@ def read_bins(source: str | os.PathLike[str]) -> _core.Bins:
     return _core.Bins.read(_parse(content, name), name)
 
 
+def write_text(text: str, path: str | os.PathLike[str] | None) -> str:
+    if path is not None:
+        with open(path, "w", encoding="utf-8", newline="") as file:
+            file.write(text)
+    return text
+
+
 def _parse(content: bytes, name: str) -> Any:
     try:
         text = content.decode("utf-8").removeprefix("\ufeff")

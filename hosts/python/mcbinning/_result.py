@@ -12,7 +12,7 @@ import numpy as np
 from . import _core, _values
 from ._bins import AttributeBins, Variable, tell_in_time_zones
 from ._features import require
-from ._json import read_bins
+from ._json import read_bins, write_text
 from ._sources import name_of
 from ._status import Status
 from ._types import Closed, Distinct, MemoryLimit, Method, Unseen
@@ -437,7 +437,8 @@ class BinningResult(Mapping[Any, AttributeBins]):
         from ._evaluation import Evaluation
 
         chosen = [index for index, found in enumerate(self.bins) if found.n_bins]
-        return Evaluation(count(self, chosen, data, target, weight, memory_limit, temp_dir))
+        core = count(self, chosen, data, target, weight, memory_limit, temp_dir)
+        return Evaluation(core, BinningResult(core.first), BinningResult(core.second))
 
     def with_cuts(self, cuts: Mapping[Any, Sequence[float]], data: Any = None) -> BinningResult:
         """Bins between cut points of a person's choice.
@@ -525,13 +526,6 @@ class BinningResult(Mapping[Any, AttributeBins]):
 
     def _count(self) -> str:
         return f"{len(self)} results" + (f", {len(self.left_out)} columns left out" if self.left_out else "")
-
-
-def write_text(text: str, path: str | os.PathLike[str] | None) -> str:
-    if path is not None:
-        with open(path, "w", encoding="utf-8", newline="") as file:
-            file.write(text)
-    return text
 
 
 def _restore(text: str, left_out: Mapping[str, str]) -> BinningResult:
