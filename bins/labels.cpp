@@ -129,7 +129,7 @@ std::vector<std::string> MakeLabels(const AttributeBins& bins)
     return labels;
 }
 
-std::vector<BinColumn> MakeBinColumns(const Bins& bins, const std::vector<std::string>& taken)
+std::vector<BinColumn> MakeBinColumns(const Bins& bins, const std::vector<std::string>& taken, Encoding encoding)
 {
     std::set<std::string> names(taken.begin(), taken.end());
     const bool hasSeveralTargets = HasSeveralTargets(bins);
@@ -139,7 +139,7 @@ std::vector<BinColumn> MakeBinColumns(const Bins& bins, const std::vector<std::s
         if (!result.HasBins())
             continue;
         const std::string by = hasSeveralTargets && result.target ? "_by_" + result.target->name : "";
-        const std::string plain = result.attribute->name + by + "_bin";
+        const std::string plain = result.attribute->name + by + "_" + GetSuffix(encoding);
         std::string name = plain;
         for (int i = 2; !names.insert(name).second; ++i) name = plain + "_" + std::to_string(i);
         columns.push_back({&result, name});

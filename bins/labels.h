@@ -2,6 +2,7 @@
 #define MCOBNQRT_BINS_LABELS_H
 
 #include "bins/bins.h"
+#include "bins/encoding.h"
 
 #include <cstddef>
 #include <string>
@@ -39,9 +40,10 @@ struct BinColumn
 };
 
 /// A column for each result that has bins. It is called "age_bin", or "age_by_bought_bin" if there are results for
-/// several targets. Where a column of the data, of which `taken` has the names, or an earlier column of bins has the
+/// several targets, with the suffix of the encoding. Where a column of the data, of which `taken` has the names, or an earlier column of bins has the
 /// name, "_2", "_3" and so on follow it.
-std::vector<BinColumn> MakeBinColumns(const Bins& bins, const std::vector<std::string>& taken);
+std::vector<BinColumn> MakeBinColumns(const Bins& bins, const std::vector<std::string>& taken,
+                                      Encoding encoding = Encoding::kNumber);
 
 /// The results without bins, which have no column, as in "'age' has no bins: error 120012: ...".
 std::vector<std::string> DescribeUnbinned(const Bins& bins);

@@ -7,6 +7,7 @@
 
 #include <cmath>
 #include <limits>
+#include <stdexcept>
 
 namespace
 {
@@ -18,17 +19,23 @@ constexpr double kLargest = std::numeric_limits<double>::max();
 class Expression
 {
 public:
-    Expression(const BinColumn& column, const SqlOptions& options)
+    Expression(const BinColumn& column, const SqlOptions& options, const std::vector<std::string>& missingTexts)
         : fBins(*column.bins), fVariable(*column.bins->attribute), fOptions(options),
           fName(Enclose(fVariable.name, '"')), fAlias(Enclose(column.name, '"'))
     {
-        if (options.areLabels)
-            fLabels = MakeLabels(fBins);
+        MakeResults();
+        if (options.isCast && fVariable.kind != VariableKind::kStringCategorical)
+        {
+            fMissingTexts = &missingTexts;
+            fText = fName;
+            fName = "CAST(" + fText + " AS DOUBLE PRECISION)";
+        }
     }
 
     std::string Make() const
     {
-        return "CASE\n  WHEN " + MakeMissingCondition() + " THEN NULL\n" + MakeBranches() + "END AS " + fAlias;
+        return "CASE\n" + MakeTextBranch() + "  WHEN " + MakeMissingCondition() + " THEN " + fMissing + "\n" +
+               MakeBranches() + "END AS " + fAlias;
     }
 
 private:
@@ -39,9 +46,46 @@ private:
         return fVariable.valueKind == ValueKind::kBoolean ? MakeBooleanBranches() : MakeNumberBranches();
     }
 
-    std::string MakeResult(std::size_t bin) const
+    void MakeResults()
     {
-        return fOptions.areLabels ? Enclose(fLabels[bin], '\'') : std::to_string(bin);
+        const Codes codes = MakeCodes(fBins, fOptions.encoding);
+        fMissing = codes.missing ? MakeDouble(*codes.missing) : "NULL";
+        if (fOptions.encoding == Encoding::kLabel)
+        {
+            for (const std::string& label : MakeLabels(fBins)) fResults.push_back(Enclose(label, '\''));
+            return;
+        }
+        for (const double code : codes.bins)
+        {
+            const bool isNumber = fOptions.encoding == Encoding::kNumber;
+            fResults.push_back(isNumber ? FormatNumber(code) : MakeDouble(code));
+        }
+    }
+
+    /// With an exponent, without which some databases take a number for a decimal.
+    std::string MakeDouble(double value) const
+    {
+        if (!std::isfinite(value))
+        {
+            throw std::invalid_argument(Quote(fVariable.name) +
+                                        " has an infinite weight of evidence, for which there is no number in SQL; "
+                                        "smoothing makes it finite");
+        }
+        const std::string text = FormatNumber(value);
+        return text.find('e') == std::string::npos ? text + "e0" : text;
+    }
+
+    const std::string& MakeResult(std::size_t bin) const { return fResults[bin]; }
+
+    /// The texts that stand for a missing value have to be told before the cast, which would fail or give 0.
+    std::string MakeTextBranch() const
+    {
+        if (!fMissingTexts)
+            return "";
+        std::vector<std::string> texts{"''"};
+        for (const std::string& text : *fMissingTexts) texts.push_back(Enclose(text, '\''));
+        for (const std::string& text : fVariable.missingTexts) texts.push_back(Enclose(text, '\''));
+        return "  WHEN " + fText + " IN (" + Join(texts, ", ") + ") THEN " + fMissing + "\n";
     }
 
     std::string MakeLiteral(double value) const
@@ -124,7 +168,7 @@ private:
             if (!literals.empty())
                 branches += "  WHEN " + fName + " IN (" + Join(literals, ", ") + ") THEN " + MakeResult(bin) + "\n";
         }
-        return branches + "  ELSE NULL\n";
+        return branches + "  ELSE " + fMissing + "\n";
     }
 
     /// The condition that a value that isn't missing lies left of the cut point. A cut point that is infinite is the
@@ -154,7 +198,7 @@ private:
             branches += "  WHEN " + fName + " = " + MakeLiteral(value) + " THEN " +
                         MakeResult(FindBin(fBins.cutPoints, fBins.isRightClosed, value)) + "\n";
         }
-        return branches + "  ELSE NULL\n";
+        return branches + "  ELSE " + fMissing + "\n";
     }
 
     const AttributeBins& fBins;
@@ -162,7 +206,10 @@ private:
     const SqlOptions& fOptions;
     std::string fName;
     std::string fAlias;
-    std::vector<std::string> fLabels; ///< empty if they are not asked for
+    std::string fText;                                       ///< of a column that is cast: the column itself
+    const std::vector<std::string>* fMissingTexts = nullptr; ///< of a column that is cast
+    std::vector<std::string> fResults;                       ///< by bin
+    std::string fMissing;                                    ///< of a missing value
 };
 
 } // namespace
@@ -171,8 +218,11 @@ std::string ToSql(const Bins& bins, const SqlOptions& options)
 {
     std::vector<std::string> names;
     for (const auto& variable : bins.variables) names.push_back(variable->name);
-    std::string sql;
-    for (const BinColumn& column : MakeBinColumns(bins, names))
-        sql += (sql.empty() ? "" : ",\n") + Expression(column, options).Make();
-    return sql + (sql.empty() ? "" : "\n");
+    std::vector<std::string> expressions;
+    for (const BinColumn& column : MakeBinColumns(bins, names, options.encoding))
+        expressions.push_back(Expression(column, options, bins.missingTexts).Make());
+    if (options.table.empty())
+        return Join(expressions, ",\n") + (expressions.empty() ? "" : "\n");
+    expressions.insert(expressions.begin(), "*");
+    return "SELECT " + Join(expressions, ",\n") + "\nFROM " + options.table + "\n";
 }

@@ -2,6 +2,7 @@
 #define MCOBNQRT_BINS_SQL_H
 
 #include "bins/bins.h"
+#include "bins/encoding.h"
 
 #include <string>
 
@@ -14,11 +15,15 @@ enum class SqlDialect
 struct SqlOptions
 {
     SqlDialect dialect = SqlDialect::kStandard;
-    bool areLabels = false; ///< the labels of the bins, not their numbers from 0
+    Encoding encoding = Encoding::kNumber;
+    bool isCast = false; ///< columns of numbers hold texts, as they do in a file, and are cast
+    std::string table;   ///< of the SELECT around the expressions, as it stands in SQL; empty for the expressions alone
 };
 
-/// A CASE expression for each result that has bins, with the name of its column, separated by commas and line ends. It
-/// gives NULL for a missing value, and for a category that the bins were made without.
+/// A CASE expression for each result that has bins, with the name of its column, separated by commas and line ends. A
+/// missing value, and a category that the bins were made without, get what MakeCodes() has for them, which of numbers
+/// and labels is NULL.
+/// \throw std::invalid_argument if a result has not the encoding, or a weight of evidence is infinite.
 std::string ToSql(const Bins& bins, const SqlOptions& options);
 
 #endif

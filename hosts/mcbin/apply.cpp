@@ -2,7 +2,9 @@
 
 #include "bins/binner.h"
 #include "bins/csv.h"
+#include "bins/encoding.h"
 #include "bins/labels.h"
+#include "bins/numbers.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/jsoninput.h"
 #include "hosts/mcbin/input/tablereader.h"
@@ -26,18 +28,23 @@ struct OutputColumn
     const Variable* attribute;
     std::string name;
     Binner binner;
-    std::vector<std::string> fields; ///< by bin: what is written
+    std::vector<std::string> fields; ///< what is written: by bin, and behind them for a missing value
 };
 
-std::vector<std::string> MakeFields(const AttributeBins& bins, bool areLabels, char delimiter)
+/// By bin, and behind them of a missing value, which may be empty.
+std::vector<std::string> MakeFields(const AttributeBins& bins, Encoding encoding, char delimiter)
 {
     std::vector<std::string> fields;
-    if (areLabels)
+    const Codes codes = MakeCodes(bins, encoding);
+    if (encoding == Encoding::kLabel)
     {
         for (const std::string& label : MakeLabels(bins)) fields.push_back(QuoteField(label, delimiter));
-        return fields;
     }
-    for (std::size_t i = 0; i < bins.bins.size(); ++i) fields.push_back(std::to_string(i));
+    else
+    {
+        for (const double code : codes.bins) fields.push_back(FormatNumber(code));
+    }
+    fields.push_back(codes.missing ? FormatNumber(*codes.missing) : "");
     return fields;
 }
 
@@ -46,7 +53,7 @@ std::vector<OutputColumn> MakeColumns(const TableReader& table, const Bins& bins
     std::vector<std::string> missingTexts = bins.missingTexts;
     missingTexts.insert(missingTexts.end(), options.missingText.begin(), options.missingText.end());
     std::vector<OutputColumn> columns;
-    for (const BinColumn& column : MakeBinColumns(bins, table.GetColumnNames()))
+    for (const BinColumn& column : MakeBinColumns(bins, table.GetColumnNames(), options.encoding))
     {
         const Variable& attribute = *column.bins->attribute;
         const std::size_t position = table.FindColumn(attribute.name);
@@ -57,7 +64,7 @@ std::vector<OutputColumn> MakeColumns(const TableReader& table, const Bins& bins
                           " has been binned for more than one target, so its bins can't take its place");
         }
         columns.push_back({position, &attribute, column.name, Binner(*column.bins, missingTexts),
-                           MakeFields(*column.bins, options.areLabels, table.GetDelimiter())});
+                           MakeFields(*column.bins, options.encoding, table.GetDelimiter())});
     }
     if (columns.empty())
         throw Failure(options.bins + ": there is nothing to apply, as no attribute has bins");
@@ -85,13 +92,13 @@ std::string MakeHeader(const TableReader& table, const std::vector<OutputColumn>
                                                     "counts as missing");
 }
 
-/// The field that is written for the row's value; empty for a missing one.
+/// The field that is written for the row's value.
 std::string_view FindField(const TableReader& table, const CsvRow& row, OutputColumn& column, bool isBadMissing)
 {
     const Binner::Found found = column.binner.Find(row[column.position]);
     if (found.isBad && !isBadMissing)
         ThrowBadField(table, row, column);
-    return found.bin ? std::string_view(column.fields[*found.bin]) : std::string_view();
+    return found.bin ? column.fields[*found.bin] : column.fields.back();
 }
 
 /// Writes rows: the input's fields as they stand there, some perhaps replaced, and further ones behind them.

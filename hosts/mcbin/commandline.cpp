@@ -217,6 +217,24 @@ void SettleTempDirectory(std::string& tempDirectory)
     }
 }
 
+/// `when` tells in which form of output it counts.
+void AddEncoding(CLI::App& command, Encoding& encoding, const std::string& when)
+{
+    std::map<std::string, Encoding> encodings(std::begin(kEncodingNames), std::end(kEncodingNames));
+    command
+        .add_option_function<std::string>(
+            "--encode", [&encoding, encodings](const std::string& name) { encoding = encodings.at(name); },
+            when + "what stands for a value: the number of its bin from 0 (the default), its label, or its weight of "
+                   "evidence or rate, which a missing value has, too")
+        ->check(CLI::IsMember({"number", "label", "woe", "rate"}))
+        ->option_text("number|label|woe|rate")
+        ->group("Output");
+    command
+        .add_flag_callback(
+            "--labels", [&encoding] { encoding = Encoding::kLabel; }, when + "short for --encode label")
+        ->group("Output");
+}
+
 void AddOutput(CLI::App& command, OutputOptions& output)
 {
     command
@@ -242,13 +260,22 @@ void AddOutput(CLI::App& command, OutputOptions& output)
         .add_option_function<std::string>(
             "--dialect",
             [&output](const std::string& name)
-            { output.dialect = name == "duckdb" ? SqlDialect::kDuckDb : SqlDialect::kStandard; },
+            { output.sql.dialect = name == "duckdb" ? SqlDialect::kDuckDb : SqlDialect::kStandard; },
             "What --format sql is for: standard, for most databases (the default), or duckdb, where a NaN is missing, "
             "too")
         ->check(CLI::IsMember({"standard", "duckdb"}))
         ->option_text("standard|duckdb")
         ->group("Output");
-    command.add_flag("--labels", output.areLabels, "With --format sql: intervals, not the numbers of the bins from 0")
+    AddEncoding(command, output.sql.encoding, "With --format sql: ");
+    command
+        .add_flag("--cast", output.sql.isCast,
+                  "With --format sql: the columns of numbers hold texts, as where a file was loaded as it is")
+        ->group("Output");
+    command
+        .add_option("--select", output.sql.table,
+                    "With --format sql: a whole SELECT from this table, which stands there as it is given")
+        ->check(MakeNameCheck())
+        ->option_text("TABLE")
         ->group("Output");
     command.add_option("--report", output.report, "Write a page with tables and charts, too")
         ->check(MakeNameCheck())
@@ -430,8 +457,7 @@ void AddApply(CLI::App& app, Request& request)
         ->check(MakeNameCheck())
         ->option_text("FILE")
         ->group("Output");
-    command.add_flag("--labels", options.areLabels, "Write intervals, not the numbers of the bins from 0")
-        ->group("Output");
+    AddEncoding(command, options.encoding, "");
     command.add_flag("--in-place-columns", options.isInPlace, "Write the bins in place of the values")->group("Output");
     AddQuiet(command, options.isQuiet);
     command.footer(kApplyExamples);

@@ -67,7 +67,7 @@ std::string Print(const Outcome& outcome, const OutputOptions& options)
     case Format::kCsv:
         return ToCsv(outcome.bins);
     case Format::kSql:
-        return ToSql(outcome.bins, {options.dialect, options.areLabels});
+        return ToSql(outcome.bins, options.sql);
     }
     return "";
 }

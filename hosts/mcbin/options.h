@@ -40,10 +40,9 @@ struct OutputOptions
 {
     Format format = Format::kTable;
     std::string report; ///< the file for the page; empty for none
-    SqlDialect dialect = SqlDialect::kStandard;
-    bool areLabels = false; ///< in SQL: the intervals, not the numbers of the bins
-    bool isStrict = false;  ///< the exit code tells of a warning
-    bool isQuiet = false;   ///< no progress line, even on a terminal
+    SqlOptions sql;
+    bool isStrict = false; ///< the exit code tells of a warning
+    bool isQuiet = false;  ///< no progress line, even on a terminal
 };
 
 struct BinOptions
@@ -80,7 +79,7 @@ struct ApplyOptions
     std::string output; ///< "-" for standard output
     std::vector<std::string> missingText;
     bool isBadMissing = false;
-    bool areLabels = false; ///< the interval, not the number of the bin
+    Encoding encoding = Encoding::kNumber;
     bool isInPlace = false; ///< replaces the columns
     bool isQuiet = false;
 };

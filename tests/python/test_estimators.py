@@ -19,6 +19,8 @@ from sklearn.utils.estimator_checks import parametrize_with_checks
 WITH_GAP = np.array([[1.0], [2.0], [3.0], [11.0], [12.0], [13.0]] * 4)
 TWO_CLASSES = np.array(["low"] * 3 + ["up"] * 3).repeat(1)[np.arange(24) % 6]
 
+pytestmark = pytest.mark.filterwarnings("ignore::mcbinning.NoCutPointsWarning")
+
 
 @pytest.mark.filterwarnings("ignore::mcbinning.BinningWarning")
 @parametrize_with_checks(
@@ -218,3 +220,90 @@ def test_the_array_is_read_where_it_lies():
     tracemalloc.stop()
 
     assert peak < X.nbytes / 4
+
+
+@pytest.fixture
+def loans() -> tuple[pd.DataFrame, pd.Series]:
+    rng = np.random.default_rng(3)
+    X = pd.DataFrame({"age": rng.integers(18, 80, 2000).astype(float), "size": rng.normal(size=2000)})
+    y = pd.Series(np.where(X["age"] + 15 * rng.normal(size=2000) > 45, "repaid", "lost"))
+    X.loc[::11, "age"] = np.nan
+    return X, y
+
+
+@pytest.mark.parametrize("encode", ["woe", "rate"])
+def test_evidence_stands_for_bins_missing_and_new_values(loans, encode):
+    X, y = loans
+    binner = mb.SupervisedBinner(encode=encode).fit(X, y)
+
+    found = binner.result_["age"]
+    column = binner.transform(X)[:, 0]
+    figures = found.woe if encode == "woe" else found.rates
+    bins = found.bin_numbers(X["age"].to_numpy())
+    seen = bins < found.n_bins
+    assert (column[seen] == figures[bins[seen]]).all()
+    assert set(column[~seen]) == {found.missing.woe if encode == "woe" else found.missing.rate}
+    neutral = binner.transform(pd.DataFrame({"age": [30.0], "size": [np.nan]}))[0, 1]
+    assert neutral == (0.0 if encode == "woe" else (y == "repaid").mean())
+    assert binner.get_feature_names_out().tolist() == ["age", "size"]
+    kept = mb.SupervisedBinner(encode=encode, missing="keep").fit_transform(X, y)
+    assert np.isnan(kept[::11, 0]).all() and (kept[1::11, 0] == column[1::11]).all()
+
+
+@pytest.mark.parametrize("missing", ["code", "keep"])
+@pytest.mark.parametrize("drop", [None, "first"])
+def test_indicators_are_sparse_whole_or_without_the_first(loans, missing, drop):
+    X, y = loans
+    if missing == "keep":
+        X = X.fillna(30.0)
+    dense = mb.SupervisedBinner(encode="onehot", missing=missing, drop=drop).fit(X, y)
+    whole = mb.SupervisedBinner(encode="onehot", missing=missing, drop=drop, sparse_output=True).fit(X, y)
+
+    indicators = dense.transform(X)
+    assert (whole.transform(X).toarray() == indicators).all()
+    assert indicators.shape[1] == len(dense.get_feature_names_out())
+    assert indicators.sum() < len(X) * 2 if drop else indicators.sum() == len(X) * 2
+    for binner in (dense, whole):
+        again = binner.inverse_transform(binner.transform(X))
+        assert (binner.transform(pd.DataFrame(again, columns=X.columns)) != binner.transform(X)).sum() == 0
+
+
+@pytest.mark.parametrize("options", [{}, {"dtype": "int8"}, {"missing": "keep"}, {"encode": "interval"}])
+def test_bins_lead_back_to_values_that_they_hold(loans, options):
+    X, y = loans
+    binner = mb.SupervisedBinner(**options).fit(X, y)
+
+    written = binner.transform(X)
+    back = binner.inverse_transform(written)
+    assert (np.isnan(back) == X.isna().to_numpy()).all()
+    again = binner.transform(pd.DataFrame(back, columns=X.columns))
+    assert pd.DataFrame(again).equals(pd.DataFrame(written))
+    if "dtype" in options:
+        assert written.dtype == np.int8
+
+
+@pytest.mark.parametrize(
+    ("options", "words"),
+    [
+        ({"encode": "woe", "dtype": int}, "dtype must be of floats"),
+        ({"missing": "keep", "dtype": "int32"}, "dtype must be of floats"),
+        ({"dtype": "U4"}, "dtype must be one of numbers"),
+        ({"drop": "first"}, "are for encode='onehot'"),
+        ({"encode": "onehot", "drop": "last"}, "drop must be 'first'"),
+    ],
+)
+def test_forms_that_can_not_be_are_refused(loans, options, words):
+    with pytest.raises(ValueError, match=words):
+        mb.SupervisedBinner(**options).fit(*loans)
+
+
+def test_evidence_needs_two_classes_and_has_no_way_back(loans, iris):
+    with pytest.raises(ValueError, match="for two classes, and there are 3"):
+        mb.SupervisedBinner(encode="woe").fit(iris.drop(columns="species"), iris["species"])
+    with pytest.raises(ValueError, match="does not look at"):
+        mb.EqualFrequencyBinner(encode="rate").fit(loans[0])
+    binner = mb.SupervisedBinner(encode="woe").fit(*loans)
+    with pytest.raises(ValueError, match="no way back"):
+        binner.inverse_transform(binner.transform(loans[0]))
+    with pytest.raises(ValueError, match="numbers from 0"):
+        mb.SupervisedBinner().fit(*loans).inverse_transform([[99, 0]])

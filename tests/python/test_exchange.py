@@ -296,3 +296,44 @@ def test_a_file_may_begin_with_a_mark_and_must_be_utf_8(tmp_path):
     path.write_bytes(text.encode().replace(b'"schema_version"', b'"\xff"'))
     with pytest.raises(ValueError, match="line 3: this is not JSON"):
         mb.BinningResult.from_json(path)
+
+
+@pytest.mark.parametrize("encode", ["woe", "rate"])
+def test_evidence_is_equal_in_the_package_the_tool_and_sql(mcbin, people, encode, tmp_path):
+    names = ["age", "paid", "kind"]
+    result = mb.supervised_bins(people, "y", names, missing=MISSING_CODES)
+    expected = result.transform(people, encode=encode).read_all().to_pandas()
+    columns = [f"{name}_{encode}" for name in names]
+    assert list(expected) == columns and expected.notna().all(axis=None)
+
+    (tmp_path / "bins.json").write_text(result.to_json(), encoding="utf-8")
+    call = [mcbin, "apply", tmp_path / "bins.json", people, "--encode", encode]
+    applied = subprocess.run(call, capture_output=True, check=True, text=True).stdout.splitlines()
+    cells = [[float(row[field]) for field in columns] for row in csv.DictReader(applied)]
+    assert cells == expected.to_numpy().tolist()
+    call = [
+        mcbin,
+        "show",
+        tmp_path / "bins.json",
+        "--format",
+        "sql",
+        "--encode",
+        encode,
+        "--cast",
+        "--select",
+        "people",
+    ]
+    sql = subprocess.run(call, capture_output=True, check=True, text=True).stdout
+    assert sql == result.to_sql("", "people", encode=encode, cast=True)
+    database = sqlite3.connect(":memory:")
+    pd.read_csv(people, dtype=str, keep_default_na=False).to_sql("people", database, index=False)
+    assert pd.read_sql(sql, database)[columns].to_numpy().tolist() == cells
+
+
+def test_infinite_evidence_has_no_form_in_sql(people):
+    result = mb.supervised_bins(pd.DataFrame({"x": range(20), "y": 10 * [0] + 10 * [1]}), "y", smoothing=0.0)
+    assert result.transform(pd.DataFrame({"x": [1]}), encode="woe")["x_woe"].tolist() == [-np.inf]
+    with pytest.raises(ValueError, match="infinite weight of evidence"):
+        result.to_sql(encode="woe")
+    with pytest.raises(ValueError, match="encode must be 'number'"):
+        result.to_sql(encode="odds")

@@ -13,7 +13,7 @@ from . import _core, _values
 from ._features import require
 from ._json import read_bins
 from ._status import Status
-from ._types import Closed, Role
+from ._types import Closed, Encoding, Role
 from ._values import Codes, Floats
 
 if TYPE_CHECKING:
@@ -208,6 +208,10 @@ class AttributeBins:
         """The bin of each value, from 0; one past the last bin for a NaN. A value outside the range seen falls into an
         outer bin. Of a categorical attribute the values are codes."""
         return _values.bin_numbers(values, self.cut_points, self.closed)
+
+    def codes(self, encode: Encoding) -> Floats:
+        """The numbers that stand for values: by bin, and behind them of a missing value, NaN if it has none."""
+        return self._core.codes(encode)
 
     def merge(self, first: int, last: int) -> BinningResult:
         """Joins neighbouring bins. Their weights are added, so that no data are needed.

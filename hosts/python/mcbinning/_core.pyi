@@ -78,6 +78,8 @@ class AttributeBins:
     information value, which a target of more than two categories has for each of them."""
 
     def find_bin(self, value: float) -> int: ...
+    def codes(self, encode: str) -> _Floats:
+        """The numbers that stand for values: by bin, and behind them of a missing value, NaN if it has none."""
     def alone(self) -> Bins:
         """As the only result of a run."""
 
@@ -121,11 +123,11 @@ class Bins:
     def recut(self, index: int, cut_points: list[float]) -> Bins:
         """With other cut points of one result; without weights there unless they are a part of those it has."""
     def replace(self, index: int, other: Bins, other_index: int) -> Bins: ...
-    def columns(self, taken: list[str]) -> list[tuple[int, str]]:
+    def columns(self, taken: list[str], encode: str) -> list[tuple[int, str]]:
         """Of each column of bins the index of its result, and its name."""
     def to_json(self) -> str: ...
     def to_csv(self) -> str: ...
-    def to_sql(self, duckdb: bool, labels: bool) -> str: ...
+    def to_sql(self, duckdb: bool, encode: str, cast: bool, table: str) -> str: ...
 
 class Evaluation:
     first: Bins

@@ -19,12 +19,13 @@ from . import _core
 from ._errors import BinningError, DataError
 from ._opening import is_table, open_source
 from ._outcome import make_result
+from ._outputs import Form, centres
 from ._progress import Progress, reporting
 from ._result import BinningResult
 from ._settings import check_settings, directory_of
 from ._sources import Source
-from ._types import Closed, Encode, MissingOutput, Rounding
-from ._values import Codes, Floats
+from ._types import Closed, Drop, Encode, MissingOutput, Rounding
+from ._values import Floats
 
 _ALL_ROWS = 2**62
 _MOST_CATEGORIES = 256
@@ -37,6 +38,9 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
     closed: Closed
     encode: Encode
     missing: MissingOutput
+    dtype: Any
+    sparse_output: bool
+    drop: Drop | None
     rounding: Rounding
     temp_dir: str | os.PathLike[str] | None
     progress: Progress
@@ -48,24 +52,28 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         """The bins of `X`, in the form that `encode` names."""
         check_is_fitted(self)
         columns = self._read_columns(X)
-        bins = [found.bin_numbers(values) for found, values in zip(self.result_.bins, columns)]
-        if self.encode == "ordinal":
-            return self._as_numbers(bins)
-        if self.encode == "onehot":
-            return self._as_indicators(bins)
-        intervals = self._as_intervals(bins)
-        if _get_output_config("transform", self)["dense"] == "polars":
-            return _as_texts(intervals, self.get_feature_names_out())
-        return intervals
+        codes = [found.bin_numbers(values) for found, values in zip(self.result_.bins, columns)]
+        written = self._form.write(codes, self.result_.bins)
+        if self.encode == "interval" and _get_output_config("transform", self)["dense"] == "polars":
+            return _as_texts(written, self.get_feature_names_out())
+        return written
+
+    def inverse_transform(self, X: Any) -> Floats:
+        """A value for each bin that `transform` has given: the middle of the bin, of which an outer one ends with the
+        least or the largest value that `fit` saw; NaN for a missing value. There is no way back from `encode="woe"` and
+        `"rate"`."""
+        check_is_fitted(self)
+        codes = self._form.read(X, self.result_.bins)
+        return np.column_stack([centres(found)[column] for found, column in zip(self.result_.bins, codes)])
 
     def get_feature_names_out(self, input_features: Any = None) -> npt.NDArray[np.object_]:
         """The names of the input, or with `encode="onehot"` a name for each bin of each."""
         check_is_fitted(self)
-        names = _check_feature_names_in(self, input_features)
-        if self.encode != "onehot":
-            return np.asarray(names, dtype=object)
-        pairs = [(name, label) for name, i in zip(names, range(len(names))) for label in self._labels(i)]
-        return np.array([f"{name}_{label}" for name, label in pairs], dtype=object)
+        return self._form.names(_check_feature_names_in(self, input_features), self.result_.bins)
+
+    @property
+    def _form(self) -> Form:
+        return Form(self.encode, self.missing, self.dtype, self.sparse_output, self.drop)
 
     def __sklearn_tags__(self) -> Tags:
         tags = super().__sklearn_tags__()
@@ -73,10 +81,7 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         return tags
 
     def _fit(self, X: Any, codes: npt.NDArray[np.uint8] | None, classes: npt.NDArray[Any], sample_weight: Any) -> None:
-        if self.encode not in ("ordinal", "onehot", "interval"):
-            raise ValueError(f"encode must be 'ordinal', 'onehot' or 'interval', not {self.encode!r}")
-        if self.missing not in ("code", "keep"):
-            raise ValueError(f"missing must be 'code' or 'keep', not {self.missing!r}")
+        self._form.check()
         feed, names, rows = self._open(X, reset=True)
         if rows == 0:
             raise DataError("the data have no rows")
@@ -159,39 +164,6 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
             return self._open_times(X)[0].read(_ALL_ROWS)
         return list(X.T)
 
-    def _as_numbers(self, bins: Sequence[Codes]) -> Floats:
-        out = np.empty((len(bins[0]), len(bins)))
-        for i, column in enumerate(bins):
-            out[:, i] = column
-            if self.missing == "keep":
-                out[column == self._n_bins(i), i] = np.nan
-        return out
-
-    def _as_indicators(self, bins: Sequence[Codes]) -> Floats:
-        blocks = []
-        for i, column in enumerate(bins):
-            block: Floats = np.zeros((len(column), self._n_bins(i) + 1))
-            block[np.arange(len(column)), column] = 1.0
-            if self.missing == "keep":
-                block[column == self._n_bins(i)] = np.nan
-                block = block[:, :-1]
-            blocks.append(block)
-        return np.concatenate(blocks, axis=1)
-
-    def _as_intervals(self, bins: Sequence[Codes]) -> npt.NDArray[np.object_]:
-        out = np.empty((len(bins[0]), len(bins)), dtype=object)
-        for i, column in enumerate(bins):
-            names = [*self.result_.bins[i].labels, "missing" if self.missing == "code" else None]
-            out[:, i] = np.array(names, dtype=object)[column]
-        return out
-
-    def _n_bins(self, feature: int) -> int:
-        return len(self.cut_points_[feature]) + 1
-
-    def _labels(self, feature: int) -> list[str]:
-        labels = self.result_.bins[feature].labels
-        return [*labels, "missing"] if self.missing == "code" else labels
-
 
 class SupervisedBinner(_Binner):
     """Cuts each feature where that best separates the categories of `y`, by entropy and description length.
@@ -207,11 +179,22 @@ class SupervisedBinner(_Binner):
         The side of a bin that belongs to it: (a, b] or [a, b).
     small_bin_ratio : float, default=0.0
         An inner bin whose weight is below this share, 0 to 1, of its lighter neighbour's is merged away.
-    encode : {"ordinal", "onehot", "interval"}, default="ordinal"
-        What `transform` gives: the number of the bin from 0, a column of 0 and 1 for each bin, or the bin in words.
+    smoothing : float, default=0.5
+        What is added to the weights of a bin's events and others for the weight of evidence, where one of them is 0.
+    encode : {"ordinal", "onehot", "interval", "woe", "rate"}, default="ordinal"
+        What `transform` gives: the number of the bin from 0, a column of 0 and 1 for each bin, or the bin in words;
+        or its weight of evidence or its rate of the second class, for two classes. A missing value has those of the
+        missing rows of `fit`; without any, a weight of evidence of 0 and the rate of all rows.
     missing : {"code", "keep"}, default="code"
         Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
         stays missing.
+    dtype : dtype, default="float64"
+        That of the numbers. Whole numbers have none for a missing value that is kept.
+    sparse_output : bool, default=False
+        With `encode="onehot"`: whether the columns come as a sparse matrix of scipy's.
+    drop : {"first"}, default=None
+        With `encode="onehot"`: "first" leaves out the first bin of each feature, which then has 0 in all columns, so
+        that the columns are not collinear. None: no bin is left out.
     rounding : {"none", "truncate", "closest"}, default="none"
         Whether sample weights become whole numbers, and how. "none": they count with their fractions, on a grid on
         which every sum is exact.
@@ -253,8 +236,12 @@ class SupervisedBinner(_Binner):
         n_bins: int = 1000,
         closed: Closed = "right",
         small_bin_ratio: float = 0.0,
+        smoothing: float = 0.5,
         encode: Encode = "ordinal",
         missing: MissingOutput = "code",
+        dtype: Any = "float64",
+        sparse_output: bool = False,
+        drop: Drop | None = None,
         rounding: Rounding = "none",
         temp_dir: str | os.PathLike[str] | None = None,
         progress: Progress = False,
@@ -263,18 +250,31 @@ class SupervisedBinner(_Binner):
         self.n_bins = n_bins
         self.closed = closed
         self.small_bin_ratio = small_bin_ratio
+        self.smoothing = smoothing
         self.encode = encode
         self.missing = missing
+        self.dtype = dtype
+        self.sparse_output = sparse_output
+        self.drop = drop
         self.rounding = rounding
         self.temp_dir = temp_dir
         self.progress = progress
 
     def fit(self, X: Any, y: Any, sample_weight: Any = None) -> SupervisedBinner:
         """Finds the cut points. `X` is an array, a frame, or any Arrow stream; weights may be fractional."""
-        check_settings(self.closed, self.n_bins, self.max_distinct, self.small_bin_ratio, rounding=self.rounding)
+        check_settings(
+            self.closed,
+            self.n_bins,
+            self.max_distinct,
+            self.small_bin_ratio,
+            rounding=self.rounding,
+            smoothing=self.smoothing,
+        )
         if y is None:
             raise ValueError(f"{type(self).__name__} requires y to be passed, but the target y is None")
         self.classes_, codes = _code_target(y)
+        if self.encode in ("woe", "rate") and len(self.classes_) != 2:
+            raise ValueError(f"encode={self.encode!r} is for two classes, and there are {len(self.classes_)}")
         self._fit(X, codes, self.classes_, sample_weight)
         return self
 
@@ -291,6 +291,7 @@ class SupervisedBinner(_Binner):
             n_bins=self.n_bins,
             max_distinct=self.max_distinct,
             small_bin_ratio=self.small_bin_ratio,
+            smoothing=self.smoothing,
             right_closed=self.closed == "right",
             temp_dir=directory_of(self.temp_dir),
             progress=report,
@@ -311,6 +312,13 @@ class EqualFrequencyBinner(_Binner):
     missing : {"code", "keep"}, default="code"
         Whether a missing value gets a code of its own, one past the last bin (a column of its own, or "missing"), or
         stays missing.
+    dtype : dtype, default="float64"
+        That of the numbers. Whole numbers have none for a missing value that is kept.
+    sparse_output : bool, default=False
+        With `encode="onehot"`: whether the columns come as a sparse matrix of scipy's.
+    drop : {"first"}, default=None
+        With `encode="onehot"`: "first" leaves out the first bin of each feature, which then has 0 in all columns, so
+        that the columns are not collinear. None: no bin is left out.
     rounding : {"none", "truncate", "closest"}, default="none"
         Whether sample weights become whole numbers, and how. "none": they count with their fractions, on a grid on
         which every sum is exact.
@@ -349,6 +357,9 @@ class EqualFrequencyBinner(_Binner):
         closed: Closed = "right",
         encode: Encode = "ordinal",
         missing: MissingOutput = "code",
+        dtype: Any = "float64",
+        sparse_output: bool = False,
+        drop: Drop | None = None,
         rounding: Rounding = "none",
         temp_dir: str | os.PathLike[str] | None = None,
         progress: Progress = False,
@@ -357,6 +368,9 @@ class EqualFrequencyBinner(_Binner):
         self.closed = closed
         self.encode = encode
         self.missing = missing
+        self.dtype = dtype
+        self.sparse_output = sparse_output
+        self.drop = drop
         self.rounding = rounding
         self.temp_dir = temp_dir
         self.progress = progress
@@ -364,6 +378,8 @@ class EqualFrequencyBinner(_Binner):
     def fit(self, X: Any, y: Any = None, sample_weight: Any = None) -> EqualFrequencyBinner:
         """Finds the cut points. `X` is an array, a frame, or any Arrow stream; weights may be fractional."""
         check_settings(self.closed, self.n_bins, rounding=self.rounding)
+        if self.encode in ("woe", "rate"):
+            raise ValueError(f"encode={self.encode!r} is of classes, which this binner does not look at")
         self._fit(X, None, np.empty(0), sample_weight)
         return self
 

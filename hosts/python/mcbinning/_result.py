@@ -15,7 +15,7 @@ from ._features import require
 from ._json import read_bins, write_text
 from ._sources import name_of
 from ._status import Status
-from ._types import Closed, Distinct, MemoryLimit, Method, Unseen
+from ._types import Closed, Distinct, Encoding, MemoryLimit, Method, Unseen
 
 if TYPE_CHECKING:
     import matplotlib.axes
@@ -296,7 +296,15 @@ class BinningResult(Mapping[Any, AttributeBins]):
         """
         return cls(read_bins(source))
 
-    def to_sql(self, dialect: str = "", table: str | None = None, labels: bool = False) -> str:
+    def to_sql(
+        self,
+        dialect: str = "",
+        table: str | None = None,
+        labels: bool = False,
+        *,
+        encode: Encoding | None = None,
+        cast: bool = False,
+    ) -> str:
         """Writes SQL that finds the bins of each row: a CASE expression for each attribute.
 
         Parameters
@@ -307,17 +315,21 @@ class BinningResult(Mapping[Any, AttributeBins]):
             The table of the SELECT around the expressions, as it stands in SQL. None: the expressions alone.
         labels : bool, default=False
             Whether the bins are told in words; otherwise by their numbers from 0.
+        encode : {"number", "label", "woe", "rate"}, default=None
+            What stands for a value, as in `transform`. None: what `labels` tells.
+        cast : bool, default=False
+            Whether the columns of numbers hold texts, as where a file was loaded as it is, and are cast.
 
         Returns
         -------
         str
-            The SQL. It gives NULL for a missing value, and for a category that the bins were made without. Its columns
-            are named as those of `transform`.
+            The SQL. It gives what `transform` does, and for a category that the bins were made without what a missing
+            value gets. Its columns are named as those of `transform`.
 
         Raises
         ------
         ValueError
-            There is no such dialect.
+            There is no such dialect, or no such encoding of these bins.
 
         Examples
         --------
@@ -333,10 +345,16 @@ class BinningResult(Mapping[Any, AttributeBins]):
         """
         from ._sql import write
 
-        return write(self._core, dialect, table, labels)
+        return write(self._core, dialect, table, encode or _name_encoding(labels), cast)
 
     def transform(
-        self, data: Any, labels: bool = False, *, unseen: Unseen = "error", memory_limit: MemoryLimit | None = None
+        self,
+        data: Any,
+        labels: bool = False,
+        *,
+        encode: Encoding | None = None,
+        unseen: Unseen = "error",
+        memory_limit: MemoryLimit | None = None,
     ) -> Any:
         """Finds the bins of new data.
 
@@ -346,6 +364,11 @@ class BinningResult(Mapping[Any, AttributeBins]):
             As `supervised_bins` takes them, with the columns of all attributes.
         labels : bool, default=False
             Whether the bins are told in words; otherwise by their numbers from 0.
+        encode : {"number", "label", "woe", "rate"}, default=None
+            What stands for a value: the number of its bin, its label, or the weight of evidence or the rate of its bin,
+            for which the target must have two categories. A missing value has those of the missing; where the bins were
+            made without missing values, a weight of evidence of 0 and the rate of all records. None: what `labels`
+            tells.
         unseen : {"error", "missing"}, default="error"
             What a category is that the bins were made without: an error with its row and column, or a missing value.
         memory_limit : int or str, default=None
@@ -354,15 +377,17 @@ class BinningResult(Mapping[Any, AttributeBins]):
         Returns
         -------
         pandas.DataFrame, polars.DataFrame, pyarrow.Table or pyarrow.RecordBatchReader
-            A column for each attribute, such as "age_bin", or "age_by_bought_bin" where there are several targets; "_2"
-            and so on follow where the data have such a column. A pandas or polars frame gives one of its kind, an Arrow
-            table gives a table; a path, a LazyFrame or any other stream gives a reader, which takes the data batch by
-            batch. A missing value has no bin.
+            A column for each attribute, such as "age_bin", "age_woe" or "age_rate", or "age_by_bought_bin" where there
+            are several targets; "_2" and so on follow where the data have such a column. A pandas or polars frame gives
+            one of its kind, an Arrow table gives a table; a path, a LazyFrame or any other stream gives a reader, which
+            takes the data batch by batch. A missing value has no bin.
 
         Raises
         ------
         DataError
             A column is missing or of another type, or a category unseen; `column` and `row` tell where.
+        ValueError
+            The bins have no weights of evidence.
 
         Warns
         -----
@@ -379,7 +404,7 @@ class BinningResult(Mapping[Any, AttributeBins]):
         """
         from ._transform import transform
 
-        return transform(self, self._core.columns, data, labels, unseen, memory_limit)
+        return transform(self, self._core.columns, data, encode or _name_encoding(labels), unseen, memory_limit)
 
     def evaluate(
         self,
@@ -526,6 +551,10 @@ class BinningResult(Mapping[Any, AttributeBins]):
 
     def _count(self) -> str:
         return f"{len(self)} results" + (f", {len(self.left_out)} columns left out" if self.left_out else "")
+
+
+def _name_encoding(labels: bool) -> Encoding:
+    return "label" if labels else "number"
 
 
 def _restore(text: str, left_out: Mapping[str, str]) -> BinningResult:

@@ -10,7 +10,7 @@ from ._features import require
 from ._sources import Column, Source, check_names
 from ._spark import refuse_collations
 from ._sql import parse
-from ._types import Unseen
+from ._types import Encoding, Unseen
 
 if TYPE_CHECKING:
     from ._bins import AttributeBins, Variable
@@ -20,7 +20,12 @@ _NUMBERS = ("float", "integer", "decimal")
 
 
 def add_bins(
-    frame: Any, source: Source, result: BinningResult, named: Sequence[tuple[int, str]], labels: bool, unseen: Unseen
+    frame: Any,
+    source: Source,
+    result: BinningResult,
+    named: Sequence[tuple[int, str]],
+    encode: Encoding,
+    unseen: Unseen,
 ) -> Any:
     """The frame with the columns of bins behind its own: its rows have no order by which others could be joined.
     `named` are the indices of results and the names of their columns."""
@@ -31,11 +36,16 @@ def add_bins(
     by_name = {column.name: column for column in source.columns}
     functions = require("pyspark.sql.functions", "Spark frames", "spark")
     columns = []
-    for (bins, name), tree in zip(chosen, parse(result._core, "spark", labels)):
+    numbers = parse(result._core, "spark", "number")
+    for (bins, name), tree, number in zip(chosen, parse(result._core, "spark", encode), numbers):
         _check_kind(by_name[bins.attribute], bins.variable)
-        case = functions.expr(_compare_doubles(tree.this, bins.variable).sql(dialect="spark"))
+        case, bin_number = (
+            functions.expr(_compare_doubles(column.this, bins.variable).sql(dialect="spark"))
+            for column in (tree, number)
+        )
         if bins.variable.is_categorical:
-            case = _tell_unseen(functions, case, bins, result.missing_text, unseen)
+            missing = bins.codes(encode)[-1] if encode in ("woe", "rate") else None
+            case = _tell_unseen(functions, case, bin_number, missing, bins, result.missing_text, unseen)
         columns.append(case.alias(name))
     return frame.select("*", *columns)
 
@@ -67,16 +77,26 @@ def _compare_doubles(case: Any, variable: Variable) -> Any:
     return case.transform(lambda node: exp.cast(node, "DOUBLE") if isinstance(node, exp.Column) else node)
 
 
-def _tell_unseen(functions: Any, case: Any, bins: AttributeBins, missing_text: Sequence[str], unseen: Unseen) -> Any:
-    """The case, which gives NULL for a category that is declared missing as well as for an unseen one."""
+def _tell_unseen(
+    functions: Any,
+    case: Any,
+    bin_number: Any,
+    missing: float | None,
+    bins: AttributeBins,
+    missing_text: Sequence[str],
+    unseen: Unseen,
+) -> Any:
+    """The case, which gives `missing` for a category that is declared missing as well as for an unseen one; the number
+    of the bin tells that there is one."""
     variable = bins.variable
-    missing = list(variable.missing_values)
+    declared = list(variable.missing_values)
     if variable.kind == "text":
-        missing = [*map(str, missing), *missing_text]
+        declared = [*map(str, declared), *missing_text]
     value = functions.col(f"`{bins.attribute.replace('`', '``')}`")
     if unseen == "error":
         words = [f"column {bins.attribute!r}: ", " is not among the categories that the bins were made of"]
         message = functions.concat(functions.lit(words[0]), value.cast("string"), functions.lit(words[1]))
-        case = functions.coalesce(case, functions.when(value.isNotNull(), functions.raise_error(message)))
-    is_missing = value.isin([functions.lit(code) for code in missing])
-    return functions.when(is_missing, functions.lit(None)).otherwise(case)
+        is_unseen = value.isNotNull() & bin_number.isNull()
+        case = functions.when(is_unseen, functions.raise_error(message)).otherwise(case)
+    is_missing = value.isin([functions.lit(code) for code in declared])
+    return functions.when(is_missing, functions.lit(None if missing is None else float(missing))).otherwise(case)

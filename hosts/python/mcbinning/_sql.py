@@ -23,11 +23,10 @@ WITHOUT_NAN = (
 )
 
 
-def write(core: _core.Bins, dialect: str, table: str | None, labels: bool) -> str:
+def write(core: _core.Bins, dialect: str, table: str | None, encode: str, cast: bool) -> str:
     if dialect in ("", "duckdb"):
-        columns = core.to_sql(dialect == "duckdb", labels)
-        return columns if table is None else f"SELECT *{_behind_comma(columns)}\nFROM {table}\n"
-    found = parse(core, dialect, labels)
+        return core.to_sql(dialect == "duckdb", encode, cast, table or "")
+    found = parse(core, dialect, encode, cast)
     if table is None:
         return ",\n".join(column.sql(dialect=dialect, pretty=True) for column in found) + "\n"
     sqlglot = require("sqlglot", "dialects of SQL", "sql")
@@ -35,18 +34,13 @@ def write(core: _core.Bins, dialect: str, table: str | None, labels: bool) -> st
     return str(tree.sql(dialect=dialect, pretty=True)) + "\n"
 
 
-def parse(core: _core.Bins, dialect: str, labels: bool) -> list[Any]:
+def parse(core: _core.Bins, dialect: str, encode: str, cast: bool = False) -> list[Any]:
     """The columns of bins as trees of sqlglot's, for a dialect."""
     sqlglot = require("sqlglot", "dialects of SQL", "sql")
     known = sqlglot.Dialect.get_or_raise(dialect)
     name = next(name for name, kind in sqlglot.Dialect.classes.items() if kind is type(known))
-    columns = core.to_sql(True, labels)
-    tree = sqlglot.parse_one(f"SELECT *{_behind_comma(columns)}", read="duckdb")
+    tree = sqlglot.parse_one(core.to_sql(True, encode, cast, "rows"), read="duckdb")
     return [tell_nan(column, name) for column in tree.expressions[1:]]
-
-
-def _behind_comma(columns: str) -> str:
-    return ",\n" + columns.rstrip("\n") if columns else ""
 
 
 def tell_nan(tree: Any, dialect: str) -> Any:

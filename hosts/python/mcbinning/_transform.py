@@ -15,42 +15,43 @@ from ._files import Reading
 from ._opening import open_source
 from ._sources import Source, check_names, columns_of
 from ._spark import is_spark_frame
-from ._types import MemoryLimit, Unseen
+from ._types import Encoding, MemoryLimit, Unseen
 
 if TYPE_CHECKING:
     from ._bins import AttributeBins, Variable
     from ._result import BinningResult
 
 _ROWS_AT_ONCE = 1 << 17
+_KINDS = {"number": pa.int32(), "label": pa.utf8(), "woe": pa.float64(), "rate": pa.float64()}
 
 
 def transform(
     result: BinningResult,
-    name_columns: Callable[[list[str]], list[tuple[int, str]]],
+    name_columns: Callable[[list[str], str], list[tuple[int, str]]],
     data: Any,
-    labels: bool,
+    encode: Encoding,
     unseen: Unseen,
     memory_limit: MemoryLimit | None,
 ) -> Any:
-    """`name_columns` takes the names of the data's columns, and gives the index of the result and the name of each
-    column of bins."""
+    """`name_columns` takes the names of the data's columns and the encoding, and gives the index of the result and the
+    name of each column of bins."""
     if unseen not in ("error", "missing"):
         raise ValueError(f"unseen must be 'error' or 'missing', not {unseen!r}")
     variables = {found.attribute: found.variable for found in result.bins if found.n_bins}
     texts = {name: variable.missing_texts for name, variable in variables.items() if variable.missing_texts}
     source = open_source(data, Reading(result.missing_text, texts, memory_limit))
-    named = name_columns([column.name for column in source.columns])
+    named = name_columns([column.name for column in source.columns], encode)
     for found in result.bins:
         if not found.n_bins:
             warnings.warn(warning_of(found.attribute, found.status), stacklevel=3)
     if is_spark_frame(data):
         from ._sparkbins import add_bins
 
-        return add_bins(data, source, result, named, labels, unseen)
+        return add_bins(data, source, result, named, encode, unseen)
     feed = open_values(source, list(variables.values()), result.missing_text, unseen)
-    schema = pa.schema([(name, pa.utf8() if labels else pa.int32()) for _, name in named])
+    schema = pa.schema([(name, _KINDS[encode]) for _, name in named])
     chosen = [(result.bins[index], list(variables).index(result.bins[index].attribute)) for index, _ in named]
-    batches = _batches(feed, chosen, schema, labels)
+    batches = _batches(feed, chosen, schema, encode)
     if source.rows is None:
         return pa.RecordBatchReader.from_batches(schema, batches)
     return _like(data, pa.Table.from_batches(batches, schema))
@@ -103,18 +104,22 @@ def _as_numbers(values: list[Any], variable: Variable) -> list[float]:
 
 
 def _batches(
-    feed: _core.Feed, chosen: Sequence[tuple[AttributeBins, int]], schema: pa.Schema, labels: bool
+    feed: _core.Feed, chosen: Sequence[tuple[AttributeBins, int]], schema: pa.Schema, encode: Encoding
 ) -> Iterator[pa.RecordBatch]:
     """`chosen` are bins, and the position of their attribute in the feed."""
+    codes = [found.codes(encode) for found, _ in chosen]
     while True:
         columns = feed.read(_ROWS_AT_ONCE)
         if not columns or len(columns[0]) == 0:
             return
         arrays = []
-        for found, position in chosen:
-            bins = found.bin_numbers(columns[position]).astype(np.int32)
-            array = pa.array(bins, mask=bins > len(found.cut_points))
-            arrays.append(pa.array(found.labels, pa.utf8()).take(array) if labels else array)
+        for (found, position), by_bin in zip(chosen, codes):
+            bins = found.bin_numbers(columns[position])
+            if encode in ("woe", "rate"):
+                arrays.append(pa.array(by_bin[bins]))
+                continue
+            array = pa.array(bins.astype(np.int32), mask=bins > len(found.cut_points))
+            arrays.append(pa.array(found.labels, pa.utf8()).take(array) if encode == "label" else array)
         yield pa.RecordBatch.from_arrays(arrays, schema=schema)
 
 

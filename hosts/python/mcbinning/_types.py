@@ -7,7 +7,9 @@ from typing import Any, Literal
 
 Closed = Literal["right", "left"]
 Distinct = Literal["exact", "approximate"]
-Encode = Literal["ordinal", "onehot", "interval"]
+Encoding = Literal["number", "label", "woe", "rate"]
+Encode = Literal["ordinal", "onehot", "interval", "woe", "rate"]
+Drop = Literal["first"]
 MissingOutput = Literal["code", "keep"]
 Reduce = Literal["rows", "engine", "auto"]
 Rounding = Literal["none", "truncate", "closest"]

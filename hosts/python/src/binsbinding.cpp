@@ -3,6 +3,7 @@
 #include "bins/bins.h"
 #include "bins/csv.h"
 #include "bins/edit.h"
+#include "bins/encoding.h"
 #include "bins/gather.h"
 #include "bins/json.h"
 #include "bins/jsonbuilder.h"
@@ -14,6 +15,7 @@
 #include "bins/rows.h"
 #include "bins/run.h"
 #include "bins/sql.h"
+#include "bins/text.h"
 #include "bins/words.h"
 #include "hosts/python/src/arrays.h"
 #include "hosts/python/src/rowtuples.h"
@@ -28,6 +30,7 @@
 #include <cmath>
 #include <limits>
 #include <optional>
+#include <stdexcept>
 #include <string>
 #include <utility>
 #include <vector>
@@ -189,16 +192,36 @@ Bins ReadDocument(nb::handle document, const std::string& name)
     }
 }
 
-std::string WriteSql(const Bins& bins, bool isDuckDb, bool areLabels)
+/// \throw std::invalid_argument if there is no such encoding.
+Encoding FindEncoding(const std::string& wanted)
 {
-    return ToSql(bins, {isDuckDb ? SqlDialect::kDuckDb : SqlDialect::kStandard, areLabels});
+    for (const auto& [name, encoding] : kEncodingNames)
+    {
+        if (wanted == name)
+            return encoding;
+    }
+    throw std::invalid_argument("encode must be 'number', 'label', 'woe' or 'rate', not " + Quote(wanted));
+}
+
+std::string WriteSql(const Bins& bins, bool isDuckDb, const std::string& encode, bool isCast, const std::string& table)
+{
+    return ToSql(bins, {isDuckDb ? SqlDialect::kDuckDb : SqlDialect::kStandard, FindEncoding(encode), isCast, table});
+}
+
+/// By bin, and behind them of a missing value; NaN where that has none.
+nb::object GetCodes(const AttributeBins& bins, const std::string& encode)
+{
+    Codes codes = MakeCodes(bins, FindEncoding(encode));
+    codes.bins.push_back(ToNumber(codes.missing));
+    return ToArray(std::move(codes.bins));
 }
 
 /// Of each column of bins the index of its result, and its name.
-std::vector<std::pair<std::size_t, std::string>> GetBinColumns(const Bins& bins, const std::vector<std::string>& taken)
+std::vector<std::pair<std::size_t, std::string>> GetBinColumns(const Bins& bins, const std::vector<std::string>& taken,
+                                                               const std::string& encode)
 {
     std::vector<std::pair<std::size_t, std::string>> columns;
-    for (const BinColumn& column : MakeBinColumns(bins, taken))
+    for (const BinColumn& column : MakeBinColumns(bins, taken, FindEncoding(encode)))
         columns.emplace_back(static_cast<std::size_t>(column.bins - bins.results.data()), column.name);
     return columns;
 }
@@ -262,6 +285,7 @@ void BindAttributeBins(nb::module_& module)
         .def_prop_ro("information_value", [](Self self) { return ToNumber(ComputeInformationValue(self)); })
         .def_prop_ro("information_values", &GetInformationValues)
         .def("find_bin", [](Self self, double value) { return FindBin(self.cutPoints, self.isRightClosed, value); })
+        .def("codes", &GetCodes, "encode"_a)
         .def("alone", &MakeAlone);
 }
 
@@ -349,10 +373,10 @@ void BindBins(nb::module_& module)
             [](Self self, std::size_t index, Self other, std::size_t otherIndex)
             { return ReplaceResult(self, index, other.results.at(otherIndex)); },
             "index"_a, "other"_a, "other_index"_a)
-        .def("columns", &GetBinColumns, "taken"_a)
+        .def("columns", &GetBinColumns, "taken"_a, "encode"_a)
         .def("to_json", &ToJson)
         .def("to_csv", &ToCsv)
-        .def("to_sql", &WriteSql, "duckdb"_a, "labels"_a);
+        .def("to_sql", &WriteSql, "duckdb"_a, "encode"_a, "cast"_a, "table"_a);
     module.def("describe_not_json", [](long line) { return std::string(MakeNotJson(line).what()); });
     module.def("status_words",
                [](int code, bool isWarning) { return GetStatusWords(MCBinning::MCStatus(code, isWarning)); });

@@ -228,7 +228,8 @@ TEST(BinsAsSql, LiteralsAreOfTheKindOfTheColumn)
               "  WHEN \"d\" < CAST('1970-01-03' AS DATE) THEN 0\n"
               "  ELSE 1\n"
               "END AS \"d_bin\"\n",
-              ToSql(OneResult(SomeBins(day, nullptr, {1.5}, {{1}, {1}}, false)), {SqlDialect::kDuckDb, false}));
+              ToSql(OneResult(SomeBins(day, nullptr, {1.5}, {{1}, {1}}, false)),
+                    {SqlDialect::kDuckDb, Encoding::kNumber, false, ""}));
 
     const auto flag = AVariable("f");
     flag->valueKind = ValueKind::kBoolean;
@@ -238,13 +239,15 @@ TEST(BinsAsSql, LiteralsAreOfTheKindOfTheColumn)
               "  WHEN \"f\" = TRUE THEN '(0.5, +inf)'\n"
               "  ELSE NULL\n"
               "END AS \"f_bin\"\n",
-              ToSql(OneResult(SomeBins(flag, nullptr, {0.5}, {{1}, {1}})), {SqlDialect::kDuckDb, true}));
+              ToSql(OneResult(SomeBins(flag, nullptr, {0.5}, {{1}, {1}})),
+                    {SqlDialect::kDuckDb, Encoding::kLabel, false, ""}));
 
     const auto number = AVariable("x");
     number->missingInterval = {-kInfinity, kInfinity};
-    EXPECT_EQ("CASE\n"
-              "  WHEN \"x\" IS NULL OR isnan(\"x\") OR 1 = 1 THEN NULL\n"
-              "  ELSE 0\n"
-              "END AS \"x_bin\"\n",
-              ToSql(OneResult(SomeBins(number, nullptr, {}, {{1}})), {SqlDialect::kDuckDb, false}));
+    EXPECT_EQ(
+        "CASE\n"
+        "  WHEN \"x\" IS NULL OR isnan(\"x\") OR 1 = 1 THEN NULL\n"
+        "  ELSE 0\n"
+        "END AS \"x_bin\"\n",
+        ToSql(OneResult(SomeBins(number, nullptr, {}, {{1}})), {SqlDialect::kDuckDb, Encoding::kNumber, false, ""}));
 }
