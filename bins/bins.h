@@ -40,6 +40,14 @@ enum class ValueKind
     kTimestamp ///< microseconds since 1970-01-01 00:00 UTC
 };
 
+/// What decides which codes the categories of a variable have.
+enum class CategoryOrder
+{
+    kText,    ///< they ascend by their bytes
+    kRate,    ///< they ascend by the rate of a target's category, or along what stands for it (OrderByRate)
+    kDeclared ///< their column, or the user, has declared the order
+};
+
 /// A column of the analysis.
 struct Variable
 {
@@ -50,6 +58,9 @@ struct Variable
     ValueKind valueKind = ValueKind::kNumber;
     std::string timeZone;                ///< of a timestamp: the zone that it is shown in; empty without one
     std::vector<std::string> categories; ///< by code; of a numeric-categorical variable as FormatNumber writes them
+    /// Of a categorical variable; nothing where it is not known, and of numbers, which ascend.
+    std::optional<CategoryOrder> categoryOrder;
+    std::string orderTarget;                         ///< of CategoryOrder::kRate: the name of the target
     WeightRounding rounding = WeightRounding::kNone; ///< of a weight
     std::optional<double> weightGrid; ///< of a weight: of what its values were made multiples, if one had to move
     std::vector<std::string>
@@ -94,6 +105,8 @@ struct AttributeBins
     /// The records without a valid value, but with a valid category if there is a target; nothing where they are not
     /// known. It has no borders.
     std::optional<Bin> missing;
+    /// Of a categorical attribute what each category holds, by code; empty where that is not known. They have no borders.
+    std::vector<Bin> categories;
     /// What is added to both weights of a bin, to tell the weight of evidence, where it has no events or no others.
     double smoothing = 0.5;
     bool isEdited = false; ///< a person has changed the bins after they were found

@@ -24,6 +24,9 @@ inline constexpr Names<VariableKind, 4> kKindNames = {{"continuous", VariableKin
 inline constexpr Names<VariableRole, 3> kRoleNames = {
     {"attribute", VariableRole::kAttribute}, {"target", VariableRole::kTarget}, {"weight", VariableRole::kWeight}};
 
+inline constexpr Names<CategoryOrder, 3> kCategoryOrderNames = {
+    {"text", CategoryOrder::kText}, {"rate", CategoryOrder::kRate}, {"declared", CategoryOrder::kDeclared}};
+
 inline constexpr Names<ValueKind, 3> kValueKindNames = {
     {"boolean", ValueKind::kBoolean}, {"date", ValueKind::kDate}, {"timestamp", ValueKind::kTimestamp}};
 

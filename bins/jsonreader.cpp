@@ -72,7 +72,10 @@ private:
         ReadRounding(variable, json);
         ReadValueKind(variable, json);
         if (variable.IsCategorical())
+        {
             ReadCategories(variable, json.At("categories"));
+            ReadCategoryOrder(variable, json);
+        }
         ReadMissing(variable, json.At("missing"));
         return variable;
     }
@@ -112,6 +115,14 @@ private:
                                               ? category.GetString()
                                               : FormatCategoryNumber(category.GetNumber()));
         }
+    }
+
+    static void ReadCategoryOrder(Variable& variable, const JsonCursor& json)
+    {
+        if (const auto order = json.Find("category_order"))
+            variable.categoryOrder = order->Choose(kCategoryOrderNames);
+        if (const auto target = json.Find("order_target"))
+            variable.orderTarget = target->GetString();
     }
 
     void ReadMissing(Variable& variable, const JsonCursor& json) const
@@ -194,7 +205,9 @@ private:
             return Recut(result, result.cutPoints);
         RefuseIfInconsistent(json, result);
         if (const auto missing = json.Find("missing"))
-            result.missing = ReadMissingGroup(*missing, result);
+            result.missing = ReadGroup(*missing, result);
+        if (const auto categories = json.Find("categories"))
+            ReadCategoryGroups(*categories, result);
         return result;
     }
 
@@ -230,15 +243,23 @@ private:
             json.At("weights").Refuse("there must be a weight for each category of the target");
     }
 
-    static Bin ReadMissingGroup(const JsonCursor& json, const AttributeBins& result)
+    /// Records without borders: those of a category, or without a value.
+    static Bin ReadGroup(const JsonCursor& json, const AttributeBins& result)
     {
-        Bin missing;
-        missing.left = missing.right = std::numeric_limits<double>::quiet_NaN();
-        missing.weight = json.At("weight").GetNumber();
+        Bin group;
+        group.left = group.right = std::numeric_limits<double>::quiet_NaN();
+        group.weight = json.At("weight").GetNumber();
         if (!json.At("weights").IsNull())
-            missing.weights = json.At("weights").GetNumbers();
-        RefuseUnlessByCategory(json, missing, result);
-        return missing;
+            group.weights = json.At("weights").GetNumbers();
+        RefuseUnlessByCategory(json, group, result);
+        return group;
+    }
+
+    static void ReadCategoryGroups(const JsonCursor& json, AttributeBins& result)
+    {
+        for (const JsonCursor& group : json.GetElements()) result.categories.push_back(ReadGroup(group, result));
+        if (result.categories.size() != result.attribute->categories.size())
+            json.Refuse("there must be one for each category of the attribute");
     }
 
     static void RefuseUnlessRising(const JsonCursor& json, const AttributeBins& result)

@@ -68,6 +68,11 @@ JsonValue MakeMissing(const Variable& variable)
                   {"interval", interval}};
 }
 
+JsonValue MakeCategoryOrder(const Variable& variable)
+{
+    return variable.categoryOrder ? JsonValue(GetName(kCategoryOrderNames, *variable.categoryOrder)) : JsonValue();
+}
+
 JsonValue ToValue(const Variable& variable)
 {
     const bool isWeight = variable.role == VariableRole::kWeight;
@@ -77,6 +82,8 @@ JsonValue ToValue(const Variable& variable)
                   {"kind", GetName(kKindNames, variable.kind)},
                   {"role", GetName(kRoleNames, variable.role)},
                   {"categories", MakeCategories(variable)},
+                  {"category_order", MakeCategoryOrder(variable)},
+                  {"order_target", variable.orderTarget.empty() ? JsonValue() : JsonValue(variable.orderTarget)},
                   {"rounding", isWeight ? JsonValue(GetName(variable.rounding)) : JsonValue()},
                   {"grid", variable.weightGrid},
                   {"missing", MakeMissing(variable)},
@@ -117,6 +124,21 @@ BinRow MakeWeightless(const Bin& missing)
     return row;
 }
 
+/// What each category holds, by code; null where that is not known.
+JsonValue MakeCategoryGroups(const AttributeBins& result)
+{
+    if (result.categories.empty())
+        return {};
+    const AttributeBins split = SplitByCategory(result);
+    Array groups;
+    for (const BinRow& row : MakeRows(split))
+    {
+        if (row.kind == BinRow::Kind::kBin)
+            groups.emplace_back(MakeGroup(row, split));
+    }
+    return groups;
+}
+
 JsonValue ToValue(const AttributeBins& result)
 {
     const std::vector<BinRow> rows = MakeRows(result);
@@ -149,7 +171,8 @@ JsonValue ToValue(const AttributeBins& result)
         {"information_value", rows.empty() ? JsonValue() : MakeFigure(rows.back(), &Evidence::informationValue)},
         {"cut_points", result.cutPoints},
         {"bins", bins},
-        {"missing", missing}};
+        {"missing", missing},
+        {"categories", MakeCategoryGroups(result)}};
 }
 
 JsonValue ToValue(const Reduction& reduction)

@@ -62,6 +62,26 @@ void FillEvidence(std::vector<BinRow>& rows, const AttributeBins& bins)
 
 } // namespace
 
+AttributeBins SplitByCategory(const AttributeBins& bins)
+{
+    constexpr double kInfinity = std::numeric_limits<double>::infinity();
+    AttributeBins split = bins;
+    split.cutPoints.clear();
+    split.borderTexts.clear();
+    split.bins = bins.categories;
+    for (std::size_t code = 0; code < split.bins.size(); ++code)
+    {
+        // The cut point between two codes is the one that belongs to its bin.
+        const double first = static_cast<double>(code) - (bins.isRightClosed ? 1.0 : 0.0);
+        split.bins[code].left = code == 0 ? -kInfinity : first;
+        split.bins[code].right = code + 1 == split.bins.size() ? kInfinity : first + 1.0;
+        if (code > 0)
+            split.cutPoints.push_back(first);
+    }
+    split.modelEntropy = ComputeModelEntropy(split);
+    return split;
+}
+
 std::vector<BinRow> MakeRows(const AttributeBins& bins)
 {
     std::vector<BinRow> rows;

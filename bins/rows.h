@@ -29,6 +29,10 @@ struct BinRow
     std::vector<std::optional<Evidence>> evidenceByCategory;
 };
 
+/// The same result with a bin for each category of a categorical attribute, in the order of the codes: what was grouped,
+/// one by one. Without bins where the categories are not known.
+AttributeBins SplitByCategory(const AttributeBins& bins);
+
 /// The bins, the missing if they have weight, and the total. Empty without bins.
 std::vector<BinRow> MakeRows(const AttributeBins& bins);
 

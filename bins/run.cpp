@@ -38,17 +38,32 @@ void Collect(Bins& bins, const MCBinning::MCStatus& status, Algorithm& algorithm
     for (AttributeBins& result : bins.results)
     {
         result.missing = tally.FindMissing(result);
+        result.categories = tally.FindCategories(result);
         result.smoothing = bins.settings.smoothing;
     }
 }
 
-/// Those of the pairs or, without pairs, that of the list, if it has one.
-std::vector<int> FindTargets(const BINVarList& variables, const std::vector<int>* targets)
+/// What will be binned: the pairs, or all attributes with the target of the list, if it has one.
+std::vector<CategoryTally::Pair> FindPairs(const Bins& bins, const BINVarList& variables,
+                                           const std::vector<int>* attributes, const std::vector<int>* targets)
 {
-    if (targets != nullptr)
-        return *targets;
-    const int target = variables.GetTargetIndex();
-    return target < 0 ? std::vector<int>() : std::vector<int>{target};
+    const int ofList = variables.GetTargetIndex();
+    std::optional<int> target;
+    if (bins.settings.method == Method::kSupervised && ofList >= 0)
+        target = ofList;
+    std::vector<CategoryTally::Pair> pairs;
+    if (attributes == nullptr)
+    {
+        for (std::size_t i = 0; i < bins.variables.size(); ++i)
+        {
+            if (bins.variables[i]->role == VariableRole::kAttribute)
+                pairs.push_back({static_cast<int>(i), target});
+        }
+        return pairs;
+    }
+    for (std::size_t i = 0; i < attributes->size(); ++i)
+        pairs.push_back({(*attributes)[i], targets != nullptr ? std::optional((*targets)[i]) : target});
+    return pairs;
 }
 
 void RunSupervised(Bins& bins, BINVarList& variables, const std::vector<int>* attributes,
@@ -65,7 +80,7 @@ void RunSupervised(Bins& bins, BINVarList& variables, const std::vector<int>* at
         bins.status = factory.GetStatus();
         return;
     }
-    TargetTally records(*host.records, bins.variables, FindTargets(variables, targets));
+    TargetTally records(*host.records, bins.variables, FindPairs(bins, variables, attributes, targets));
     const MCBinning::MCStatus status = algorithm->Run(&records, attributes, targets);
     Collect<BINAttributeTargetResults>(bins, status, *algorithm, host, records);
 }
@@ -80,7 +95,7 @@ void RunEqualFrequency(Bins& bins, BINVarList& variables, const std::vector<int>
         bins.status = factory.GetStatus();
         return;
     }
-    TargetTally records(*host.records, bins.variables, {});
+    TargetTally records(*host.records, bins.variables, FindPairs(bins, variables, attributes, nullptr));
     const MCBinning::MCStatus status = algorithm->Run(&records, attributes);
     Collect<BINAttributeResults>(bins, status, *algorithm, host, records);
 }

@@ -2,19 +2,23 @@
 
 #include <mcobnqrt/mccommon.h>
 
+#include <algorithm>
 #include <limits>
+#include <numeric>
 #include <set>
+#include <utility>
 
 TargetTally::TargetTally(IBINRecordSource& records, const std::vector<std::shared_ptr<const Variable>>& variables,
-                         const std::vector<int>& targets)
-    : fRecords(records)
+                         const std::vector<CategoryTally::Pair>& pairs)
+    : fRecords(records), fVariables(variables), fWeight(FindWeight(variables)), fCategories(variables, pairs)
 {
-    for (std::size_t i = 0; i < variables.size(); ++i)
+    std::set<int> targets;
+    for (const CategoryTally::Pair& pair : pairs)
     {
-        if (variables[i]->role == VariableRole::kWeight)
-            fWeight = static_cast<int>(i);
+        if (pair.target)
+            targets.insert(*pair.target);
     }
-    for (const int target : std::set<int>(targets.begin(), targets.end()))
+    for (const int target : targets)
     {
         const Variable* const variable = variables.at(static_cast<std::size_t>(target)).get();
         fTargets.push_back({variable, target, std::vector<double>(variable->categories.size())});
@@ -26,9 +30,10 @@ const MCCommon::Record* TargetTally::Next()
     const MCCommon::Record* const record = fRecords.Next();
     if (record == nullptr)
         return record;
-    const double weight = fWeight ? (*record)[*fWeight] : 1.0;
+    const double weight = GetWeight(*record, fWeight);
     if (!(weight > 0.0)) // nor is a missing one
         return record;
+    fCategories.Add(*record);
     for (Target& target : fTargets)
     {
         const double code = (*record)[target.index];
@@ -58,4 +63,31 @@ std::optional<Bin> TargetTally::FindMissing(const AttributeBins& bins) const
         }
     }
     return missing;
+}
+
+std::vector<Bin> TargetTally::FindCategories(const AttributeBins& bins) const
+{
+    std::vector<Bin> categories;
+    if (!bins.HasBins() || !bins.attribute->IsCategorical())
+        return categories;
+    const std::optional<int> target = bins.target ? std::optional(FindIndex(bins.target.get())) : std::nullopt;
+    const std::vector<std::vector<double>>* const weights = fCategories.Find({FindIndex(bins.attribute.get()), target});
+    if (weights == nullptr)
+        return categories;
+    for (const std::vector<double>& ofCategory : *weights)
+    {
+        Bin category;
+        category.left = category.right = std::numeric_limits<double>::quiet_NaN();
+        category.weight = std::accumulate(ofCategory.begin(), ofCategory.end(), 0.0);
+        if (target)
+            category.weights = ofCategory;
+        categories.push_back(std::move(category));
+    }
+    return categories;
+}
+
+int TargetTally::FindIndex(const Variable* variable) const
+{
+    const auto isIt = [variable](const std::shared_ptr<const Variable>& other) { return other.get() == variable; };
+    return static_cast<int>(std::find_if(fVariables.begin(), fVariables.end(), isIt) - fVariables.begin());
 }

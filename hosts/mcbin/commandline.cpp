@@ -144,8 +144,9 @@ void AddRounding(CLI::App& command, ColumnOptions& columns)
 void AddColumns(CLI::App& command, ColumnOptions& columns)
 {
     AddRepeated(command, "--attributes", columns.attributes,
-                "The columns to bin; names or patterns such as 'x_*', where 'x_[*]' is the name x_*. All columns of "
-                "numbers if not given",
+                "The columns to bin; names or patterns such as 'x_*', where 'x_[*]' is the name x_*. If not given, all "
+                "columns of "
+                "numbers and, with a target, of categories",
                 "NAME,...")
         ->group("Columns");
     AddRepeated(command, "--exclude", columns.exclude, "Columns not to bin; names or patterns", "NAME,...")
@@ -153,10 +154,14 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
     AddName(command, "--weight", columns.weight,
             "The column that tells how many cases a row stands for. A row without a weight is left out");
     AddRounding(command, columns);
-    AddRepeated(
-        command, "--categorical", columns.categorical,
-        "Columns of categories, at most 256, also if they are numbers; an attribute's are binned in sorted order",
-        "NAME,...")
+    AddRepeated(command, "--categorical", columns.categorical,
+                "Columns of categories, at most 256, also if they are numbers", "NAME,...")
+        ->group("Columns");
+    AddRepeated(command, "--category-order", columns.categoryOrder,
+                "In which order the categories of attributes are cut, where they have none of their own. rate: by the "
+                "rate of the target's second category, or along the first principal direction of the rates of several "
+                "(the default with a target). text: by their bytes. COLUMN=a,b,c: that of one column; may be repeated",
+                "rate|text|COLUMN=a,b,c")
         ->group("Columns");
     AddRepeated(command, "--continuous", columns.continuous,
                 "Columns of numbers, also if most fields are something else", "NAME,...")
@@ -342,6 +347,7 @@ void AddSupervised(CLI::App& app, Request& request)
             request.command = Request::Command::kSupervised;
             request.bin.settings.method = Method::kSupervised;
             SettleTempDirectory(request.bin.tempDirectory);
+            request.bin.columns.areTextsBinned = true;
             if (request.bin.settings.numBins == 0)
                 request.bin.settings.numBins = kPreBins;
             request.bin.settings.smallBinRatio = request.bin.settings.smallBinRatio.value_or(0.0);
@@ -366,6 +372,9 @@ void AddEqualFrequency(CLI::App& app, Request& request)
             request.command = Request::Command::kEqualFrequency;
             request.bin.settings.method = Method::kEqualFrequency;
             SettleTempDirectory(request.bin.tempDirectory);
+            const std::vector<std::string>& orders = request.bin.columns.categoryOrder;
+            if (std::find(orders.begin(), orders.end(), "rate") != orders.end())
+                throw CLI::ValidationError("--category-order: rate needs a target");
             if (request.bin.settings.numBins == 0)
                 request.bin.settings.numBins = kUsualBins;
         });

@@ -23,8 +23,10 @@ struct ColumnOptions
     std::vector<std::string> continuous;
     std::vector<std::string> pairs; ///< each ATTRIBUTE:TARGET, where the attribute may be a pattern
     std::vector<std::string> missingText;
-    std::vector<std::string> missing; ///< each COLUMN=9,99,unknown,90:99
-    bool isBadMissing = false;        ///< what is no number, where it should be one, is missing and no failure
+    std::vector<std::string> missing;       ///< each COLUMN=9,99,unknown,90:99
+    std::vector<std::string> categoryOrder; ///< each rate, text, or COLUMN=a,b,c
+    bool areTextsBinned = false;            ///< there is a target: columns of text are binned though they are not named
+    bool isBadMissing = false;              ///< what is no number, where it should be one, is missing and no failure
 };
 
 enum class Format

@@ -10,7 +10,7 @@
 struct Outcome
 {
     Bins bins;
-    std::vector<std::string> leftOut; ///< columns of text, with an example each
+    std::vector<std::string> leftOut; ///< columns of text, each with the reason and an example
     std::vector<std::string> notes;   ///< for the user
 };
 

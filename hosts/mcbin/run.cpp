@@ -3,6 +3,7 @@
 #include "bins/run.h"
 #include "bins/words.h"
 #include "hosts/mcbin/failure.h"
+#include "hosts/mcbin/input/categorycount.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/recordsource.h"
 #include "hosts/mcbin/input/tableprofile.h"
@@ -63,6 +64,7 @@ Outcome FindBins(TableReader& table, const BinOptions& options, Progress& progre
 {
     ColumnPlan plan = PlanColumns(table, options.columns);
     ProfileTable(table, plan, progress, care);
+    OrderCategories(table, plan, progress);
     Variables variables = MakeVariables(plan);
     Outcome outcome;
     outcome.leftOut = plan.DescribeLeftOut();

@@ -111,6 +111,8 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "kind": "continuous",
       "role": "attribute",
       "categories": null,
+      "category_order": null,
+      "order_target": null,
       "rounding": null,
       "grid": null,
       "missing": {"values": [7, -9], "texts": ["unknown"], "interval": [90, "inf"]},
@@ -123,6 +125,8 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "kind": "string-categorical",
       "role": "target",
       "categories": ["a", "b"],
+      "category_order": "text",
+      "order_target": null,
       "rounding": null,
       "grid": null,
       "missing": {"values": [], "texts": [], "interval": null},
@@ -135,6 +139,8 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "kind": "weight",
       "role": "weight",
       "categories": null,
+      "category_order": null,
+      "order_target": null,
       "rounding": "none",
       "grid": null,
       "missing": {"values": [-9], "texts": [], "interval": null},
@@ -161,7 +167,8 @@ TEST_F(McbinOutput, JsonHasEveryFigureInItsShortestForm)
       "bins": [
         {"left": "-inf", "right": "inf", "weight": 2, "weights": [2, 0], "rate": 0, "woe": -2.0149030205422647, "iv": 2.182811605587453}
       ],
-      "missing": {"weight": 3, "weights": [0, 3], "rate": 1, "woe": 1.540445040947149, "iv": 1.41207462086822}
+      "missing": {"weight": 3, "weights": [0, 3], "rate": 1, "woe": 1.540445040947149, "iv": 1.41207462086822},
+      "categories": null
     }
   ]
 }

@@ -1,7 +1,9 @@
 #include "hosts/mcbin/input/categories.h"
 
 #include "bins/numbers.h"
+#include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/text.h"
 
 #include <mcobnqrt/mccommon.h>
 
@@ -24,9 +26,11 @@ bool IsNumber(const std::string& field)
 } // namespace
 
 Categories::Categories(const Column& column)
-    : fAreNumbers(std::all_of(column.categories.begin(), column.categories.end(), IsNumber))
+    : fAreNumbers(column.order.empty() && std::all_of(column.categories.begin(), column.categories.end(), IsNumber))
 {
-    if (fAreNumbers)
+    if (!column.order.empty())
+        AddOrdered(column);
+    else if (fAreNumbers)
         AddNumbers(column);
     else
         AddTexts(column);
@@ -59,5 +63,27 @@ void Categories::AddTexts(const Column& column)
     {
         fCodes.emplace(field, static_cast<double>(fNames.size()));
         fNames.push_back(field);
+    }
+}
+
+void Categories::AddOrdered(const Column& column)
+{
+    for (const std::string& name : column.order)
+    {
+        if (name == column.rareName)
+        {
+            for (const std::string& field : column.rare) fCodes.emplace(field, static_cast<double>(fNames.size()));
+        }
+        else
+            fCodes.emplace(name, static_cast<double>(fNames.size()));
+        fNames.push_back(name);
+    }
+    for (const std::string& field : column.categories)
+    {
+        if (fCodes.count(field) == 0)
+        {
+            throw Failure("the order of the categories of column " + Quote(column.name) + " lacks " +
+                          Quote(Shorten(field)));
+        }
     }
 }

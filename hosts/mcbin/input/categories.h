@@ -13,11 +13,11 @@ struct Column;
 ///
 /// If all fields are numbers the categories are numbers in ascending order, and fields such as "1" and "1.0" are one
 /// category; not if there is a field such as "007", which is an identifier. Otherwise they are texts in the order of
-/// their bytes. So the order of the rows makes no difference.
+/// their bytes, or in the one that the column has. So the order of the rows makes no difference.
 class Categories
 {
 public:
-    /// The column's fields have all been read.
+    /// The column's fields have all been read. \throw Failure if the order of the column lacks a field.
     explicit Categories(const Column& column);
 
     bool AreNumbers() const { return fAreNumbers; }
@@ -32,6 +32,7 @@ public:
 private:
     void AddNumbers(const Column& column);
     void AddTexts(const Column& column);
+    void AddOrdered(const Column& column);
 
     bool fAreNumbers;
     std::vector<std::string> fNames;

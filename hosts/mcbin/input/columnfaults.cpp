@@ -30,12 +30,14 @@ struct FaultyColumn
 
 Fault FindFault(const ColumnPlan& plan, const Column& column)
 {
-    if (column.categories.size() > kMostCategories)
+    const bool isCategorical =
+        column.kind == ColumnKind::kCategorical || (column.IsText() && column.isNamed && !column.IsOrnamented());
+    if (isCategorical && column.categories.size() > kMostCategories)
         return Fault::kTooManyCategories;
     if (!column.IsUsed() || column.kind == ColumnKind::kCategorical || column.numTexts == 0)
         return Fault::kNone;
     if (column.IsText())
-        return column.isNamed ? Fault::kText : Fault::kNone;
+        return column.isNamed && (column.IsOrnamented() || column.isBinary) ? Fault::kText : Fault::kNone;
     return plan.isBadMissing ? Fault::kNone : Fault::kMixed;
 }
 
@@ -45,7 +47,7 @@ std::string AdviseOn(const Column& column, Fault fault)
     const bool isFree = column.isAttribute && column.kind == ColumnKind::kUnknown;
     if (fault == Fault::kMixed)
         return isFree ? "; --exclude leaves the column out, and --categorical bins its fields as categories" : "";
-    return fault == Fault::kText ? "; with --categorical its categories are binned in sorted order"
+    return fault == Fault::kText ? "; with --categorical its fields are binned as categories"
                                  : "; --exclude leaves the column out";
 }
 

@@ -250,6 +250,36 @@ void DeclareMissing(ColumnPlan& plan, const TableReader& table, const std::strin
     }
 }
 
+/// Where COLUMN=a,b,c is split: names may hold such signs, so it is where a column's name ends.
+std::pair<std::size_t, std::string> SplitOrder(const TableReader& table, const std::string& declaration)
+{
+    for (std::size_t at = declaration.find('='); at != std::string::npos; at = declaration.find('=', at + 1))
+    {
+        const std::string name = declaration.substr(0, at);
+        if (HasColumn(table, name))
+            return {table.FindColumn(name), declaration.substr(at + 1)};
+    }
+    return {table.FindColumn(declaration.substr(0, declaration.find('='))), {}}; // tells that there is no such column
+}
+
+void DeclareOrder(ColumnPlan& plan, const TableReader& table, const std::string& declaration)
+{
+    if (declaration == "rate" || declaration == "text")
+    {
+        plan.isByRate = declaration == "rate";
+        return;
+    }
+    if (declaration.find('=') == std::string::npos)
+        throw Failure("an order of categories is rate, text or COLUMN=a,b,c, which " + Quote(declaration) + " is not");
+    const auto [position, categories] = SplitOrder(table, declaration);
+    Column& column = plan.columns[position];
+    column.order = Split(categories, ',');
+    const std::set<std::string> different(column.order.begin(), column.order.end());
+    if (different.size() < column.order.size())
+        throw Failure("the order of the categories in " + Quote(declaration) + " names one of them twice");
+    SetKind(plan, {position}, ColumnKind::kCategorical);
+}
+
 void ThrowUnlessText(const std::string& text, const std::string& what)
 {
     if (!IsText(text))
@@ -265,6 +295,7 @@ void ThrowUnlessText(const ColumnPlan& plan)
         if (column.IsUsed())
             ThrowUnlessText(column.name, "the name of column");
         for (const std::string& text : column.missingTexts) ThrowUnlessText(text, "the text for missing values");
+        for (const std::string& text : column.order) ThrowUnlessText(text, "the category");
     }
 }
 
@@ -289,8 +320,9 @@ std::vector<std::string> ColumnPlan::DescribeLeftOut() const
     {
         if (column.numTexts > 0 && !column.IsUsed())
         {
-            described.push_back(Printable(column.name) + " (" + Quote(Shorten(column.firstText)) + " in line " +
-                                std::to_string(column.firstTextLine) + ")");
+            described.push_back(Printable(column.name) + " (" + column.reasonLeftOut + ", such as " +
+                                Quote(Shorten(column.firstText)) + " in line " + std::to_string(column.firstTextLine) +
+                                ")");
         }
     }
     return described;
@@ -306,6 +338,8 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     ColumnPlan plan;
     plan.missingTexts = options.missingText;
     plan.isBadMissing = options.isBadMissing;
+    plan.areTextsBinned = options.areTextsBinned;
+    plan.isByRate = options.areTextsBinned;
     plan.weights.rounding = options.rounding;
     for (const std::string& name : table.GetColumnNames())
     {
@@ -318,6 +352,7 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
         SetAttributes(plan, table, options);
     else
         SetPairs(plan, table, options);
+    for (const std::string& declaration : options.categoryOrder) DeclareOrder(plan, table, declaration);
     for (const std::string& declaration : options.missing) DeclareMissing(plan, table, declaration);
     // A database, or any other reader of typed columns, sees the number and not the text that stands for it here.
     for (Column& column : plan.columns)

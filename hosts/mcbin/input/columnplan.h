@@ -1,6 +1,7 @@
 #ifndef MCBIN_COLUMNPLAN_H
 #define MCBIN_COLUMNPLAN_H
 
+#include "bins/bins.h"
 #include "bins/weightgrid.h"
 
 #include <cstddef>
@@ -43,6 +44,14 @@ struct Column
     std::string firstText;                         ///< the first of numTexts, or the category that is one too many
     long firstTextLine = 0;                        ///< line of firstText
     std::set<std::string, std::less<>> categories; ///< the different fields, if it may be categorical
+    bool isBinary = false;                         ///< a field is not UTF-8, so it can't be a category
+
+    /// The categories by code, where they don't ascend: as declared, or as they are ordered by a target.
+    std::vector<std::string> order;
+    std::string orderTarget;       ///< the name of that target; empty without one
+    std::string rareName;          ///< the name of the code that rare categories share; empty without one
+    std::vector<std::string> rare; ///< these categories
+    std::string reasonLeftOut;     ///< why a column of text is no attribute
 
     bool IsUsed() const { return isAttribute || isTarget || isWeight; }
 
@@ -62,6 +71,8 @@ struct ColumnPlan
     std::vector<Column> columns;
     std::vector<std::pair<std::size_t, std::size_t>> pairs; ///< attribute and target; empty without a list of pairs
     std::vector<std::string> missingTexts;                  ///< of all columns, beside the empty one
+    bool areTextsBinned = false; ///< columns of text are attributes though they are not named, if they can be
+    bool isByRate = false;       ///< categories that have no order are ordered by the rate of the target
     bool isBadMissing = false;
     long numRows = 0;
     WeightTally weights;       ///< of all rows, if a column holds weights
@@ -79,7 +90,7 @@ struct ColumnPlan
     /// Whether the number can be a weight, or is missing or bad.
     static bool IsWeight(const Column& column, double number);
 
-    /// Columns of text that could have been attributes, each with an example of what it holds.
+    /// Columns of text that could have been attributes, each with the reason and an example of what it holds.
     std::vector<std::string> DescribeLeftOut() const;
 
     static bool IsIn(const std::vector<std::string>& texts, std::string_view field);

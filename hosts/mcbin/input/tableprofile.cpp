@@ -10,7 +10,9 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <cmath>
+#include <string>
 #include <string_view>
 
 namespace
@@ -27,9 +29,22 @@ void NoteText(Column& column, std::string_view field, long line)
         column.firstOrnamented = field;
 }
 
+/// A column of a kind that isn't known yet may turn out to hold categories.
+void LearnCategory(Column& column, std::string_view field)
+{
+    if (column.categories.size() > kMostCategories || column.categories.find(field) != column.categories.end())
+        return;
+    if (IsText(field))
+        column.categories.emplace(field);
+    else
+        column.isBinary = true;
+}
+
 void ProfileNumber(Column& column, std::string_view field, long line, Care care)
 {
     constexpr long kManyNumbers = 1000;
+    if (column.kind == ColumnKind::kUnknown)
+        LearnCategory(column, field);
     if (ParseNumber(field))
     {
         ++column.numNumbers;
@@ -101,13 +116,53 @@ void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t positi
         ProfileNumber(column, field, line, care);
 }
 
+/// Whether texts stand among numbers that outnumber them, such as "none" in a column of measurements.
+bool HoldsMoreNumbers(const Column& column)
+{
+    const auto isNumber = [](const std::string& field) { return ParseNumber(field).has_value(); };
+    const auto numNumbers = std::count_if(column.categories.begin(), column.categories.end(), isNumber);
+    return 2 * static_cast<std::size_t>(numNumbers) > column.categories.size();
+}
+
+/// Why a column of text is no attribute; empty if it is one. One that was asked for by its name is, and with a target
+/// any that has a rate to tell of each category: with fewer than five rows for a category on average, as in a column of
+/// identifiers, the rates are chance.
+std::string FindReason(const Column& column, const ColumnPlan& plan)
+{
+    constexpr long kFewestRows = 5;
+    const auto numCategories = static_cast<long>(column.categories.size());
+    const long numRows = column.numNumbers + column.numTexts;
+    if (column.IsOrnamented() || (!plan.areTextsBinned && !column.isNamed))
+        return "text";
+    if (column.isBinary)
+        return "text that is not UTF-8";
+    if (column.isNamed)
+        return "";
+    if (column.missingInterval)
+        return "text, for which an interval of missing values is declared";
+    if (column.categories.size() > kMostCategories)
+        return fmt::format("more than {} categories", kMostCategories);
+    if (numCategories == 1)
+        return "a single category";
+    if (HoldsMoreNumbers(column))
+        return "text among numbers";
+    return numCategories * kFewestRows > numRows ? fmt::format("{} categories in {} rows", numCategories, numRows) : "";
+}
+
 /// Of a column that has no fault.
-void SettleKind(Column& column)
+void SettleKind(Column& column, const ColumnPlan& plan)
 {
     if (column.IsText())
-        column.isAttribute = false;
+    {
+        column.reasonLeftOut = FindReason(column, plan);
+        column.isAttribute = column.reasonLeftOut.empty();
+        column.kind = column.isAttribute ? ColumnKind::kCategorical : ColumnKind::kUnknown;
+    }
     else if (column.kind == ColumnKind::kUnknown)
+    {
         column.kind = ColumnKind::kContinuous;
+        column.categories.clear();
+    }
 }
 
 } // namespace
@@ -127,6 +182,6 @@ void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care
     for (Column& column : plan.columns)
     {
         if (column.IsUsed())
-            SettleKind(column);
+            SettleKind(column, plan);
     }
 }

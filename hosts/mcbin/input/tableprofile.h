@@ -22,7 +22,7 @@ enum class Care
 /// given, their categories, the weights as a whole, and the number of rows. Memory doesn't grow with that number.
 ///
 /// A column without a kind is continuous if every field is a number or missing, or if at least most are, where the
-/// others are missing by the plan or else a failure. A column of text is no attribute any more.
+/// others are missing by the plan or else a failure. A column of text is categorical, or no attribute any more.
 ///
 /// \throw Failure if a row is bad, if there is no row, if a column has more categories than the library takes, if a
 ///        field should be a number and isn't, if a weight is negative or infinite, or if an attribute was asked for by

@@ -106,6 +106,10 @@ Variable DescribeVariable(const Column& column, const Categories* categories, co
     if (variable.kind == VariableKind::kStringCategorical)
     {
         variable.missingTexts = column.missingTexts;
+        variable.orderTarget = column.orderTarget;
+        variable.categoryOrder = column.order.empty()         ? CategoryOrder::kText
+                                 : column.orderTarget.empty() ? CategoryOrder::kDeclared
+                                                              : CategoryOrder::kRate;
         return variable;
     }
     variable.missingNumbers = column.missingNumbers;
@@ -145,8 +149,8 @@ Variables MakeVariables(const ColumnPlan& plan)
         const std::vector<std::string> leftOut = plan.DescribeLeftOut();
         const auto isOrnamented = [](const Column& column) { return column.IsOrnamented(); };
         const bool isAny = std::any_of(plan.columns.begin(), plan.columns.end(), isOrnamented);
-        throw Failure("there is nothing to bin: no column that could be an attribute has numbers" +
-                      (leftOut.empty() ? "" : "; they hold text: " + Join(leftOut, ", ")) +
+        throw Failure("there is nothing to bin: no column could be an attribute" +
+                      (leftOut.empty() ? "" : "; left out: " + Join(leftOut, ", ")) +
                       (isAny ? std::string("; ") + kPlainNumbers : ""));
     }
     AddPairs(variables, plan, variableOfColumn);

@@ -184,7 +184,7 @@ void PrintUncut(std::ostream& os, const Outcome& outcome)
     if (const std::string words = DescribeWithoutWeight(outcome.bins); !words.empty())
         os << "<p>Left out, as they have no weight: " << words << "</p>\n";
     if (!outcome.leftOut.empty())
-        os << "<p>Left out, as they hold text: " << EscapeHtml(Join(outcome.leftOut, ", ")) << "</p>\n";
+        os << "<p>Left out: " << EscapeHtml(Join(outcome.leftOut, ", ")) << "</p>\n";
 }
 
 } // namespace

@@ -70,5 +70,5 @@ void PrintTables(std::ostream& os, const Outcome& outcome, const Screen& screen)
     if (const std::string words = DescribeWithoutWeight(outcome.bins); !words.empty())
         os << "Left out, as they have no weight: " << words << '\n';
     if (!outcome.leftOut.empty())
-        os << "Left out, as they hold text: " << Join(outcome.leftOut, ", ") << '\n';
+        os << "Left out: " << Join(outcome.leftOut, ", ") << '\n';
 }

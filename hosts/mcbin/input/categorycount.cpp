@@ -1,0 +1,84 @@
+#include "hosts/mcbin/input/categorycount.h"
+
+#include "bins/categoryorder.h"
+#include "bins/categorytally.h"
+#include "hosts/mcbin/input/columnplan.h"
+#include "hosts/mcbin/input/recordsource.h"
+#include "hosts/mcbin/input/variables.h"
+#include "hosts/mcbin/progress.h"
+
+#include <algorithm>
+#include <string>
+#include <vector>
+
+namespace
+{
+
+/// Whether the categories of an attribute have no order of their own. Categories that are numbers have one.
+bool IsUnordered(const Column& column)
+{
+    return column.isAttribute && !column.isTarget && column.kind == ColumnKind::kCategorical && column.order.empty() &&
+           !Categories(column).AreNumbers();
+}
+
+/// The plan with the columns alone that have to be counted, and the targets and the weight. Numbers need not be parsed.
+ColumnPlan MakeCountPlan(const ColumnPlan& plan)
+{
+    ColumnPlan counted = plan;
+    for (Column& column : counted.columns) column.isAttribute = IsUnordered(column);
+    return counted;
+}
+
+/// By variable index of an attribute: the index of the target whose rates order its categories.
+std::vector<CategoryTally::Pair> FindPairs(const Variables& variables,
+                                           const std::vector<std::shared_ptr<const Variable>>& described)
+{
+    std::vector<CategoryTally::Pair> pairs;
+    const auto isKnown = [&pairs](int attribute)
+    {
+        return std::any_of(pairs.begin(), pairs.end(),
+                           [=](const CategoryTally::Pair& pair) { return pair.attribute == attribute; });
+    };
+    for (std::size_t i = 0; i < variables.pairAttributes.size(); ++i)
+    {
+        if (!isKnown(variables.pairAttributes[i]))
+            pairs.push_back({variables.pairAttributes[i], variables.pairTargets[i]});
+    }
+    const int target = variables.list.GetTargetIndex();
+    for (std::size_t i = 0; i < described.size() && target >= 0; ++i)
+    {
+        if (described[i]->role == VariableRole::kAttribute)
+            pairs.push_back({static_cast<int>(i), target});
+    }
+    return pairs;
+}
+
+} // namespace
+
+void OrderCategories(TableReader& table, ColumnPlan& plan, Progress& progress)
+{
+    const ColumnPlan counted = MakeCountPlan(plan);
+    const auto isAttribute = [](const Column& column) { return column.isAttribute; };
+    if (!plan.isByRate || std::none_of(counted.columns.begin(), counted.columns.end(), isAttribute))
+        return;
+    Variables variables = MakeVariables(counted);
+    const std::vector<std::shared_ptr<const Variable>> described = DescribeVariables(counted, variables);
+    const std::vector<CategoryTally::Pair> pairs = FindPairs(variables, described);
+    CategoryTally tally(described, pairs);
+    progress.BeginRows("counting the categories");
+    TableRecordSource records(table, counted, variables, progress);
+    while (records.HasNext())
+    {
+        tally.Add(*records.Next());
+        progress.CountRow();
+    }
+    for (const CategoryTally::Pair& pair : pairs)
+    {
+        const auto attribute = static_cast<std::size_t>(pair.attribute);
+        Column& column = plan.columns[variables.columns[attribute]];
+        const CategoryCodes codes =
+            MakeCategoryCodes(described[attribute]->categories, *tally.Find(pair), true, 0.0, true);
+        column.order = codes.names;
+        column.orderTarget = described[static_cast<std::size_t>(*pair.target)]->name;
+    }
+}
