@@ -1,5 +1,7 @@
 #include "bins/categoryorder.h"
 
+#include "bins/numbers.h"
+
 #include <algorithm>
 #include <cmath>
 #include <numeric>
@@ -157,6 +159,21 @@ std::vector<std::size_t> OrderByRate(const std::vector<std::vector<double>>& wei
     std::stable_sort(codes.begin(), codes.end(),
                      [&positions](std::size_t a, std::size_t b) { return positions[a] < positions[b]; });
     return codes;
+}
+
+std::string DescribeUnusable(const std::vector<std::string>& categories, std::int64_t numRecords)
+{
+    constexpr std::int64_t kFewestRecords = 5;
+    if (categories.size() > kMostCategories)
+        return "more than " + std::to_string(kMostCategories) + " categories";
+    if (categories.size() < 2)
+        return categories.empty() ? "no category" : "a single category";
+    const auto isNumber = [](const std::string& text) { return ParseNumber(text).has_value(); };
+    if (2 * std::count_if(categories.begin(), categories.end(), isNumber) > static_cast<long>(categories.size()))
+        return "text among numbers";
+    if (kFewestRecords * static_cast<std::int64_t>(categories.size()) > numRecords)
+        return std::to_string(categories.size()) + " categories in " + std::to_string(numRecords) + " records";
+    return "";
 }
 
 CategoryCodes MakeCategoryCodes(const std::vector<std::string>& categories, const Matrix& weights, bool areTexts,

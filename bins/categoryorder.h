@@ -2,6 +2,7 @@
 #define MCOBNQRT_BINS_CATEGORYORDER_H
 
 #include <cstddef>
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <vector>
@@ -25,6 +26,18 @@
 ///        does not depend on that of the records.
 /// \return the codes in their new order.
 std::vector<std::size_t> OrderByRate(const std::vector<std::vector<double>>& weights);
+
+/// A run takes the codes from 0 to 255.
+inline constexpr std::size_t kMostCategories = 256;
+
+/// Why a column of text that nobody has named is not binned, as in "more than 256 categories"; empty if it is. Of each
+/// category there has to be a rate to tell: with fewer than five records for a category on average, as in a column of
+/// identifiers, the rates are chance. Texts among numbers that outnumber them, such as "none" among measurements, are
+/// no categories either.
+///
+/// \param categories the different texts; if there are too many, at least one more than a run takes.
+/// \param numRecords how many records have one.
+std::string DescribeUnusable(const std::vector<std::string>& categories, std::int64_t numRecords);
 
 /// The categories of an attribute as they get their codes.
 struct CategoryCodes

@@ -38,7 +38,7 @@ Without cut points:
   flat by size  warning 120014: all valid values are equal
   void by size  warning 120015: no record has a valid value
 
-Left out: city, zip (3 categories in 10 rows, such as 'A, "0"' in line 2)
+Left out: city, zip (3 categories in 10 records, such as 'A, "0"' in line 2)
 )";
 
 std::string Replace(std::string text, const std::string& what, const std::string& with)

@@ -230,11 +230,10 @@ def test_columns_of_a_pandas_frame_need_no_texts_as_names():
         mb.equal_frequency_bins(frame.set_axis(["a", "a"], axis=1))
 
 
-def test_text_is_left_out_unless_it_is_named(mixed):
+def test_bins_of_text_are_found_again_in_other_tables(mixed):
     frame = mixed[["x", "y"]].assign(kind=mixed["y"].str.upper())
 
-    assert mb.supervised_bins(frame, "y").left_out == {"kind": "text"}
-    result = mb.supervised_bins(frame, "y", attributes=["kind"])
+    result = mb.supervised_bins(frame, "y", ["kind"], category_order="text")
     assert result["kind"].labels == ["{A}", "{B}", "{C}"]
     assert result.transform(frame)["kind_bin"].tolist() == [ord(text) - ord("a") for text in frame["y"]]
     news = pd.DataFrame({"kind": ["A", "C", "D", None, "B"]})

@@ -1,5 +1,6 @@
 #include "hosts/mcbin/input/columnfaults.h"
 
+#include "bins/categoryorder.h"
 #include "bins/numbers.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/tablereader.h"

@@ -1,5 +1,6 @@
 #include "hosts/mcbin/input/tableprofile.h"
 
+#include "bins/categoryorder.h"
 #include "bins/numbers.h"
 #include "bins/utf8.h"
 #include "hosts/mcbin/input/columnfaults.h"
@@ -10,7 +11,6 @@
 
 #include <fmt/format.h>
 
-#include <algorithm>
 #include <cmath>
 #include <string>
 #include <string_view>
@@ -116,22 +116,9 @@ void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t positi
         ProfileNumber(column, field, line, care);
 }
 
-/// Whether texts stand among numbers that outnumber them, such as "none" in a column of measurements.
-bool HoldsMoreNumbers(const Column& column)
-{
-    const auto isNumber = [](const std::string& field) { return ParseNumber(field).has_value(); };
-    const auto numNumbers = std::count_if(column.categories.begin(), column.categories.end(), isNumber);
-    return 2 * static_cast<std::size_t>(numNumbers) > column.categories.size();
-}
-
-/// Why a column of text is no attribute; empty if it is one. One that was asked for by its name is, and with a target
-/// any that has a rate to tell of each category: with fewer than five rows for a category on average, as in a column of
-/// identifiers, the rates are chance.
+/// Why a column of text is no attribute; empty if it is one, as one that was asked for by its name is.
 std::string FindReason(const Column& column, const ColumnPlan& plan)
 {
-    constexpr long kFewestRows = 5;
-    const auto numCategories = static_cast<long>(column.categories.size());
-    const long numRows = column.numNumbers + column.numTexts;
     if (column.IsOrnamented() || (!plan.areTextsBinned && !column.isNamed))
         return "text";
     if (column.isBinary)
@@ -140,13 +127,7 @@ std::string FindReason(const Column& column, const ColumnPlan& plan)
         return "";
     if (column.missingInterval)
         return "text, for which an interval of missing values is declared";
-    if (column.categories.size() > kMostCategories)
-        return fmt::format("more than {} categories", kMostCategories);
-    if (numCategories == 1)
-        return "a single category";
-    if (HoldsMoreNumbers(column))
-        return "text among numbers";
-    return numCategories * kFewestRows > numRows ? fmt::format("{} categories in {} rows", numCategories, numRows) : "";
+    return DescribeUnusable({column.categories.begin(), column.categories.end()}, column.numNumbers + column.numTexts);
 }
 
 /// Of a column that has no fault.

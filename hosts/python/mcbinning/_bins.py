@@ -44,6 +44,10 @@ class Variable:
     """What stands for a missing value in a text file, where `missing_values` are numbers."""
     grid: float | None
     """Of a weight: of what its values were made multiples, so that all sums are exact; None if none had to move."""
+    category_order: str | None = None
+    """What the order of texts follows: `"text"`, `"rate"` of `order_target`, or what was `"declared"`; None otherwise,
+    and where it is not known."""
+    order_target: str | None = None
 
     @classmethod
     def from_core(cls, core: _core.Variable) -> Variable:
@@ -60,6 +64,8 @@ class Variable:
             core.rounding,
             () if is_text else tuple(core.missing_texts),
             core.grid,
+            core.category_order,
+            core.order_target,
         )
 
     @property
@@ -178,8 +184,22 @@ class AttributeBins:
         target of two categories `rate`, `woe` and `iv`, too, and of one of more each of them for each category against
         all others. Behind the bins a row for the missing, if they have
         weight, and one for the total; they have no number."""
+        return self._tabulate(self._core)
+
+    def categories_to_pandas(self) -> pd.DataFrame:
+        """As `to_pandas`, but with a row for each category of an attribute that has them, whose number is that of its
+        bin. Empty where that is not known, as of bins that an earlier release has written."""
+        frame = self._tabulate(self._core.by_category())
+        is_category = frame["bin"].notna()
+        codes = frame.loc[is_category, "bin"].to_numpy(dtype=float)
+        frame.loc[is_category, "bin"] = self.bin_numbers(codes)
+        names = self.variable.category_names()
+        frame.insert(3, "category", [names[int(code)] for code in codes] + [None] * (len(frame) - len(codes)))
+        return frame.drop(columns=["left", "right"])
+
+    def _tabulate(self, core: _core.AttributeBins) -> pd.DataFrame:
         pandas = require("pandas", "data frames", "pandas")
-        rows = self._core.rows
+        rows = core.rows
         numbers = [index if row[0] == "bin" else None for index, row in enumerate(rows)]
         columns: dict[str, Any] = {
             "attribute": [self.attribute] * len(rows),

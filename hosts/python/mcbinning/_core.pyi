@@ -20,6 +20,17 @@ def grid_factors(positive: int, largest: float) -> tuple[float, float]:
 def status_words(code: int, is_warning: bool) -> str: ...
 def describe_not_json(line: int) -> str: ...
 
+def describe_unusable(categories: list[str], records: int) -> str:
+    """Why a column of text with these categories, in so many records, is not binned; empty if it is."""
+
+class CategoryCodes:
+    """The categories of an attribute as they get their codes."""
+
+    def __init__(self, names: list[str]) -> None: ...
+    names: list[str]
+    rare_code: int | None
+    rare: list[str]
+
 class Table:
     @staticmethod
     def from_stream(stream: object, explain: Callable[[str], str] | None = None) -> Table: ...
@@ -39,6 +50,8 @@ class Variable:
     categories: list[str] | list[float] | None
     rounding: str | None
     grid: float | None
+    category_order: str | None
+    order_target: str | None
     missing_texts: list[str]
     """Of a variable of texts all that are missing, of others those that are no numbers."""
     missing_numbers: list[float]
@@ -80,6 +93,8 @@ class AttributeBins:
     def find_bin(self, value: float) -> int: ...
     def codes(self, encode: str) -> _Floats:
         """The numbers that stand for values: by bin, and behind them of a missing value, NaN if it has none."""
+    def by_category(self) -> AttributeBins:
+        """With a bin for each category."""
     def alone(self) -> Bins:
         """As the only result of a run."""
 
@@ -153,12 +168,20 @@ class Feed:
         column: int = -1,
         array: npt.NDArray[Any] | None = None,
         rounding: str = "none",
+        optional: bool = False,
     ) -> int:
         """The index of the field."""
     def declare_missing(
         self, index: int, values: list[float], interval: tuple[float, float] | None, texts: list[str]
     ) -> None: ...
     def set_categories(self, index: int, categories: list[str] | list[float], unseen: str = "changed") -> None: ...
+    def describe_unusable(self, index: int) -> str:
+        """Once the records have been read: why a column of text is not binned unless it is named."""
+    def drop(self, index: int) -> None: ...
+    def count_categories(
+        self, pairs: list[tuple[int, int]], *, rare: float, by_rate: bool
+    ) -> list[CategoryCodes]: ...
+    def set_codes(self, index: int, codes: CategoryCodes, order: str, target: str = "") -> None: ...
     def set_value_kind(self, index: int, kind: str) -> None: ...
     def categories(self, index: int) -> list[str] | list[float]: ...
     def learn(self) -> None: ...

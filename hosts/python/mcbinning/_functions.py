@@ -3,19 +3,19 @@
 from __future__ import annotations
 
 import os
-from collections.abc import Iterable, Sequence
+from collections.abc import Iterable, Mapping, Sequence
 from typing import Any
 
 from ._files import Reading
 from ._opening import open_source
 from ._outcome import make_result
-from ._plan import Plan, columns_left_out, name_missing, names_to_bin
+from ._plan import Plan, columns_left_out, name_missing, name_orders, named_in, names_to_bin, texts_of
 from ._progress import Progress
 from ._result import BinningResult
 from ._runs import run
 from ._settings import Reducing, RunSettings, check_settings, directory_of
 from ._sources import name_of
-from ._types import Closed, Distinct, MemoryLimit, Missing, Reduce, Rounding
+from ._types import CategoryOrder, Closed, Distinct, MemoryLimit, Missing, Reduce, Rounding
 
 
 def supervised_bins(
@@ -26,6 +26,7 @@ def supervised_bins(
     missing: Missing | None = None,
     pairs: Iterable[tuple[Any, Any]] | None = None,
     *,
+    category_order: CategoryOrder = "rate",
     max_distinct: int | None = None,
     n_bins: int = 1000,
     closed: Closed = "right",
@@ -56,8 +57,9 @@ def supervised_bins(
         The column whose categories are separated; at least 2 and at most 256. Its missing values leave a record out.
         Required without `pairs`.
     attributes : sequence of str, default=None
-        The columns to cut. None: all of numbers, booleans, dates and timestamps; other ones are left out, and the
-        result's `left_out` names them. A column of text that is named is cut between sets of its categories.
+        The columns to cut. None: all of numbers, booleans, dates and timestamps, and those of text that are cut between
+        sets of their categories: of these there are from 2 to 256, and five records for each on average. Other ones
+        are left out, and the result's `left_out` names them.
     weight : str, default=None
         The column with the weight of each record, a finite number from 0, which may be fractional. None: each record
         weighs 1. A record without a weight is left out, and counted in the result.
@@ -67,6 +69,11 @@ def supervised_bins(
     pairs : iterable of (str, str), default=None
         Attribute and target of each result, to bin against several targets in one pass; takes the place of `target` and
         `attributes`.
+    category_order : {"rate", "text"} or dict, default="rate"
+        In which order the categories of an attribute are cut that have none of their own, as those of an ordered
+        categorical have. "rate": by the share of the target's second category, or with several along the first
+        principal direction of their shares; of an attribute with several targets the first one counts. "text": by
+        their bytes. A dict tells by column all categories in their order; the others follow their rate.
     max_distinct : int, default=None
         An attribute with more distinct values than this, at least 1, is pre-binned into `n_bins` bins of equal
         frequency, between which it is then cut. None: never.
@@ -112,9 +119,8 @@ def supervised_bins(
     Returns
     -------
     BinningResult
-        A mapping from each attribute, or pair of attribute and target, to its `AttributeBins`. Its categories are in
-        ascending order, or in the one that an ordered categorical or an Enum declares; the order of the rows makes no
-        difference.
+        A mapping from each attribute, or pair of attribute and target, to its `AttributeBins`. The order of the rows
+        makes no difference.
 
     Raises
     ------
@@ -153,18 +159,29 @@ def supervised_bins(
     if pairs is not None and attributes is not None:
         raise TypeError("pairs name the attributes, so attributes can't be given, too")
     check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding, smoothing=smoothing)
+    order = name_orders(category_order)
     reducing = Reducing(reduce, max_groups, distinct)
     source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
     target, weight = (None if label is None else name_of(label) for label in (target, weight))
     if pairs is not None:
         wanted = list(dict.fromkeys((name_of(attribute), name_of(category)) for attribute, category in pairs))
     else:
-        wanted = [(name, target) for name in names_to_bin(source, attributes, [target, weight])]
-    plan = Plan(source, wanted, target, weight, name_missing(missing), rounding)
+        wanted = [(name, target) for name in names_to_bin(source, attributes, [target, weight], True)]
+    is_chosen = attributes is not None or pairs is not None
+    plan = Plan(
+        source,
+        wanted,
+        target,
+        weight,
+        name_missing(missing),
+        rounding,
+        optional=frozenset() if is_chosen else texts_of(source, [target, weight, *named_in(order)]),
+        category_order=order,
+        left_out={} if is_chosen else columns_left_out(source, [target, weight], True),
+    )
     settings = RunSettings(n_bins, max_distinct, small_bin_ratio, smoothing, closed == "right", directory_of(temp_dir))
-    bins = run(plan, settings, reducing, progress)
-    left_out = columns_left_out(source, plan.names) if attributes is None and pairs is None else None
-    return make_result(bins, left_out)
+    plan, bins = run(plan, settings, reducing, progress)
+    return make_result(bins, plan.left_out)
 
 
 def equal_frequency_bins(
@@ -173,6 +190,7 @@ def equal_frequency_bins(
     weight: Any = None,
     missing: Missing | None = None,
     *,
+    category_order: Mapping[Any, Sequence[str]] | None = None,
     n_bins: int = 10,
     closed: Closed = "right",
     rounding: Rounding = "none",
@@ -201,6 +219,9 @@ def equal_frequency_bins(
     missing : dict, default=None
         By column: a value that stands for a missing one, or a list of such values. A tuple of two numbers among them is
         an interval, both ends included; there is at most one. `{"age": [9, 99, (900, 999)]}`
+    category_order : dict, default=None
+        By column: all its categories in the order in which they are cut. The others are cut in the order of their
+        bytes, or in the one that an ordered categorical declares.
     n_bins : int, default=10
         The number of bins, at least 2.
     closed : {"right", "left"}, default="right"
@@ -256,8 +277,17 @@ def equal_frequency_bins(
     reducing = Reducing(reduce, max_groups, distinct)
     source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
     weight = None if weight is None else name_of(weight)
-    names = names_to_bin(source, attributes, [weight])
-    plan = Plan(source, [(name, None) for name in names], None, weight, name_missing(missing), rounding)
+    names = names_to_bin(source, attributes, [weight], False)
+    plan = Plan(
+        source,
+        [(name, None) for name in names],
+        None,
+        weight,
+        name_missing(missing),
+        rounding,
+        category_order="text" if category_order is None else name_orders(category_order),
+        left_out=columns_left_out(source, [weight], False) if attributes is None else {},
+    )
     settings = RunSettings(n_bins, None, None, 0.5, closed == "right", directory_of(temp_dir))
-    bins = run(plan, settings, reducing, progress)
-    return make_result(bins, columns_left_out(source, plan.names) if attributes is None else None)
+    plan, bins = run(plan, settings, reducing, progress)
+    return make_result(bins, plan.left_out)

@@ -2,8 +2,8 @@
 
 from __future__ import annotations
 
-from collections.abc import Iterable, Mapping, Sequence
-from dataclasses import dataclass
+from collections.abc import Callable, Iterable, Mapping, Sequence
+from dataclasses import dataclass, field, replace
 from typing import Any
 
 import numpy as np
@@ -11,30 +11,55 @@ import numpy as np
 from . import _core, _values
 from ._errors import DataError
 from ._sources import Column, Source, check_names, name_of
-from ._types import Missing, Rounding
+from ._types import CategoryOrder, Missing, Rounding
 
 
-def names_to_bin(source: Source, attributes: Any, others: Sequence[str | None]) -> list[str]:
-    """Those that the user named, or all columns that can be measured but the `others`."""
+def names_to_bin(source: Source, attributes: Any, others: Sequence[str | None], has_target: bool) -> list[str]:
+    """Those that the user named, or all columns but the `others` that can be measured or, with a target, may be
+    categories."""
     if attributes is not None:
         is_one = isinstance(attributes, str) or not isinstance(attributes, Iterable)
         return list(dict.fromkeys(map(name_of, [attributes] if is_one else attributes)))
-    left_out = columns_left_out(source, others)
+    left_out = columns_left_out(source, others, has_target)
     names = [column.name for column in source.columns if column.name not in others and column.name not in left_out]
-    if not names:
-        named = ", ".join(f"{name!r} ({kind})" for name, kind in left_out.items())
-        named = f"; left out are {named}" if named else ""
-        raise DataError(f"there is nothing to bin: no column holds numbers{named}")
+    refuse_nothing(names, left_out)
     return names
 
 
-def columns_left_out(source: Source, others: Sequence[str | None]) -> dict[str, str]:
+def columns_left_out(source: Source, others: Sequence[str | None], has_target: bool) -> dict[str, str]:
     """By name: what a column holds that is binned only if it is named, or not at all."""
     return {
         column.name: column.kind
         for column in source.columns
-        if column.name not in others and (column.kind == "text" or not column.is_usable)
+        if column.name not in others and ((column.kind == "text" and not has_target) or not column.is_usable)
     }
+
+
+def refuse_nothing(kept: Sequence[Any], left_out: Mapping[str, str]) -> None:
+    """\\raise DataError if no column is left to bin."""
+    if not kept:
+        named = ", ".join(f"{name!r} ({kind})" for name, kind in left_out.items())
+        named = f"; left out are {named}" if named else ""
+        raise DataError(f"there is nothing to bin: no column can be an attribute{named}")
+
+
+def texts_of(source: Source, others: Sequence[str | None]) -> frozenset[str]:
+    """The columns of text but the `others`."""
+    return frozenset(column.name for column in source.columns if column.kind == "text" and column.name not in others)
+
+
+def name_orders(category_order: CategoryOrder) -> CategoryOrder:
+    """As it was asked for, by the names of the columns."""
+    if isinstance(category_order, str):
+        if category_order not in ("rate", "text"):
+            raise ValueError(f"category_order must be 'rate', 'text' or a dict by column, not {category_order!r}")
+        return category_order
+    return {name_of(column): list(map(str, categories)) for column, categories in category_order.items()}
+
+
+def named_in(category_order: CategoryOrder) -> list[str]:
+    """The columns whose order of categories was given."""
+    return [] if isinstance(category_order, str) else list(map(name_of, category_order))
 
 
 def name_missing(missing: Missing | None) -> dict[str, Any]:
@@ -73,9 +98,15 @@ class Plan:
     missing: Mapping[str, Any]
     rounding: Rounding
     """Of the weight."""
+    optional: frozenset[str] = frozenset()
+    """Columns of text that nobody has named. They are binned if they can be."""
+    category_order: CategoryOrder = "rate"
+    left_out: Mapping[str, str] = field(default_factory=dict)
+    """By name: why a column is not binned."""
 
     def __post_init__(self) -> None:
-        check_names(self.source, [*self.names, *self.missing])
+        orders = () if isinstance(self.category_order, str) else self.category_order
+        check_names(self.source, [*self.names, *self.missing, *orders])
         if not self.pairs:
             raise DataError("there is nothing to bin: no attribute is named")
         for attribute, target in self.pairs:
@@ -83,6 +114,11 @@ class Plan:
                 raise DataError("the column can't be attribute and target at once", attribute)
             if self.weight is not None and self.weight in (attribute, target):
                 raise DataError("the weight can't be attribute or target, too", self.weight)
+        if isinstance(self.category_order, str):
+            return
+        for name in self.category_order:
+            if self.column(name).kind != "text":
+                raise DataError("only the categories of a column of text can be given an order", name)
 
     @property
     def targets(self) -> list[str]:
@@ -95,29 +131,104 @@ class Plan:
         in_order = [column.name for column in self.source.columns if column.name in taking_part]
         return in_order + sorted(name for name in taking_part if name is not None and name not in in_order)
 
-    def open_feed(self, directory: str) -> _core.Feed:
-        """A feed that knows all categories and what the weights are like."""
+    def open_feed(self, directory: str) -> tuple[Plan, _core.Feed]:
+        """The plan without the optional columns that can't be binned, and a feed of its columns that knows all
+        categories and what the weights are like."""
         categorical = self.categorical
         to_learn = categorical if self.weight is None else [*categorical, self.weight]
         if not to_learn:
-            return self._feed_columns(self.names)
+            return self, self._feed_columns(self.names)
         if self.source.is_once:
             feed = self._feed_columns(self.names)
             feed.spool(directory)
-            known = feed
-            indices = {name: self.names.index(name) for name in categorical}
+            plan = self.settle({name: feed.describe_unusable(self.names.index(name)) for name in self.optional})
+            for name in reversed(self.names):
+                if name not in plan.names:
+                    feed.drop(self.names.index(name))
+            for name in plan.categorical:
+                plan.check_categories(name, feed.categories(plan.names.index(name)))
+            codes = plan.count_categories(lambda: feed, plan.names)
         else:
             known = self._feed_columns(to_learn)
             known.learn()
-            feed = self._feed_columns(self.names)
-            feed.set_weights(known.weights())
-            indices = {name: i for i, name in enumerate(categorical)}
-        for name in categorical:
-            categories = known.categories(indices[name])
-            self.check_categories(name, categories)
-            if known is not feed:
-                feed.set_categories(self.names.index(name), categories)
-        return feed
+            plan = self.settle({name: known.describe_unusable(categorical.index(name)) for name in self.optional})
+            categories = {name: known.categories(categorical.index(name)) for name in plan.categorical}
+
+            def feed_columns(names: list[str]) -> _core.Feed:
+                feed = plan._feed_columns(names)
+                feed.set_weights(known.weights())
+                for name, found in categories.items():
+                    feed.set_categories(names.index(name), found)
+                return feed
+
+            for name, found in categories.items():
+                plan.check_categories(name, found)
+            counted = plan.categorical if self.weight is None else [*plan.categorical, self.weight]
+            codes = plan.count_categories(lambda: feed_columns(counted), counted)
+            feed = feed_columns(plan.names)
+        plan.set_codes(feed, plan.names, codes)
+        return plan, feed
+
+    def settle(self, unusable: Mapping[str, str]) -> Plan:
+        """Without the optional columns of which a reason tells that they can't be binned."""
+        left_out = {**self.left_out, **{name: f"text: {why}" for name, why in unusable.items() if why}}
+        kept = [(attribute, target) for attribute, target in self.pairs if attribute not in left_out]
+        refuse_nothing(kept, left_out)
+        return replace(self, pairs=kept, left_out=left_out)
+
+    @property
+    def unordered(self) -> dict[str, str | None]:
+        """By name of an attribute whose categories have no order of their own: the target of its first pair. A column
+        that is a target, too, keeps the order that it has as such."""
+        first: dict[str, str | None] = {}
+        for attribute, target in self.pairs:
+            first.setdefault(attribute, target)
+        declared = () if isinstance(self.category_order, str) else self.category_order
+        return {
+            name: target
+            for name, target in first.items()
+            if name in self.categorical
+            and name not in self.targets
+            and name not in declared
+            and self.column(name).kind == "text"
+            and not self.column(name).is_ordered
+        }
+
+    def count_categories(
+        self, open_counted: Callable[[], _core.Feed], names: Sequence[str]
+    ) -> dict[str, _core.CategoryCodes]:
+        """By name of an attribute whose categories are to be ordered by the rates of a target: their codes.
+        `open_counted` gives a feed of the columns `names`, which knows their categories."""
+        if self.category_order == "text":
+            return {}
+        to_count = {name: target for name, target in self.unordered.items() if target is not None}
+        if not to_count:
+            return {}
+        pairs = [(names.index(name), names.index(target)) for name, target in to_count.items()]
+        return dict(zip(to_count, open_counted().count_categories(pairs, rare=0.0, by_rate=True)))
+
+    def set_codes(self, feed: _core.Feed, names: Sequence[str], codes: Mapping[str, _core.CategoryCodes]) -> None:
+        """Tells the feed of the columns `names` in which order the categories have their codes."""
+        for name, found in codes.items():
+            if name in names:
+                feed.set_codes(names.index(name), found, "rate", self.unordered[name] or "")
+        for index, name in enumerate(names):
+            column = self.column(name) if name in self.categorical else None
+            if column is not None and column.is_ordered and column.kind == "text":
+                feed.set_codes(index, _core.CategoryCodes(list(map(str, feed.categories(index)))), "declared")
+        if isinstance(self.category_order, str):
+            return
+        for name, order in self.category_order.items():
+            if name in names:
+                self._check_order(name, order, feed.categories(names.index(name)))
+                feed.set_codes(names.index(name), _core.CategoryCodes(list(order)), "declared")
+
+    def _check_order(self, name: str, order: Sequence[Any], categories: Sequence[Any]) -> None:
+        if len(set(order)) < len(order):
+            raise DataError("the order of the categories names one of them twice", name)
+        lacking = [category for category in categories if category not in order]
+        if lacking:
+            raise DataError(f"the order of the categories lacks {lacking[0]!r}", name)
 
     @property
     def categorical(self) -> list[str]:
@@ -147,7 +258,13 @@ class Plan:
         positions = [fields[0] for fields in table.columns]
         feed = _core.Feed(table)
         for index, name in enumerate(names):
-            feed.add_field(name, self._use(name), column=positions.index(name), rounding=self.rounding)
+            feed.add_field(
+                name,
+                self._use(name),
+                column=positions.index(name),
+                rounding=self.rounding,
+                optional=name in self.optional,
+            )
             values, interval = self.missing_of(name)
             is_text = self.column(name).kind == "text"
             feed.declare_missing(index, [] if is_text else list(values), interval, list(values) if is_text else [])

@@ -14,6 +14,7 @@ from collections.abc import Callable, Iterator, Sequence
 from concurrent.futures import ThreadPoolExecutor
 from contextlib import contextmanager
 from dataclasses import dataclass, replace
+from functools import partial
 from typing import Any
 
 import numpy as np
@@ -26,7 +27,7 @@ from ._choice import choose_engine
 from ._engines import CountedQueries, Engine
 from ._errors import DataError, StreamError
 from ._plan import Plan
-from ._progress import Report
+from ._progress import Progress, Report, reporting
 from ._rows import bin_rows
 from ._settings import Reducing, RunSettings
 from ._shapes import Deal, Weights
@@ -35,6 +36,8 @@ from ._sources import open_batches, open_stream
 _SECONDS_BETWEEN_REPORTS = 0.2
 _FEW_GROUPS = 1 << 22
 """So many, of some 100 MB, are told one by one even where that need not be."""
+_MOST_TO_LIST = 1 << 10
+"""So many values tell that there are too many categories, even if some hundreds of them are declared missing."""
 _EXACT_DIGITS = 15
 """A decimal of so many digits has a double of its own, which all engines find."""
 
@@ -57,22 +60,33 @@ class Tally:
     """That of the grid, if a weight has moved."""
 
 
-def bin_reduced(plan: Plan, settings: RunSettings, reducing: Reducing, report: Report | None) -> _core.Bins:
+def bin_reduced(
+    plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progress
+) -> tuple[Plan, _core.Bins]:
     """As the run over all rows, but for what it tells of the reduction. That run itself, where it is to choose and the
     engine would be dearer."""
     assert plan.source.open_engine is not None
-    with plan.source.open_engine() as engine, _reporting_progress(engine, report):
+    names = list(plan.names)
+    with (
+        plan.source.open_engine() as engine,
+        reporting(progress, names, len(plan.pairs), plan.source.rows, False) as report,
+        _reporting_progress(engine, report),
+    ):
         queries = CountedQueries(engine)
         reason = ""
         if reducing.reduce == "auto" and not plan.source.is_reduced:
             is_chosen, reason = choose_engine(queries, [attribute for attribute, _ in plan.pairs])
             if not is_chosen:
-                bins = bin_rows(plan, settings, report)
+                plan, feed = plan.open_feed(settings.temp_dir)
+                names[:] = plan.names
+                bins = bin_rows(plan, feed, settings, report)
                 bins.reduction = _core.Reduction("", reason, queries.number, True, [])
-                return bins
+                return plan, bins
         engine.check_columns(plan.names)
         tally = _tally(plan, queries)
         reducer = _Reducer(plan, queries, tally, settings, reducing)
+        plan = reducer.plan
+        names[:] = plan.names
         bins = reducer.describe()
         bins.records = tally.records
         bins.records_without_weight = tally.without_weight
@@ -86,7 +100,7 @@ def bin_reduced(plan: Plan, settings: RunSettings, reducing: Reducing, report: R
                 report("attributes", index)
         is_exact = reducing.distinct == "exact"
         bins.reduction = _core.Reduction(engine.name, reason, queries.number, is_exact, groups)
-        return bins
+        return plan, bins
 
 
 def _map(engine: Engine, work: Callable[[Any], Any], items: Sequence[Any]) -> Iterator[Any]:
@@ -184,14 +198,17 @@ class _Reducer:
         self._schema = queries.stream(f"SELECT * FROM {_shapes.ROWS} LIMIT 0").schema
         self._refuse_wide_decimals(plan.weight)
         self._category_values = {name: self._list_values(name) for name in plan.categorical}
-        self._categories = {name: self._learn(name) for name in plan.categorical}
+        unusable = {name: self._describe_unusable(name) for name in plan.optional}
+        self.plan = self._plan = plan.settle(unusable)
+        self._categories = {name: self._learn(name) for name in self.plan.categorical}
+        self._codes: dict[str, _core.CategoryCodes] = {}
+        self._codes = self._order_categories()
 
     def describe(self) -> _core.Bins:
         """The bins before any is found."""
         plan = self._plan
         feed = plan.make_feed(plan.names, open_stream(self._schema.empty_table()))
-        for name, categories in self._categories.items():
-            feed.set_categories(plan.names.index(name), categories)
+        self._set_categories(feed, plan.names)
         return feed.describe(
             has_targets=bool(plan.targets),
             target=None if plan.target is None else plan.names.index(plan.target),
@@ -225,13 +242,19 @@ class _Reducer:
 
     def _bin_values(self, attribute: str, target: str | None) -> _Part:
         """With a group for each value."""
+        feed, groups = self._open_groups(attribute, target)
+        bins = self._bin(feed, target, self._settings)
+        return _Part(bins, groups.number)
+
+    def _open_counted(self, attribute: str, target: str | None) -> _core.Feed:
+        return self._open_groups(attribute, target)[0]
+
+    def _open_groups(self, attribute: str, target: str | None) -> tuple[_core.Feed, _Groups]:
         has_zeros = pa.types.is_floating(self._schema.field(attribute).type)
         limit = self._reducing.max_groups
         sql = _shapes.group_pair(attribute, target, self._tally.weights, has_zeros, limit + 1)
         groups = _Groups(self._queries.stream(sql), limit, has_zeros)
-        feed = self._make_feed(groups.rename(attribute, target), groups, attribute, target)
-        bins = self._bin(feed, target, self._settings)
-        return _Part(bins, groups.number)
+        return self._make_feed(groups.rename(attribute, target), groups, attribute, target), groups
 
     def _bin_buckets(self, attribute: str, target: str | None) -> _Part:
         """With a group for each value near a cut, and one for all values between two cuts."""
@@ -278,21 +301,50 @@ class _Reducer:
         feed = self._plan.make_feed(names, open_batches(schema, batches))
         feed.add_field("", "weight", column=len(names))
         feed.set_weights((1, self._tally.total))  # whose grid has all sums of weights that make up the total
+        self._set_categories(feed, names)
+        return feed
+
+    def _set_categories(self, feed: _core.Feed, names: Sequence[str]) -> None:
+        """Tells a feed of the columns `names` their categories and codes."""
         for index, name in enumerate(names):
             if name in self._categories:
                 feed.set_categories(index, self._categories[name])
-        return feed
+        self._plan.set_codes(feed, names, self._codes)
 
-    def _list_values(self, name: str) -> pa.Array:
-        limit = self._reducing.max_groups
+    def _list_values(self, name: str) -> pa.Table:
+        """The values of a column, and how many rows have each. Of one that may have too many to be binned, only so many
+        as tell that."""
+        limit = _MOST_TO_LIST if name in self._plan.optional else self._reducing.max_groups
         found = self._queries.table(_shapes.list_values(name, limit + 1))
-        if found.num_rows > limit:
+        if found.num_rows > limit and name not in self._plan.optional:
             raise DataError(f"there are more than max_groups={limit} categories", name)
-        return found["value_"].combine_chunks()
+        return found.combine_chunks()
+
+    def _describe_unusable(self, name: str) -> str:
+        """Why an optional column can't be binned."""
+        values = self._category_values[name]
+        missing, _ = self._plan.missing_of(name)
+        valid = [(value, rows) for value, rows in zip(*(values[i].to_pylist() for i in range(2))) if value is not None]
+        counts = {value: rows for value, rows in valid if value not in missing}
+        return _core.describe_unusable(list(counts), sum(counts.values()))
+
+    def _order_categories(self) -> dict[str, _core.CategoryCodes]:
+        """The codes of the attributes whose categories are ordered by the rates of a target: a query for each tells
+        the weights."""
+        codes: dict[str, _core.CategoryCodes] = {}
+        for name, target in self._plan.unordered.items():
+            names = [name] if target is None else [name, target]
+            try:
+                codes |= replace(self._plan, pairs=[(name, target)]).count_categories(
+                    partial(self._open_counted, name, target), names
+                )
+            except TooManyGroups:
+                raise DataError(self._explain_groups(target), name) from None
+        return codes
 
     def _learn(self, name: str) -> list[Any]:
         """The categories in the library's order: an engine's own may be another."""
-        feed = self._plan.make_feed([name], open_stream(pa.table({name: self._category_values[name]})))
+        feed = self._plan.make_feed([name], open_stream(pa.table({name: self._category_values[name]["value_"]})))
         try:
             feed.learn()
         except DataError as error:
@@ -307,16 +359,13 @@ class _Reducer:
             return np.zeros(len(column))
         feed = self._plan.make_feed([target], open_stream(pa.table({target: column})))
         feed.set_categories(0, self._categories[target])
-        codes = []
-        while len(part := feed.read(1 << 17)[0]) > 0:
-            codes.append(part)
-        return np.concatenate([*codes, np.zeros(0)])
+        return np.concatenate([*_read_codes(feed), np.zeros(0)])
 
     def _invalid_values(self, target: str | None) -> list[Any]:
         """The target's values that are declared missing, as they stand in its column."""
         if target is None:
             return []
-        values = self._category_values[target]
+        values = self._category_values[target]["value_"].combine_chunks()
         is_invalid = np.isnan(self._encode(target, pa.chunked_array([values])))
         return [value for value in values.filter(pa.array(is_invalid)).to_pylist() if value is not None]
 
@@ -364,6 +413,12 @@ class _Reducer:
         if target is not None:
             advice = f"pre-bin it by max_distinct, below its number of values, or {advice}"
         return f"there are more than max_groups={limit} {values}: {advice}"
+
+
+def _read_codes(feed: _core.Feed) -> Iterator[np.ndarray[Any, Any]]:
+    """Those of its only column; NaN for a missing one."""
+    while len(part := feed.read(1 << 17)[0]) > 0:
+        yield part
 
 
 def _changed(sign: str) -> StreamError:

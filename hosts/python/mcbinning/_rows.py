@@ -8,8 +8,9 @@ from ._progress import Report
 from ._settings import RunSettings
 
 
-def bin_rows(plan: Plan, settings: RunSettings, report: Report | None) -> _core.Bins:
-    return plan.open_feed(settings.temp_dir).bin(
+def bin_rows(plan: Plan, feed: _core.Feed, settings: RunSettings, report: Report | None) -> _core.Bins:
+    """`plan.open_feed` has given the plan and the feed."""
+    return feed.bin(
         [plan.names.index(attribute) for attribute, _ in plan.pairs],
         [plan.names.index(target) for _, target in plan.pairs if target is not None] or None,
         target=None if plan.target is None else plan.names.index(plan.target),

@@ -9,7 +9,8 @@ from ._rows import bin_rows
 from ._settings import Reducing, RunSettings
 
 
-def run(plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progress) -> _core.Bins:
+def run(plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progress) -> tuple[Plan, _core.Bins]:
+    """The plan without the columns that turned out not to be categories, and its bins."""
     source = plan.source
     is_reduced = source.is_reduced if reducing.reduce is None else reducing.reduce != "rows"
     if reducing.reduce == "engine" and source.open_engine is None:
@@ -17,12 +18,13 @@ def run(plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progres
             "reduce='engine' needs data that an engine has: files that DuckDB reads, a relation of DuckDB's, a Spark "
             "frame, or what query_source gives"
         )
-    with reporting(progress, plan.names, len(plan.pairs), source.rows, not is_reduced) as report:
-        if is_reduced and source.open_engine is not None:
-            from ._reduction import bin_reduced
+    if is_reduced and source.open_engine is not None:
+        from ._reduction import bin_reduced
 
-            return bin_reduced(plan, settings, reducing, report)
-        bins = bin_rows(plan, settings, report)
-        if reducing.reduce == "auto":
-            bins.reduction = _core.Reduction("", "no engine has the data", 0, True, [])
-        return bins
+        return bin_reduced(plan, settings, reducing, progress)
+    plan, feed = plan.open_feed(settings.temp_dir)
+    with reporting(progress, plan.names, len(plan.pairs), source.rows) as report:
+        bins = bin_rows(plan, feed, settings, report)
+    if reducing.reduce == "auto":
+        bins.reduction = _core.Reduction("", "no engine has the data", 0, True, [])
+    return plan, bins

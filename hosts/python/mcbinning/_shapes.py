@@ -133,9 +133,9 @@ def sum_weights(weights: Weights) -> str:
 
 
 def list_values(column: str, limit: int) -> str:
-    """All values of a column, whatever the weights of their rows."""
+    """All values of a column, whatever the weights of their rows, and the number of these."""
     name = quote_name(column)
-    return f"SELECT {name} AS value_ FROM {ROWS} GROUP BY {name} LIMIT {limit}"
+    return f"SELECT {name} AS value_, COUNT(*) AS rows_ FROM {ROWS} GROUP BY {name} LIMIT {limit}"
 
 
 def count_rows() -> str:

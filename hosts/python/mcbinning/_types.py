@@ -2,9 +2,11 @@
 
 from __future__ import annotations
 
-from collections.abc import Mapping
+from collections.abc import Mapping, Sequence
 from typing import Any, Literal
 
+CategoryOrder = Literal["rate", "text"] | Mapping[Any, Sequence[str]]
+"""How categories that have no order of their own are ordered; or by column their order."""
 Closed = Literal["right", "left"]
 Distinct = Literal["exact", "approximate"]
 Encoding = Literal["number", "label", "woe", "rate"]

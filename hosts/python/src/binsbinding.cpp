@@ -242,6 +242,15 @@ void BindVariable(nb::module_& module)
         .def_prop_ro("kind", &GetKind)
         .def_ro("time_zone", &Variable::timeZone)
         .def_prop_ro("categories", &GetCategories)
+        .def_prop_ro("category_order",
+                     [](const Variable& self)
+                     {
+                         return self.categoryOrder
+                                    ? std::optional<std::string>(GetName(kCategoryOrderNames, *self.categoryOrder))
+                                    : std::nullopt;
+                     })
+        .def_prop_ro("order_target", [](const Variable& self)
+                     { return self.orderTarget.empty() ? std::nullopt : std::optional(self.orderTarget); })
         .def_prop_ro("rounding",
                      [](const Variable& self) {
                          return self.role == VariableRole::kWeight ? std::optional<std::string>(GetName(self.rounding))
@@ -286,7 +295,8 @@ void BindAttributeBins(nb::module_& module)
         .def_prop_ro("information_values", &GetInformationValues)
         .def("find_bin", [](Self self, double value) { return FindBin(self.cutPoints, self.isRightClosed, value); })
         .def("codes", &GetCodes, "encode"_a)
-        .def("alone", &MakeAlone);
+        .def("alone", &MakeAlone)
+        .def("by_category", &SplitByCategory);
 }
 
 /// The bins with some of the results alone, in the order of `indices`.

@@ -81,6 +81,7 @@ public:
 
     /// Declares that the categories have this order. Without it the ascending order is theirs.
     DeclaredOrder<Key>& GetDeclaredOrder() { return fDeclaredOrder; }
+    const DeclaredOrder<Key>& GetDeclaredOrder() const { return fDeclaredOrder; }
 
     /// By code: the rank of the category in the declared or else in the ascending order.
     std::vector<std::size_t> GetRanks() const

@@ -1,6 +1,8 @@
 #include "hosts/python/src/feed.h"
 
+#include "bins/categorytally.h"
 #include "bins/jsonnames.h"
+#include "hosts/python/src/calls.h"
 #include "hosts/python/src/columntype.h"
 #include "hosts/python/src/faults.h"
 #include "hosts/python/src/libraryblocks.h"
@@ -9,6 +11,7 @@
 
 #include <nanobind/stl/string.h>
 
+#include <algorithm>
 #include <limits>
 
 namespace nb = nanobind;
@@ -119,7 +122,7 @@ ValueKind ValueKindOf(const std::string& kind)
     return ValueKind::kNumber;
 }
 
-WeightTally Tally(BlockSource& source, const std::vector<Field>& fields)
+WeightTally Tally(BlockSource& source, std::vector<Field>& fields)
 {
     PolledBlocks polled(source);
     TalliedBlocks blocks(polled, fields);
@@ -131,9 +134,10 @@ WeightTally Tally(BlockSource& source, const std::vector<Field>& fields)
 } // namespace
 
 std::size_t Feed::AddField(const std::string& name, const std::string& use, int column,
-                           const std::optional<Array>& array, const std::string& rounding)
+                           const std::optional<Array>& array, const std::string& rounding, bool isOptional)
 {
     Field field;
+    field.isOptional = isOptional;
     field.name = name;
     field.use = UseOf(use);
     field.column = array ? -1 : column;
@@ -192,6 +196,67 @@ nb::list Feed::GetCategories(std::size_t index) const
     append(field.texts);
     append(field.numbers);
     return categories;
+}
+
+std::string Feed::DescribeUnusable(std::size_t index) const
+{
+    const Field& field = fFields.at(index);
+    std::vector<std::string> categories = field.texts.GetKeys(field.isComplete);
+    if (field.hasTooMany)
+        categories.resize(kMostCategories + 1);
+    return ::DescribeUnusable(categories, field.numCoded);
+}
+
+void Feed::Drop(std::size_t index)
+{
+    if (fSpool)
+        fSpool->Drop(index);
+    fFields.erase(fFields.begin() + static_cast<std::ptrdiff_t>(index));
+    fArrays.erase(fArrays.begin() + static_cast<std::ptrdiff_t>(index));
+}
+
+std::vector<CategoryCodes> Feed::CountCategories(const std::vector<std::pair<int, std::optional<int>>>& pairs,
+                                                 double rareShare, bool isByRate)
+{
+    std::optional<TableBlocks> table;
+    if (!fSpool)
+        table.emplace(GetBatches(), fFields);
+    LibraryBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table, fFields, GetTally());
+    Interrupts interrupts;
+    const std::vector<std::shared_ptr<const Variable>> variables = MakeVariables(fFields, std::nullopt);
+    std::vector<CategoryTally::Pair> counted;
+    for (const auto& [attribute, target] : pairs) counted.push_back({attribute, target});
+    CategoryTally tally(variables, counted);
+    {
+        const nb::gil_scoped_release released;
+        BlockRecords records(blocks, fFields.size(), interrupts);
+        while (records.HasNext()) tally.Add(*records.Next());
+    }
+    interrupts.Rethrow();
+    if (fSpool)
+        fSpool->Rewind();
+    std::vector<CategoryCodes> codes;
+    for (const CategoryTally::Pair& pair : counted)
+    {
+        const Variable& attribute = *variables[static_cast<std::size_t>(pair.attribute)];
+        codes.push_back(MakeCategoryCodes(attribute.categories, *tally.Find(pair), true, rareShare, isByRate));
+    }
+    return codes;
+}
+
+void Feed::SetCodes(std::size_t index, const CategoryCodes& codes, const std::string& order, const std::string& target)
+{
+    Field& field = fFields.at(index);
+    field.recoding.names = codes.names;
+    for (const std::string& text : field.texts.GetKeys(field.isComplete))
+    {
+        const auto found = std::find(codes.names.begin(), codes.names.end(), text);
+        const auto own = static_cast<std::size_t>(found - codes.names.begin());
+        field.recoding.codes.push_back(static_cast<double>(found == codes.names.end() ? codes.rareCode.value() : own));
+    }
+    for (const auto& [name, value] : kCategoryOrderNames)
+        field.categoryOrder = order == name ? value : field.categoryOrder;
+    field.orderTarget = target;
 }
 
 std::pair<std::int64_t, double> Feed::GetWeights() const
@@ -258,11 +323,7 @@ Bins Feed::Bin(const Settings& settings, const RunRequest& request, const std::o
     std::optional<TableBlocks> table;
     if (!fSpool)
         table.emplace(GetBatches(), fFields);
-    TallyArray();
-    WeightTally tally = fWeights.value_or(WeightTally());
-    if (const std::optional<std::size_t> index = FindWeight(fFields))
-        tally.rounding = fFields[*index].rounding;
-    LibraryBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table, fFields, tally);
+    LibraryBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table, fFields, GetTally());
     Interrupts interrupts;
     Bins bins = Describe(settings, request.target, dataName);
     {
@@ -294,6 +355,16 @@ Evaluation Feed::Count(Bins first, const std::vector<Counted>& counted, const st
 Batches* Feed::GetBatches() const
 {
     return fTable.is_none() ? nullptr : nb::cast<Table&>(fTable).batches.get();
+}
+
+/// Of all weights.
+WeightTally Feed::GetTally()
+{
+    TallyArray();
+    WeightTally tally = fWeights.value_or(WeightTally());
+    if (const std::optional<std::size_t> index = FindWeight(fFields))
+        tally.rounding = fFields[*index].rounding;
+    return tally;
 }
 
 /// An array of weights is at hand, and can be read at any time.

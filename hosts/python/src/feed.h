@@ -2,6 +2,7 @@
 #define MCBINNING_FEED_H
 
 #include "bins/bins.h"
+#include "bins/categoryorder.h"
 #include "bins/weightgrid.h"
 #include "hosts/python/src/arrays.h"
 #include "hosts/python/src/batches.h"
@@ -34,10 +35,11 @@ public:
     /// \param table a Table, or None.
     explicit Feed(nanobind::object table) : fTable(std::move(table)) {}
 
-    /// Its values are in a column of the table or in the array, which has one for each record.
+    /// Its values are in a column of the table or in the array, which has one for each record. With `isOptional` more
+    /// categories than a run takes are no error.
     /// \return its index.
     std::size_t AddField(const std::string& name, const std::string& use, int column, const std::optional<Array>& array,
-                         const std::string& rounding);
+                         const std::string& rounding, bool isOptional);
 
     void DeclareMissing(std::size_t index, const std::vector<double>& values,
                         std::optional<std::pair<double, double>> interval, const std::vector<std::string>& texts);
@@ -51,6 +53,20 @@ public:
     /// The categories: by code where all have been told, else those known by now, in the order that their column
     /// declares or else in ascending order.
     nanobind::list GetCategories(std::size_t index) const;
+
+    /// Once the records have been read for it: why the field, a column of text, is not binned unless it is named.
+    std::string DescribeUnusable(std::size_t index) const;
+
+    /// Leaves the field out. Later ones move down by one.
+    void Drop(std::size_t index);
+
+    /// Reads the records, whose categories and weights are known, for the weights of the attributes' categories, and
+    /// gives each of these pairs of fields codes for the attribute, whose categories are texts.
+    std::vector<CategoryCodes> CountCategories(const std::vector<std::pair<int, std::optional<int>>>& pairs,
+                                               double rareShare, bool isByRate);
+
+    /// Tells the codes of the categories, which are texts, and what has decided on their order.
+    void SetCodes(std::size_t index, const CategoryCodes& codes, const std::string& order, const std::string& target);
 
     /// How many weights are above 0, and the largest. Known once the records have been read for it, and where they
     /// were read by another feed, from there.
@@ -82,6 +98,7 @@ public:
 private:
     Batches* GetBatches() const;
     void TallyArray();
+    WeightTally GetTally();
 
     nanobind::object fTable;
     std::vector<Field> fFields;

@@ -8,6 +8,7 @@
 #include <mcobnqrt/binnumericusermissing.h>
 #include <mcobnqrt/binstringusermissing.h>
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <utility>
@@ -51,6 +52,21 @@ struct Field
     Unseen unseen = Unseen::kChanged;
     std::vector<std::string> unseenNames; ///< the first few of the unseen categories that are kept
 
+    /// More categories than a run takes are no error, but told by `hasTooMany`.
+    bool isOptional = false;
+    bool hasTooMany = false;
+    std::int64_t numCoded = 0; ///< records with a category, once they have been read to learn of them
+
+    /// The codes that the library takes, where they are others than those of `texts` in their order.
+    struct Recoding
+    {
+        std::vector<std::string> names; ///< by code of the library
+        std::vector<double> codes;      ///< the code of the library, by that in the order of `texts`
+    };
+    Recoding recoding;
+    std::optional<CategoryOrder> categoryOrder; ///< nothing for that which the column has
+    std::string orderTarget;                    ///< the name of the target whose rates have ordered the categories
+
     /// Of a weight.
     WeightRounding rounding = WeightRounding::kNone;
 
@@ -61,7 +77,17 @@ struct Field
 
     bool HasMissingNumbers() const { return missingNumbers.GetNDiscreteValues() > 0 || missingNumbers.HasInterval(); }
 
-    std::size_t GetNumCategories() const { return numbers.GetSize() + texts.GetSize(); }
+    std::size_t GetNumCategories() const
+    {
+        return recoding.names.empty() ? numbers.GetSize() + texts.GetSize() : recoding.names.size();
+    }
+
+    /// Of texts.
+    CategoryOrder GetCategoryOrder() const
+    {
+        const bool isDeclared = !texts.GetDeclaredOrder().IsEmpty();
+        return categoryOrder.value_or(isDeclared ? CategoryOrder::kDeclared : CategoryOrder::kText);
+    }
 
     std::vector<std::size_t> GetRanks() const { return texts.GetSize() > 0 ? texts.GetRanks() : numbers.GetRanks(); }
 };

@@ -2,6 +2,8 @@
 
 #include <mcobnqrt/mccommon.h>
 
+#include <algorithm>
+
 using MCMV::gMissingValue;
 
 namespace
@@ -19,6 +21,15 @@ void ConvertValues(const Field& field, InfiniteValues& encoder, double* values, 
     }
 }
 
+void ConvertCodes(const Field& field, double* codes, std::size_t count)
+{
+    for (std::size_t i = 0; i < count && !field.recoding.codes.empty(); ++i)
+    {
+        if (codes[i] >= 0.0)
+            codes[i] = field.recoding.codes[static_cast<std::size_t>(codes[i])];
+    }
+}
+
 } // namespace
 
 std::optional<std::size_t> FindWeight(const std::vector<Field>& fields)
@@ -31,8 +42,8 @@ std::optional<std::size_t> FindWeight(const std::vector<Field>& fields)
     return std::nullopt;
 }
 
-TalliedBlocks::TalliedBlocks(BlockSource& source, const std::vector<Field>& fields)
-    : fSource(source), fWeight(FindWeight(fields))
+TalliedBlocks::TalliedBlocks(BlockSource& source, std::vector<Field>& fields)
+    : fSource(source), fFields(fields), fWeight(FindWeight(fields))
 {
     if (fWeight)
         fTally.rounding = fields[*fWeight].rounding;
@@ -42,6 +53,13 @@ bool TalliedBlocks::Next(Block& block)
 {
     if (!fSource.Next(block))
         return false;
+    for (std::size_t i = 0; i < fFields.size(); ++i)
+    {
+        const double* const values = block.GetField(i);
+        if (fFields[i].use == Field::Use::kCategory)
+            fFields[i].numCoded +=
+                std::count_if(values, values + block.numRows, [](double code) { return code >= 0.0; });
+    }
     if (!fWeight)
         return true;
     const double* const weights = block.GetField(*fWeight);
@@ -68,6 +86,8 @@ bool LibraryBlocks::Next(Block& block)
             ConvertWeights(block.GetField(i), block.numRows);
         else if (fFields[i].use == Field::Use::kAttribute)
             ConvertValues(fFields[i], fValues[i], block.GetField(i), block.numRows);
+        else if (fFields[i].use == Field::Use::kCategory)
+            ConvertCodes(fFields[i], block.GetField(i), block.numRows);
     }
     return true;
 }

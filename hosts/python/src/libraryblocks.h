@@ -14,12 +14,12 @@
 /// The index of the weight, if there is one.
 std::optional<std::size_t> FindWeight(const std::vector<Field>& fields);
 
-/// Passes blocks on as they are, and tallies their weights.
+/// Passes blocks on as they are, tallies their weights, and counts the records that have a category.
 class TalliedBlocks : public BlockSource
 {
 public:
-    /// Both stay the caller's.
-    TalliedBlocks(BlockSource& source, const std::vector<Field>& fields);
+    /// Both stay the caller's; the counts go to the fields.
+    TalliedBlocks(BlockSource& source, std::vector<Field>& fields);
 
     bool Next(Block& block) override;
 
@@ -27,12 +27,13 @@ public:
 
 private:
     BlockSource& fSource;
+    std::vector<Field>& fFields;
     std::optional<std::size_t> fWeight;
     WeightTally fTally;
 };
 
 /// Passes blocks on in the form that the library takes: with weights on their grid, with stand-ins for infinite values,
-/// and with all that is declared missing as gMissingValue.
+/// with all that is declared missing as gMissingValue, and with the codes that the library takes.
 class LibraryBlocks : public BlockSource
 {
 public:

@@ -127,6 +127,18 @@ NB_MODULE(_core, module)
     BindBins(module);
     BindEvaluation(module);
 
+    module.def("describe_unusable", &DescribeUnusable, "categories"_a, "records"_a);
+    nb::class_<CategoryCodes>(module, "CategoryCodes")
+        .def(
+            "__init__",
+            [](CategoryCodes* self, std::vector<std::string> names) {
+                new (self) CategoryCodes{std::move(names), std::nullopt, {}};
+            },
+            "names"_a)
+        .def_ro("names", &CategoryCodes::names)
+        .def_ro("rare_code", &CategoryCodes::rareCode)
+        .def_ro("rare", &CategoryCodes::rare);
+
     nb::class_<Table>(module, "Table")
         .def_static(
             "from_stream",
@@ -143,9 +155,13 @@ NB_MODULE(_core, module)
     nb::class_<Feed>(module, "Feed")
         .def(nb::init<nb::object>(), "table"_a.none())
         .def("add_field", &Feed::AddField, "name"_a, "use"_a, nb::kw_only(), "column"_a = -1,
-             "array"_a.none() = nb::none(), "rounding"_a = "none")
+             "array"_a.none() = nb::none(), "rounding"_a = "none", "optional"_a = false)
         .def("declare_missing", &Feed::DeclareMissing, "index"_a, "values"_a, "interval"_a.none(), "texts"_a)
         .def("set_categories", &Feed::SetCategories, "index"_a, "categories"_a, "unseen"_a = "changed")
+        .def("describe_unusable", &Feed::DescribeUnusable, "index"_a)
+        .def("drop", &Feed::Drop, "index"_a)
+        .def("count_categories", &Feed::CountCategories, "pairs"_a, nb::kw_only(), "rare"_a, "by_rate"_a)
+        .def("set_codes", &Feed::SetCodes, "index"_a, "codes"_a, "order"_a, "target"_a = "")
         .def("set_value_kind", &Feed::SetValueKind, "index"_a, "kind"_a)
         .def("categories", &Feed::GetCategories, "index"_a)
         .def("weights", &Feed::GetWeights)

@@ -58,7 +58,10 @@ std::shared_ptr<Variable> MakeVariable(const Field& field, bool isTarget)
         variable->role = VariableRole::kTarget;
     variable->valueKind = field.valueKind;
     variable->timeZone = field.timeZone;
-    variable->categories = field.texts.GetKeys(field.isComplete);
+    variable->categories = field.recoding.names.empty() ? field.texts.GetKeys(field.isComplete) : field.recoding.names;
+    if (variable->kind == VariableKind::kStringCategorical)
+        variable->categoryOrder = field.GetCategoryOrder();
+    variable->orderTarget = field.orderTarget;
     for (const double number : field.numbers.GetKeys(field.isComplete))
         variable->categories.push_back(FormatCategoryNumber(number));
     variable->rounding = field.rounding;

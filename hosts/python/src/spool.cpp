@@ -1,6 +1,7 @@
 #include "hosts/python/src/spool.h"
 
 #include <cerrno>
+#include <cstddef>
 #include <cstdlib>
 #include <system_error>
 #include <unistd.h>
@@ -33,13 +34,13 @@ std::FILE* OpenNameless(const std::string& directory)
 } // namespace
 
 Spool::Spool(BlockSource& source, const std::vector<Field>& fields, const std::string& directory)
-    : fNumFields(fields.size()), fFile(OpenNameless(directory))
+    : fAreKept(fields.size(), true), fFile(OpenNameless(directory))
 {
-    Block block(fNumFields);
+    Block block(fields.size());
     while (source.Next(block))
     {
         bool isWritten = std::fwrite(&block.numRows, sizeof(block.numRows), 1, fFile.get()) == 1;
-        for (std::size_t field = 0; field < fNumFields && isWritten; ++field)
+        for (std::size_t field = 0; field < fields.size() && isWritten; ++field)
             isWritten = std::fwrite(block.GetField(field), sizeof(double), block.numRows, fFile.get()) == block.numRows;
         if (!isWritten)
             ThrowSystemError("can't write a temporary file in " + directory);
@@ -68,18 +69,37 @@ bool Spool::Next(Block& block)
             ThrowSystemError("can't read a temporary file");
         return false;
     }
-    for (std::size_t field = 0; field < fNumFields; ++field)
+    std::size_t field = 0;
+    for (const bool isKept : fAreKept)
     {
+        if (!isKept)
+        {
+            if (std::fseek(fFile.get(), static_cast<long>(block.numRows * sizeof(double)), SEEK_CUR) != 0)
+                ThrowSystemError("can't read a temporary file");
+            continue;
+        }
         double* const values = block.GetField(field);
         if (std::fread(values, sizeof(double), block.numRows, fFile.get()) != block.numRows)
             ThrowSystemError("can't read a temporary file");
-        if (fNewCodes[field].empty())
-            continue;
-        for (std::size_t i = 0; i < block.numRows; ++i)
+        const std::vector<double>& newCodes = fNewCodes[field++];
+        for (std::size_t i = 0; i < block.numRows && !newCodes.empty(); ++i)
         {
             if (values[i] >= 0.0)
-                values[i] = fNewCodes[field][static_cast<std::size_t>(values[i])];
+                values[i] = newCodes[static_cast<std::size_t>(values[i])];
         }
     }
     return true;
+}
+
+void Spool::Drop(std::size_t field)
+{
+    fNewCodes.erase(fNewCodes.begin() + static_cast<std::ptrdiff_t>(field));
+    for (auto isKept = fAreKept.begin();; ++isKept)
+    {
+        if (*isKept && field-- == 0)
+        {
+            *isKept = false;
+            return;
+        }
+    }
 }

@@ -21,15 +21,22 @@ public:
     /// \throw std::system_error if the file can't be read.
     bool Next(Block& block) override;
 
+    /// Begins again with the first record.
+    void Rewind() { std::rewind(fFile.get()); }
+
+    /// Leaves the field out from now on: later ones move down by one.
+    void Drop(std::size_t field);
+
 private:
     struct Close
     {
         void operator()(std::FILE* file) const { std::fclose(file); }
     };
 
-    std::size_t fNumFields;
+    std::vector<bool> fAreKept; ///< by field of the file
     std::unique_ptr<std::FILE, Close> fFile;
-    std::vector<std::vector<double>> fNewCodes; ///< by field and code of arrival; empty for a field without categories
+    std::vector<std::vector<double>>
+        fNewCodes; ///< by kept field and code of arrival; empty for a field without categories
 };
 
 #endif

@@ -1,5 +1,6 @@
 #include "hosts/python/src/tableblocks.h"
 
+#include "bins/categoryorder.h"
 #include "bins/numbers.h"
 #include "hosts/python/src/faults.h"
 
@@ -19,8 +20,6 @@ namespace
 
 using MCMV::gMissingValue;
 
-/// A tuple of the library holds a code in 8 bits.
-constexpr std::size_t kMaxCategories = 256;
 constexpr double kMissingCode = -1.0;
 
 std::string Describe(std::string_view text)
@@ -82,8 +81,13 @@ double EncodeCategory(Field& field, Table& table, const View& category, std::int
         return KeepUnseen(field, GetName(category));
     if (field.isComplete)
         return EncodeUnseen(field, Describe(category), row);
-    if (table.GetSize() >= kMaxCategories)
-        throw DataFault("there are more than 256 categories", field.name, row);
+    if (table.GetSize() >= kMostCategories)
+    {
+        if (!field.isOptional)
+            throw DataFault("there are more than 256 categories", field.name, row);
+        field.hasTooMany = true;
+        return kMissingCode;
+    }
     return static_cast<double>(table.Encode(category));
 }
 
