@@ -90,6 +90,7 @@ AttributeBins Recut(const AttributeBins& bins, const std::vector<double>& cutPoi
     recut.numDistinct.reset();
     recut.minimum = recut.maximum = std::nullopt;
     recut.missing.reset();
+    recut.categories.clear();
     return recut;
 }
 

@@ -129,6 +129,7 @@ TEST_F(McbinCategories, ColumnsWithoutUsableCategoriesAreLeftOutWithTheReason)
               Run("supervised data.csv --target y --attributes id").err);
     // Five rows for a category are enough, four are not.
     const std::string few = "c,y\np,0\np,1\nq,0\nq,1\np,0\np,1\nq,0\nq,1\np,0\n";
-    EXPECT_NE(std::string::npos, RunOn(few, "supervised", "--target y").err.find("c (2 categories in 9 records, such as"));
+    EXPECT_NE(std::string::npos,
+              RunOn(few, "supervised", "--target y").err.find("c (2 categories in 9 records, such as"));
     EXPECT_NE(std::string::npos, RunOn(few + "p,1\n", "supervised", "--target y").out.find("c by y"));
 }

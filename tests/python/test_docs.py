@@ -21,5 +21,5 @@ def test_code_of_the_guide_runs(code, tmp_path, monkeypatch):
     plt.close("all")
 
 
-def test_the_guides_have_their_seven_walks():
-    assert len(BLOCKS) == 7 and len(BLOCKS[0].splitlines()) == 10
+def test_the_guides_have_their_eight_walks():
+    assert len(BLOCKS) == 8 and len(BLOCKS[0].splitlines()) == 10

@@ -327,7 +327,7 @@ def test_the_best_attributes_are_selected_and_scored(iris):
 
 
 def test_copies_and_pickles_are_equal_to_the_last_bit(mixed):
-    result = mb.supervised_bins(mixed.assign(kind=mixed["y"], id=map(str, mixed.index)), "y", missing={"x": 0.1})
+    result = mb.supervised_bins(mixed.assign(kind=mixed["y"], id=list(map(str, mixed.index))), "y", missing={"x": 0.1})
     fitted = mb.SupervisedBinner(encode="interval").fit(mixed[["x", "zoned"]], mixed["y"])
 
     for again in (pickle.loads(pickle.dumps(result)), copy.deepcopy(result), copy.copy(result)):
