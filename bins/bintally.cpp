@@ -39,6 +39,8 @@ BinTally::BinTally(const AttributeBins& bins, bool hasTarget) : fKnown(bins), fB
     const std::size_t numCategories = fHasTarget ? bins.target->categories.size() : 0;
     fBins.missing = MakeGroup(numCategories);
     fStrangers.unseen = MakeGroup(numCategories);
+    if (bins.attribute->IsCategorical() && bins.HasBins())
+        fBins.categories.resize(bins.attribute->categories.size(), MakeGroup(numCategories));
 }
 
 void BinTally::Add(const Binner::Found& found, std::optional<std::size_t> code, double weight)
@@ -55,6 +57,8 @@ void BinTally::Add(const Binner::Found& found, std::optional<std::size_t> code, 
     else
     {
         AddTo(fBins.bins[*found.bin], code, weight);
+        if (!fBins.categories.empty())
+            AddTo(fBins.categories[static_cast<std::size_t>(found.value)], code, weight);
         fBins.weight += weight;
         AddValue(found.value, weight);
     }
