@@ -19,11 +19,9 @@ constexpr double kLargest = std::numeric_limits<double>::max();
 class Expression
 {
 public:
-    Expression(const BinColumn& column, const SqlOptions& options, const std::vector<std::string>& missingTexts)
-        : fBins(*column.bins), fVariable(*column.bins->attribute), fOptions(options),
-          fName(Enclose(fVariable.name, '"')), fAlias(Enclose(column.name, '"'))
+    Expression(const AttributeBins& bins, const SqlOptions& options, const std::vector<std::string>& missingTexts)
+        : fBins(bins), fVariable(*bins.attribute), fOptions(options), fName(Enclose(fVariable.name, '"'))
     {
-        MakeResults();
         if (options.isCast && fVariable.kind != VariableKind::kStringCategorical)
         {
             fMissingTexts = &missingTexts;
@@ -32,34 +30,44 @@ public:
         }
     }
 
-    std::string Make() const
+    /// Gives what the encoding of the options has for each bin.
+    std::string Make()
     {
-        return "CASE\n" + MakeTextBranch() + "  WHEN " + MakeMissingCondition() + " THEN " + fMissing + "\n" +
-               MakeBranches() + "END AS " + fAlias;
+        const Codes codes = MakeCodes(fBins, fOptions.encoding);
+        if (fOptions.encoding == Encoding::kWeightOfEvidence || fOptions.encoding == Encoding::kRate)
+            return Make(codes);
+        fMissing = "NULL";
+        if (fOptions.encoding == Encoding::kLabel)
+        {
+            for (const std::string& label : MakeLabels(fBins)) fResults.push_back(Enclose(label, '\''));
+        }
+        else
+        {
+            for (const double code : codes.bins) fResults.push_back(FormatNumber(code));
+        }
+        return MakeCase();
+    }
+
+    /// Gives the codes, as doubles.
+    std::string Make(const Codes& codes)
+    {
+        fMissing = codes.missing ? MakeDouble(*codes.missing) : "NULL";
+        for (const double code : codes.bins) fResults.push_back(MakeDouble(code));
+        return MakeCase();
     }
 
 private:
+    std::string MakeCase() const
+    {
+        return "CASE\n" + MakeTextBranch() + "  WHEN " + MakeMissingCondition() + " THEN " + fMissing + "\n" +
+               MakeBranches() + "END";
+    }
+
     std::string MakeBranches() const
     {
         if (fVariable.IsCategorical())
             return MakeCategoryBranches();
         return fVariable.valueKind == ValueKind::kBoolean ? MakeBooleanBranches() : MakeNumberBranches();
-    }
-
-    void MakeResults()
-    {
-        const Codes codes = MakeCodes(fBins, fOptions.encoding);
-        fMissing = codes.missing ? MakeDouble(*codes.missing) : "NULL";
-        if (fOptions.encoding == Encoding::kLabel)
-        {
-            for (const std::string& label : MakeLabels(fBins)) fResults.push_back(Enclose(label, '\''));
-            return;
-        }
-        for (const double code : codes.bins)
-        {
-            const bool isNumber = fOptions.encoding == Encoding::kNumber;
-            fResults.push_back(isNumber ? FormatNumber(code) : MakeDouble(code));
-        }
     }
 
     /// With an exponent, without which some databases take a number for a decimal.
@@ -205,7 +213,6 @@ private:
     const Variable& fVariable;
     const SqlOptions& fOptions;
     std::string fName;
-    std::string fAlias;
     std::string fText;                                       ///< of a column that is cast: the column itself
     const std::vector<std::string>* fMissingTexts = nullptr; ///< of a column that is cast
     std::vector<std::string> fResults;                       ///< by bin
@@ -220,9 +227,18 @@ std::string ToSql(const Bins& bins, const SqlOptions& options)
     for (const auto& variable : bins.variables) names.push_back(variable->name);
     std::vector<std::string> expressions;
     for (const BinColumn& column : MakeBinColumns(bins, names, options.encoding))
-        expressions.push_back(Expression(column, options, bins.missingTexts).Make());
+    {
+        const std::string expression = Expression(*column.bins, options, bins.missingTexts).Make();
+        expressions.push_back(expression + " AS " + Enclose(column.name, '"'));
+    }
     if (options.table.empty())
         return Join(expressions, ",\n") + (expressions.empty() ? "" : "\n");
     expressions.insert(expressions.begin(), "*");
     return "SELECT " + Join(expressions, ",\n") + "\nFROM " + options.table + "\n";
+}
+
+std::string ToSql(const AttributeBins& bins, const Codes& codes, const SqlOptions& options,
+                  const std::vector<std::string>& missingTexts)
+{
+    return Expression(bins, options, missingTexts).Make(codes);
 }

@@ -26,4 +26,9 @@ struct SqlOptions
 /// \throw std::invalid_argument if a result has not the encoding, or a weight of evidence is infinite.
 std::string ToSql(const Bins& bins, const SqlOptions& options);
 
+/// The CASE expression of one attribute, which gives these codes, as doubles, whatever the encoding of the options.
+/// \param missingTexts of all columns of a text file.
+std::string ToSql(const AttributeBins& bins, const Codes& codes, const SqlOptions& options,
+                  const std::vector<std::string>& missingTexts);
+
 #endif

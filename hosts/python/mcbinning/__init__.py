@@ -32,6 +32,7 @@ from ._status import Status
 
 if _TYPE_CHECKING:
     from ._estimators import EqualFrequencyBinner, SupervisedBinner
+    from ._scorecard import Scorecard
     from ._scores import information_gain, information_value
 
 __all__ = [
@@ -47,6 +48,7 @@ __all__ = [
     "NoCutPointsWarning",
     "NoValidValuesWarning",
     "NotBinnedWarning",
+    "Scorecard",
     "SingleCategoryWarning",
     "SingleValueWarning",
     "Status",
@@ -63,6 +65,7 @@ __all__ = [
 
 _OF_SKLEARN = {
     "EqualFrequencyBinner": "_estimators",
+    "Scorecard": "_scorecard",
     "SupervisedBinner": "_estimators",
     "information_gain": "_scores",
     "information_value": "_scores",

@@ -15,13 +15,22 @@ _TOKEN = re.compile(r'"(?:[^"\\]|\\.)*"|[^\s"\[\]{}:,]+', re.DOTALL)
 
 def read_bins(source: str | os.PathLike[str]) -> _core.Bins:
     """Reads a text, or the file of a path. \\raise ValueError with the path of the fault, if it has one."""
+    name, content = _read(source)
+    return _core.Bins.read(_parse(content, name), name)
+
+
+def read_text(source: str | os.PathLike[str]) -> str:
+    """The text itself, or that of the file."""
+    return _read(source)[1].decode("utf-8").removeprefix("\ufeff")
+
+
+def _read(source: str | os.PathLike[str]) -> tuple[str, bytes]:
+    """What messages call the source, and what it holds."""
     named = os.fspath(source)
     if isinstance(source, str) and named.lstrip("\ufeff \t\r\n").startswith("{"):
-        name, content = "the text", named.encode("utf-8", "surrogatepass")
-    else:
-        with open(named, "rb") as file:
-            name, content = named, file.read()
-    return _core.Bins.read(_parse(content, name), name)
+        return "the text", named.encode("utf-8", "surrogatepass")
+    with open(named, "rb") as file:
+        return named, file.read()
 
 
 def write_text(text: str, path: str | os.PathLike[str] | None) -> str:

@@ -208,6 +208,17 @@ std::string WriteSql(const Bins& bins, bool isDuckDb, const std::string& encode,
     return ToSql(bins, {isDuckDb ? SqlDialect::kDuckDb : SqlDialect::kStandard, FindEncoding(encode), isCast, table});
 }
 
+/// The expression of one result, which gives the codes: by bin, and behind them that of a missing value.
+std::string WriteCase(const Bins& bins, std::size_t index, std::vector<double> codes, bool isDuckDb, bool isCast)
+{
+    Codes given;
+    given.missing = codes.back();
+    codes.pop_back();
+    given.bins = std::move(codes);
+    const SqlDialect dialect = isDuckDb ? SqlDialect::kDuckDb : SqlDialect::kStandard;
+    return ToSql(bins.results.at(index), given, {dialect, Encoding::kNumber, isCast, ""}, bins.missingTexts);
+}
+
 /// By bin, and behind them of a missing value; NaN where that has none.
 nb::object GetCodes(const AttributeBins& bins, const std::string& encode)
 {
@@ -386,6 +397,7 @@ void BindBins(nb::module_& module)
         .def("columns", &GetBinColumns, "taken"_a, "encode"_a)
         .def("to_json", &ToJson)
         .def("to_csv", &ToCsv)
+        .def("to_case", &WriteCase, "index"_a, "codes"_a, "duckdb"_a, "cast"_a)
         .def("to_sql", &WriteSql, "duckdb"_a, "encode"_a, "cast"_a, "table"_a);
     module.def("describe_not_json", [](long line) { return std::string(MakeNotJson(line).what()); });
     module.def("status_words",
