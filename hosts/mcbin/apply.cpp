@@ -73,7 +73,9 @@ std::vector<OutputColumn> MakeColumns(const TableReader& table, const Bins& bins
 
 std::string MakeHeader(const TableReader& table, const std::vector<OutputColumn>& columns, bool isInPlace)
 {
-    std::string header = table.GetHeader();
+    if (!table.GetHeader())
+        return "";
+    std::string header = *table.GetHeader();
     if (!isInPlace)
     {
         for (const OutputColumn& column : columns)
@@ -174,5 +176,7 @@ std::vector<std::string> ApplyBins(const ApplyOptions& options, Progress& progre
     }
     ThrowIfInterrupted(); // the signal may have ended what writes the table, and come a moment later
     output.Commit();
-    return DescribeUnbinned(bins);
+    std::vector<std::string> notes = table.GetNotes();
+    for (std::string& unbinned : DescribeUnbinned(bins)) notes.push_back(std::move(unbinned));
+    return notes;
 }

@@ -91,7 +91,7 @@ CLI::Option* AddRenamed(CLI::App& command, const std::string& name, const std::s
     return command.add_option(name, value, description)->check(check);
 }
 
-void AddDelimiter(CLI::App& command, TableOptions& table)
+void AddFormOfTable(CLI::App& command, TableOptions& table)
 {
     command
         .add_option_function<std::string>(
@@ -100,12 +100,27 @@ void AddDelimiter(CLI::App& command, TableOptions& table)
         ->check(MakeDelimiterCheck())
         ->option_text("CHAR")
         ->group("Input");
+    command
+        .add_flag_callback(
+            "--no-header", [&table] { table.hasHeader = false; },
+            "The first row is one of the data; the columns are called 'column 1', 'column 2' and so on")
+        ->group("Input");
+    command
+        .add_option_function<std::string>(
+            "--comment", [&table](const std::string& mark) { table.comment = mark.front(); },
+            "Lines that begin with this character are none of the table")
+        ->check(CLI::Validator(
+            [](const std::string& mark)
+            { return mark.size() == 1 && mark != "\"" ? "" : "'" + mark + "' is no single character, or a quote"; },
+            "", ""))
+        ->option_text("CHAR")
+        ->group("Input");
 }
 
 void AddTable(CLI::App& command, TableOptions& table)
 {
     command.add_option("DATA", table.file, kData)->required()->option_text("FILE");
-    AddDelimiter(command, table);
+    AddFormOfTable(command, table);
 }
 
 void AddMissing(CLI::App& command, std::vector<std::string>& missingText, bool& isBadMissing)
@@ -424,7 +439,7 @@ void AddEvaluate(CLI::App& app, Request& request)
                     "edited since; and the data, a delimited text file or - for standard input")
         ->required()
         ->option_text("[BINS.json] DATA");
-    AddDelimiter(command, options.table);
+    AddFormOfTable(command, options.table);
     AddRepeated(command, "--cuts", options.cuts,
                 "Makes the bins of cut points alone, without a file of bins; may be repeated", "COLUMN=18,25,40")
         ->group("Columns");

@@ -73,6 +73,7 @@ public:
         : fTable(table), fOptions(options), fMissingTexts(first.missingTexts)
     {
         fEvaluated.evaluation = BeginEvaluation(std::move(first));
+        fEvaluated.notes = table.GetNotes();
         const std::vector<std::string>& further = options.columns.missingText;
         fMissingTexts.insert(fMissingTexts.end(), further.begin(), further.end());
         for (std::size_t i = 0; i < GetFirst().results.size(); ++i)

@@ -81,7 +81,8 @@ Outcome FindBins(TableReader& table, const BinOptions& options, Progress& progre
     TableRecordSource source(table, plan, variables, progress);
     RunLibrary(bins, variables, source, options.tempDirectory, progress);
     progress.Erase();
-    outcome.notes = MakeNotes(bins, plan, variables, source);
+    outcome.notes = table.GetNotes();
+    for (std::string& note : MakeNotes(bins, plan, variables, source)) outcome.notes.push_back(std::move(note));
     return outcome;
 }
 

@@ -155,7 +155,6 @@ TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
         {"", ": the file is empty; its first line should name the columns"},
         {"x,y\n", ": there is no row below the header"},
         {"x,z\n1,2\n", ": no column is named 'y'; there are 'x', 'z'"},
-        {"x,y,x\n1,2,3\n", ", line 1: two columns are named 'x'"},
         {"x,y\n\"1\n\",a\n\n2\n", ", line 5: wrong number of fields: 1, but the header has 2"},
         {"x,y\n1,a\n2,\"b\n3,c\n", ", line 3: a quoted field in this row is never closed"},
         {"x,y\n1,a,b\n2,5\" disk\n", ", line 2: wrong number of fields: 3, but the header has 2"},
@@ -337,4 +336,72 @@ TEST_F(McbinInput, PairsBinForSeveralTargetsInOnePass)
               outcome.out)
         << outcome.err;
     EXPECT_EQ(1, RunOn(data, "supervised", "--pairs a:none").exitCode);
+}
+
+TEST_F(McbinInput, CompressedFilesAreReadAsWhatTheyStandFor)
+{
+    const std::string heights = kHeights;
+    Write("data.csv", heights);
+    Shell("gzip -c data.csv >one.gz; head -c 40 data.csv | gzip -c >two.gz; tail -c +41 data.csv | gzip -c >>two.gz; "
+          "cp two.gz padded.gz; head -c 512 /dev/zero >>padded.gz");
+    // A frame of zstd with one block that is stored as it is.
+    ASSERT_LT(heights.size(), 256u) << "its size is told in one byte";
+    const std::string stored = {static_cast<char>(heights.size()),
+                                static_cast<char>((heights.size() << 3U | 1U) & 255U),
+                                static_cast<char>(heights.size() >> 5U), '\0'};
+    Write("one.zst", "\x28\xB5\x2F\xFD\x20" + stored + heights);
+
+    for (const char* command :
+         {"mcbin supervised one.gz --target size", "mcbin supervised two.gz --target size",
+          "mcbin supervised padded.gz --target size", "cat two.gz | mcbin supervised - --target size",
+          "mcbin supervised one.zst --target size", "mcbin supervised - --target size <one.zst"})
+        EXPECT_EQ(kHeightsBySize, Shell(command).out) << command;
+    Shell("mcbin supervised data.csv --target size --format json >bins.json");
+    EXPECT_EQ(Run("apply bins.json data.csv").out, Run("apply bins.json two.gz").out);
+
+    struct Case
+    {
+        const char* spoil; ///< what makes a file of one.gz or one.zst
+        const char* words;
+    };
+    const Case cases[] = {
+        {"head -c 100 one.gz", "file: the compressed data end too early"},
+        {"head -c 100 one.zst", "file: the compressed data end too early"},
+        {"head -c -8 one.gz; printf 12345678", "file: the gzip data are damaged"},
+        {"cat two.gz data.csv", "file: the gzip data are damaged"},
+        {"printf 'PK\\003\\004....'", "file: this is zip, and no text; read it with: unzip -p FILE | mcbin"},
+        {"printf 'PAR1\\025....'", "file: this is Parquet, and no text; read it with: duckdb"},
+        {"printf '\\3757zXZ\\000...'", "file: this is xz, and no text; read it with: xz -dc FILE | mcbin"},
+        {"echo a,b | bzip2", "file: this is bzip2, and no text; read it with: bzip2 -dc FILE | mcbin"},
+    };
+    for (const Case& c : cases)
+    {
+        const Outcome outcome = Shell("{ " + std::string(c.spoil) + "; } >file; mcbin supervised file --target size");
+        EXPECT_EQ(1, outcome.exitCode) << c.spoil;
+        EXPECT_EQ(0u, outcome.err.find("mcbin: " + std::string(c.words))) << c.spoil << outcome.err;
+    }
+}
+
+TEST_F(McbinInput, TablesWithoutAHeaderWithCommentsAndWithNamesTwice)
+{
+    const std::string named = RunOn("column 1,column 2\n1,a\n2,a\n3,b\n4,b\n", "supervised", "--target 'column 2'").out;
+    EXPECT_EQ(named, RunOn("1,a\n2,a\n3,b\n4,b\n", "supervised", "--target 'column 2' --no-header").out);
+    Write("data.csv", "1,a\n2,a\n3,b\n4,b\n");
+    EXPECT_EQ(named, Shell("cat data.csv | mcbin supervised - --target 'column 2' --no-header").out);
+    Shell("mcbin supervised data.csv --target 'column 2' --no-header --format json >bins.json");
+    EXPECT_EQ("1,a,0\n2,a,0\n3,b,1\n4,b,1\n", Run("apply bins.json data.csv --no-header").out);
+
+    for (const char* text : {"# made; by; hand\nx,y\n1,a\n#\n2,\"a\"\n3,b\n# end\n4,b",
+                             "# of\r\nx,y\r\n1,a\r\n2,a\r\n#\r\n3,b\r\n4,b\r\n"})
+    {
+        const std::string commented = RunOn(text, "supervised", "--target y --comment '#'").out;
+        EXPECT_EQ(RunOn("x,y\n1,a\n2,a\n3,b\n4,b\n", "supervised", "--target y").out, commented) << text;
+    }
+    EXPECT_NE(std::string::npos,
+              RunOn("x,y\n#,a\n2,\"\n#\"\n", "supervised", "--target y --comment '#'").err.find("single"));
+
+    const Outcome twice = RunOn("x,y,x,x_2,x\n1,a,2,3,4\n2,b,4,5,6\n", "supervised", "--target y --format csv");
+    for (const char* name : {"\nx,", "\nx_2,", "\nx_2_2,", "\nx_3,"})
+        EXPECT_NE(std::string::npos, twice.out.find(name)) << twice.out;
+    EXPECT_NE(std::string::npos, twice.err.find("another column is named 'x', so column 3 is called 'x_2'"));
 }

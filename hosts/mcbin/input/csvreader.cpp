@@ -42,6 +42,20 @@ std::string_view MakeView(const char* begin, const char* end)
     return std::string_view(begin, static_cast<std::size_t>(end - begin));
 }
 
+/// The lines of the text that don't begin with the character.
+std::string WithoutComments(std::string_view text, char comment)
+{
+    std::string lines;
+    while (!text.empty())
+    {
+        const std::size_t size = std::min(text.find_first_of("\r\n"), text.size() - 1) + 1;
+        if (comment == '\0' || text.front() != comment)
+            lines += text.substr(0, size);
+        text.remove_prefix(size);
+    }
+    return lines;
+}
+
 /// The text without the spaces around it.
 inline std::string_view Trim(const char* begin, const char* end, char delimiter)
 {
@@ -60,12 +74,12 @@ void CsvReader::ParserDeleter::operator()(csv_parser* parser) const
     delete parser;
 }
 
-CsvReader::CsvReader(InputFile file, char delimiter)
-    : fFile(std::move(file)), fDelimiter(delimiter), fBuffer(kBufferSize), fRows(1)
+CsvReader::CsvReader(InputFile file, char delimiter, char comment)
+    : fFile(std::move(file)), fDelimiter(delimiter), fComment(comment), fBuffer(kBufferSize), fRows(1)
 {
     ReadBeginning();
     if (fDelimiter == '\0')
-        fDelimiter = DetectDelimiter(MakeView(fBegin, fEnd));
+        fDelimiter = DetectDelimiter(WithoutComments(MakeView(fBegin, fEnd), fComment));
     fParser.reset(MakeParser(fDelimiter));
 }
 
@@ -83,6 +97,8 @@ const CsvRow* CsvReader::NextRow()
                 return nullptr;
             FinishParsing();
         }
+        else if (SkipComment())
+            continue;
         else if (fInRow || FindSpecial(fLineEnd) < fLineEnd)
             ParseLine();
         else if (SplitLine(MakeView(std::exchange(fBegin, fLineEnd), fLineEnd)))
@@ -193,6 +209,19 @@ const char* CsvReader::FindSpecial(const char* end)
         fSpecial = end;
     }
     return end;
+}
+
+/// Drops the line at fBegin, if it is a comment. \return whether it was one.
+bool CsvReader::SkipComment()
+{
+    if (fComment == '\0' || fInRow || *fBegin != fComment)
+        return false;
+    const char* const back = Find(fBegin, fLineEnd, '\r');
+    const bool isPair = back != fLineEnd && back + 1 != fLineEnd && back[1] == '\n';
+    fBegin = back == fLineEnd ? fLineEnd : back + (isPair ? 2 : 1);
+    fLastTerminator = 0;
+    ++fLine;
+    return true;
 }
 
 /// \return false for a blank line.

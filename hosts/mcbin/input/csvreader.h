@@ -47,8 +47,9 @@ private:
 class CsvReader
 {
 public:
-    /// A `delimiter` of '\0' stands for the one that the beginning of the file shows.
-    CsvReader(InputFile file, char delimiter);
+    /// A `delimiter` of '\0' stands for the one that the beginning of the file shows. Lines that begin with `comment` are
+    /// dropped; '\0' stands for none.
+    CsvReader(InputFile file, char delimiter, char comment);
 
     /// The next row, which stays the reader's and is good until the next call, or null at the end.
     /// \throw Failure for a bad row, once all rows before it have been handed out, or if the file can't be read.
@@ -76,6 +77,7 @@ private:
     bool Refill();
     const char* FindSpecial(const char* end);
     bool SplitLine(std::string_view line);
+    bool SkipComment();
 
     void ParseLine();
     void Parse(std::string_view text);
@@ -89,6 +91,7 @@ private:
 
     InputFile fFile;
     char fDelimiter;
+    char fComment;
     std::unique_ptr<csv_parser, ParserDeleter> fParser;
 
     std::vector<char> fBuffer;

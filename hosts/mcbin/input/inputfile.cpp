@@ -5,6 +5,7 @@
 
 #include <mcobnqrt/binsettings.h>
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <cstring>
@@ -69,7 +70,7 @@ void InputFile::CopyTo(std::FILE* spool)
     for (;;)
     {
         ThrowIfInterrupted();
-        const std::size_t size = Read(block.data(), block.size());
+        const std::size_t size = ReadFile(block.data(), block.size());
         if (std::fwrite(block.data(), 1, size, spool) != size || (size < block.size() && std::fflush(spool) != 0))
             throw MakeFailure("cannot write the temporary copy of " + fName);
         if (size < block.size())
@@ -78,6 +79,58 @@ void InputFile::CopyTo(std::FILE* spool)
 }
 
 std::size_t InputFile::Read(char* buffer, std::size_t size)
+{
+    if (!fIsLookedAt)
+        LookAtBeginning();
+    if (fDecompressor)
+        return Decompress(buffer, size);
+    const std::size_t numTaken = ReadTaken(buffer, size);
+    return numTaken + ReadFile(buffer + numTaken, size - numTaken);
+}
+
+void InputFile::LookAtBeginning()
+{
+    fInput.resize(kNumTellingBytes);
+    fInput.resize(ReadFile(fInput.data(), fInput.size()));
+    fDecompressor = MakeDecompressor({fInput.data(), fInput.size()}, fName);
+    fIsLookedAt = true;
+}
+
+/// Hands on what was read to look at it.
+std::size_t InputFile::ReadTaken(char* buffer, std::size_t size)
+{
+    const std::size_t number = std::min(size, fInput.size() - fTaken);
+    std::copy_n(fInput.data() + fTaken, number, buffer);
+    fTaken += number;
+    return number;
+}
+
+std::size_t InputFile::Decompress(char* buffer, std::size_t size)
+{
+    constexpr std::size_t kBlock = 1 << 16;
+    std::size_t number = 0;
+    while (number < size)
+    {
+        std::string_view input(fInput.data() + fTaken, fInput.size() - fTaken);
+        const std::size_t numWritten = fDecompressor->Decompress(input, buffer + number, size - number);
+        const bool hasMoved = numWritten > 0 || input.size() < fInput.size() - fTaken;
+        fTaken = fInput.size() - input.size();
+        number += numWritten;
+        if (hasMoved)
+            continue;
+        fTaken = 0;
+        fInput.resize(kBlock);
+        fInput.resize(ReadFile(fInput.data(), fInput.size()));
+        if (fInput.empty() && !fDecompressor->IsAtEnd())
+            throw Failure(fName + ": the compressed data end too early");
+        if (fInput.empty())
+            break;
+    }
+    return number;
+}
+
+/// Fills `buffer` with the bytes of the file, as they are there.
+std::size_t InputFile::ReadFile(char* buffer, std::size_t size)
 {
     std::size_t read = 0;
     for (;;)
@@ -100,4 +153,8 @@ std::size_t InputFile::Read(char* buffer, std::size_t size)
 void InputFile::Rewind()
 {
     std::rewind(fFile.get());
+    fIsLookedAt = false;
+    fDecompressor.reset();
+    fInput.clear();
+    fTaken = 0;
 }

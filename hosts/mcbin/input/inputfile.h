@@ -1,12 +1,16 @@
 #ifndef MCBIN_INPUTFILE_H
 #define MCBIN_INPUTFILE_H
 
+#include "hosts/mcbin/input/decompressor.h"
+
 #include <cstddef>
 #include <cstdio>
 #include <memory>
 #include <string>
+#include <vector>
 
-/// A file that is read from its beginning to its end. All operations throw a Failure that names it where the system
+/// A file that is read from its beginning to its end. One that is compressed, which its first bytes tell, is read as what
+/// it stands for. All operations throw a Failure that names it where the system
 /// refuses, and Interrupted where a signal ends the wait for it.
 class InputFile
 {
@@ -35,9 +39,17 @@ private:
     };
 
     void CopyTo(std::FILE* spool);
+    std::size_t ReadFile(char* buffer, std::size_t size);
+    void LookAtBeginning();
+    std::size_t ReadTaken(char* buffer, std::size_t size);
+    std::size_t Decompress(char* buffer, std::size_t size);
 
     std::string fName;
     std::unique_ptr<std::FILE, Closer> fFile;
+    bool fIsLookedAt = false;                    ///< it is known whether the file is compressed
+    std::unique_ptr<Decompressor> fDecompressor; ///< null if it isn't
+    std::vector<char> fInput;                    ///< read from the file and not yet handed on, from fTaken on
+    std::size_t fTaken = 0;
 };
 
 #endif

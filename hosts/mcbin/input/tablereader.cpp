@@ -9,37 +9,45 @@
 namespace
 {
 
-std::vector<std::string> NameColumns(const CsvRow& header)
-{
-    std::vector<std::string> names;
-    for (std::size_t i = 0; i < header.Size(); ++i)
-        names.push_back(header[i].empty() ? "column " + std::to_string(i + 1) : std::string(header[i]));
-    return names;
-}
-
 CsvReader Open(const TableOptions& options)
 {
     InputFile file(options.file);
     if (options.isReadTwice)
         file.MakeRewindable(options.spoolDirectory);
-    return CsvReader(std::move(file), options.delimiter);
+    return CsvReader(std::move(file), options.delimiter, options.comment);
 }
 
 } // namespace
 
-TableReader::TableReader(const TableOptions& options) : fReader(Open(options))
+TableReader::TableReader(const TableOptions& options) : fReader(Open(options)), fHasHeader(options.hasHeader)
 {
-    const CsvRow* const header = fReader.NextRow();
-    if (!header)
-        throw MakeFailure("the file is empty; its first line should name the columns");
-    const RowText& text = header->GetText();
-    fHeader = std::string(fReader.GetMark()) + std::string(text.fields);
+    const CsvRow* const first = fReader.NextRow();
+    if (!first)
+        throw MakeFailure(fHasHeader ? "the file is empty; its first line should name the columns"
+                                     : "the file is empty");
+    const RowText& text = first->GetText();
     fLineEnd = text.end.empty() ? "\n" : text.end;
-    fColumnNames = NameColumns(*header);
-    for (auto name = fColumnNames.begin(); name != fColumnNames.end(); ++name)
+    NameColumns(*first);
+    if (fHasHeader)
+        fHeader = std::string(fReader.GetMark()) + std::string(text.fields);
+    else
+        fFirstRow = first;
+}
+
+void TableReader::NameColumns(const CsvRow& header)
+{
+    for (std::size_t i = 0; i < header.Size(); ++i)
     {
-        if (std::find(fColumnNames.begin(), name, *name) != name)
-            throw MakeFailure(header->GetLine(), "two columns are named " + Quote(*name));
+        const bool isNamed = fHasHeader && !header[i].empty();
+        const std::string name = isNamed ? std::string(header[i]) : "column " + std::to_string(i + 1);
+        std::string unique = name;
+        const auto isTaken = [&]
+        { return std::find(fColumnNames.begin(), fColumnNames.end(), unique) != fColumnNames.end(); };
+        for (int number = 2; isTaken(); ++number) unique = name + "_" + std::to_string(number);
+        if (unique != name)
+            fNotes.push_back("another column is named " + Quote(name) + ", so column " + std::to_string(i + 1) +
+                             " is called " + Quote(unique));
+        fColumnNames.push_back(unique);
     }
 }
 
@@ -59,11 +67,12 @@ std::size_t TableReader::FindColumn(const std::string& name) const
 
 const CsvRow* TableReader::NextRow()
 {
-    const CsvRow* const row = fReader.NextRow();
+    const CsvRow* const row = fFirstRow ? std::exchange(fFirstRow, nullptr) : fReader.NextRow();
     if (row && row->Size() != fColumnNames.size())
     {
         throw MakeFailure(row->GetLine(), "wrong number of fields: " + std::to_string(row->Size()) +
-                                              ", but the header has " + std::to_string(fColumnNames.size()));
+                                              (fHasHeader ? ", but the header has " : ", but the first row has ") +
+                                              std::to_string(fColumnNames.size()));
     }
     return row;
 }
@@ -71,7 +80,9 @@ const CsvRow* TableReader::NextRow()
 void TableReader::Rewind()
 {
     fReader.Rewind();
-    fReader.NextRow(); // the header is known
+    fFirstRow = nullptr;
+    if (fHasHeader)
+        fReader.NextRow(); // it is known
 }
 
 Failure TableReader::MakeFailure(const std::string& words) const

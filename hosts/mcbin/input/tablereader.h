@@ -5,6 +5,7 @@
 #include "hosts/mcbin/input/csvreader.h"
 
 #include <cstddef>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -14,21 +15,27 @@ struct TableOptions
 {
     std::string file;           ///< "-" for standard input
     char delimiter = '\0';      ///< '\0' for finding it
+    char comment = '\0';        ///< what a line begins with that is none of the table; '\0' for nothing
+    bool hasHeader = true;      ///< the first row names the columns
     bool isReadTwice = false;   ///< or more often: Rewind() will be called
     std::string spoolDirectory; ///< for a copy of what can't be read twice by itself; empty for the library's default
 };
 
-/// Reads a table: a delimited file whose first row names the columns, and whose every other row has a field for each of
-/// them. A column without a name is called "column 1", "column 2", ... after its position.
+/// Reads a table: a delimited file whose first row names the columns, unless there is no such row, and whose every other
+/// row has a field for each of them. A column without a name is called "column 1", "column 2", ... after its position,
+/// and one whose name another has before it gets "_2", "_3", ... behind it.
 class TableReader
 {
 public:
-    /// \throw Failure if the file can't be read, is empty, or has two columns of one name.
+    /// \throw Failure if the file can't be read, or is empty.
     explicit TableReader(const TableOptions& options);
 
     const std::vector<std::string>& GetColumnNames() const { return fColumnNames; }
     /// The first row as it stands in the file, behind the file's UTF-8 mark if it has one, and without its line end.
-    const std::string& GetHeader() const { return fHeader; }
+    /// Nothing without a header.
+    const std::optional<std::string>& GetHeader() const { return fHeader; }
+    /// What a user should know of the names of columns.
+    const std::vector<std::string>& GetNotes() const { return fNotes; }
     /// What ends the first row; LF if nothing does.
     const std::string& GetLineEnd() const { return fLineEnd; }
     char GetDelimiter() const { return fReader.GetDelimiter(); }
@@ -57,8 +64,13 @@ public:
     Failure MakeNotAWeight(long line, std::size_t column, std::string_view field, double weight) const;
 
 private:
+    void NameColumns(const CsvRow& header);
+
     CsvReader fReader;
-    std::string fHeader;
+    bool fHasHeader;
+    const CsvRow* fFirstRow = nullptr; ///< of a table without a header, until it is handed out
+    std::optional<std::string> fHeader;
+    std::vector<std::string> fNotes;
     std::string fLineEnd;
     std::vector<std::string> fColumnNames;
 };
