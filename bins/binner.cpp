@@ -22,6 +22,8 @@ Binner::Binner(const AttributeBins& bins, const std::vector<std::string>& missin
         fFoundByCategory.emplace(variable.categories[code],
                                  Found{FindBin(bins.cutPoints, bins.isRightClosed, value), false, value});
     }
+    if (variable.rare)
+        fUnseen = fFoundByCategory.at(variable.categories.at(variable.rare->code));
 }
 
 Binner::Found Binner::Find(std::string_view field)
@@ -51,5 +53,5 @@ Binner::Found Binner::FindCategory(std::string_view field)
 {
     fKey = field;
     const auto found = fFoundByCategory.find(fKey);
-    return found == fFoundByCategory.end() ? Found{std::nullopt, true, 0.0} : found->second;
+    return found == fFoundByCategory.end() ? fUnseen : found->second;
 }

@@ -35,7 +35,8 @@ private:
     std::vector<std::string> fMissingTexts;
     std::vector<double> fMissingNumbers; ///< the attribute's, and those among the texts
     std::unordered_map<std::string, Found> fFoundByCategory;
-    std::string fKey; ///< kept for its memory
+    Found fUnseen{std::nullopt, true, 0.0}; ///< of a category that is not among them
+    std::string fKey;                       ///< kept for its memory
 };
 
 #endif

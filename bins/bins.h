@@ -48,6 +48,15 @@ enum class CategoryOrder
     kDeclared ///< their column, or the user, has declared the order
 };
 
+/// Categories that share a code, as each has less than a share of the weight. A category that was never seen has this
+/// code, too.
+struct RareCategories
+{
+    std::size_t code = 0;
+    double share = 0.0;
+    std::vector<std::string> categories;
+};
+
 /// A column of the analysis.
 struct Variable
 {
@@ -60,6 +69,7 @@ struct Variable
     std::vector<std::string> categories; ///< by code; of a numeric-categorical variable as FormatNumber writes them
     /// Of a categorical variable; nothing where it is not known, and of numbers, which ascend.
     std::optional<CategoryOrder> categoryOrder;
+    std::optional<RareCategories> rare;              ///< of a categorical variable that has such
     std::string orderTarget;                         ///< of CategoryOrder::kRate: the name of the target
     WeightRounding rounding = WeightRounding::kNone; ///< of a weight
     std::optional<double> weightGrid; ///< of a weight: of what its values were made multiples, if one had to move

@@ -123,6 +123,12 @@ private:
             variable.categoryOrder = order->Choose(kCategoryOrderNames);
         if (const auto target = json.Find("order_target"))
             variable.orderTarget = target->GetString();
+        const auto rare = json.Find("rare");
+        if (!rare)
+            return;
+        const auto last = static_cast<std::int64_t>(variable.categories.size()) - 1;
+        variable.rare = RareCategories{static_cast<std::size_t>(rare->At("code").GetInteger(0, last)),
+                                       rare->At("share").GetNumber(), rare->At("categories").GetStrings()};
     }
 
     void ReadMissing(Variable& variable, const JsonCursor& json) const

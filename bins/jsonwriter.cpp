@@ -73,6 +73,15 @@ JsonValue MakeCategoryOrder(const Variable& variable)
     return variable.categoryOrder ? JsonValue(GetName(kCategoryOrderNames, *variable.categoryOrder)) : JsonValue();
 }
 
+JsonValue MakeRare(const Variable& variable)
+{
+    if (!variable.rare)
+        return {};
+    return Object{{"code", static_cast<std::int64_t>(variable.rare->code)},
+                  {"share", variable.rare->share},
+                  {"categories", variable.rare->categories}};
+}
+
 JsonValue ToValue(const Variable& variable)
 {
     const bool isWeight = variable.role == VariableRole::kWeight;
@@ -84,6 +93,7 @@ JsonValue ToValue(const Variable& variable)
                   {"categories", MakeCategories(variable)},
                   {"category_order", MakeCategoryOrder(variable)},
                   {"order_target", variable.orderTarget.empty() ? JsonValue() : JsonValue(variable.orderTarget)},
+                  {"rare", MakeRare(variable)},
                   {"rounding", isWeight ? JsonValue(GetName(variable.rounding)) : JsonValue()},
                   {"grid", variable.weightGrid},
                   {"missing", MakeMissing(variable)},

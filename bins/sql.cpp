@@ -5,6 +5,7 @@
 #include "bins/numbers.h"
 #include "bins/text.h"
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 #include <stdexcept>
@@ -164,19 +165,27 @@ private:
         return fName + " BETWEEN " + MakeLiteral(low) + " AND " + MakeLiteral(high);
     }
 
+    /// Rare categories share a bin with those that were never seen, and so with all others.
     std::string MakeCategoryBranches() const
     {
         std::string branches;
+        std::string others = fMissing;
+        const auto isRare = [this](std::size_t code) { return fVariable.rare && fVariable.rare->code == code; };
         const std::vector<std::vector<std::size_t>> codes = FindCodes(fBins);
         for (std::size_t bin = 0; bin < codes.size(); ++bin)
         {
+            if (std::any_of(codes[bin].begin(), codes[bin].end(), isRare))
+            {
+                others = MakeResult(bin);
+                continue;
+            }
             std::vector<std::string> literals;
             for (const std::size_t code : codes[bin])
                 literals.push_back(MakeCategoryLiteral(fVariable.categories[code]));
             if (!literals.empty())
                 branches += "  WHEN " + fName + " IN (" + Join(literals, ", ") + ") THEN " + MakeResult(bin) + "\n";
         }
-        return branches + "  ELSE " + fMissing + "\n";
+        return branches + "  ELSE " + others + "\n";
     }
 
     /// The condition that a value that isn't missing lies left of the cut point. A cut point that is infinite is the

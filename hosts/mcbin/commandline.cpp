@@ -178,6 +178,13 @@ void AddColumns(CLI::App& command, ColumnOptions& columns)
                 "(the default with a target). text: by their bytes. COLUMN=a,b,c: that of one column; may be repeated",
                 "rate|text|COLUMN=a,b,c")
         ->group("Columns");
+    command
+        .add_option("--rare", columns.rareShare,
+                    "Categories of less than this share of the weight are one, \"(rare)\", to which unseen ones belong "
+                    "as well, from 0 to 1; not of columns whose order is told")
+        ->check(MakeNumberCheck(1.0, "from 0 to 1"))
+        ->option_text("SHARE")
+        ->group("Columns");
     AddRepeated(command, "--continuous", columns.continuous,
                 "Columns of numbers, also if most fields are something else", "NAME,...")
         ->group("Columns");

@@ -25,6 +25,7 @@ struct ColumnOptions
     std::vector<std::string> missingText;
     std::vector<std::string> missing;       ///< each COLUMN=9,99,unknown,90:99
     std::vector<std::string> categoryOrder; ///< each rate, text, or COLUMN=a,b,c
+    double rareShare = 0.0;                 ///< categories of less than this share of the weight have a code together
     bool areTextsBinned = false;            ///< there is a target: columns of text are binned though they are not named
     bool isBadMissing = false;              ///< what is no number, where it should be one, is missing and no failure
 };

@@ -294,7 +294,7 @@ TEST_F(McbinFaults, ADamagedFileOfBinsIsRefusedInWordsThatNameIt)
     };
     const Case cases[] = {
         {"9,$d", "line 9: this is not JSON"},
-        {"s/\"weight\": 3/\"weight\": 1e999/", "line 56: this is not JSON"},
+        {"s/\"weight\": 3/\"weight\": 1e999/", "line 58: this is not JSON"},
         {"s/mcobnqrt-bins/other/", "this is not a document of bins"},
         {"s/\"left\": 3/\"left\": 18446744073709551615/", "results[0].bins[1]: the bin does not lie between"},
     };

@@ -208,3 +208,63 @@ def test_each_category_is_told_with_its_figures():
     assert row["woe"] == pytest.approx(np.log(p / q)) and row["iv"] == pytest.approx((p - q) * np.log(p / q))
     pd.testing.assert_frame_equal(again.categories_to_pandas(), frame)
     assert mb.supervised_bins(table, "bought", ["w"])["w"].categories_to_pandas().empty
+
+
+@pytest.mark.parametrize("target", ["bought", "tier", None])
+def test_rare_categories_are_one_to_which_unseen_ones_belong_in_every_host(target, tmp_path, mcbin):
+    rng = np.random.default_rng(5)
+    table = make_cities()
+    names = [f"village {i}" if rng.random() < 0.1 else city for i, city in enumerate(table["city"].to_pylist())]
+    table = table.set_column(0, "city", pa.array(names))
+    frame = table.to_pandas()
+
+    def run(data, reduce=None, order="rate"):
+        if target is None:
+            return mb.equal_frequency_bins(data, ["city"], "w", rare=0.01, n_bins=3, reduce=reduce)
+        return mb.supervised_bins(data, target, ["city"], "w", rare=0.01, category_order=order, reduce=reduce)
+
+    bins = run(table)
+    found = bins["city"]
+    is_counted = frame["w"].notna() if target is None else frame[target].notna()
+    weights = frame["w"].where(is_counted, 0.0).groupby(frame["city"]).sum()
+    rare = sorted(weights.index[weights < 0.01 * weights.sum()])
+    assert found.variable.rare == tuple(rare) and len(rare) > 50
+    kept = {*weights.index} - {*rare} | {"(rare)"}
+    assert {*found.variable.categories} == kept and found.variable.categories[found.variable.rare_code] == "(rare)"
+    assert figures(run(duckdb.from_arrow(table), "engine")) == figures(bins) == figures(run(table.to_reader()))
+
+    news = pd.DataFrame({"city": ["Atlantis", rare[0], "(rare)", None, "Bonn", "Essen"]})
+    bin_of_rare = found.bin_numbers(np.array([float(found.variable.rare_code)]))[0]
+    for result in (bins, mb.BinningResult.from_json(bins.to_json())):
+        placed = result.transform(news)["city_bin"]
+        assert placed[:4].tolist() == [bin_of_rare] * 3 + [pd.NA]
+        sql = duckdb.sql(result.to_sql("duckdb", table="news")).fetchall()
+        assert [row[-1] for row in sql] == [None if number is pd.NA else number for number in placed.tolist()]
+    bins.to_json(tmp_path / "bins.json")
+    news.to_csv(tmp_path / "news.csv", index=False)
+    applied = subprocess.run([mcbin, "apply", "bins.json", "news.csv"], cwd=tmp_path, capture_output=True, check=True)
+    assert [row.rsplit(",", 1)[1] for row in applied.stdout.decode().splitlines()[1:]] == [
+        "" if number is pd.NA else str(number) for number in placed.tolist()
+    ]
+    if target is not None:
+        assert run(table, order="text")["city"].variable.categories == tuple(sorted(kept))
+
+    frame.to_csv(tmp_path / "data.csv", index=False)
+    command = [mcbin, *(["equal-frequency", "--n-bins", "3"] if target is None else ["supervised", "--target", target])]
+    options = ["data.csv", "--attributes", "city", "--weight", "w", "--rare", "0.01", "--format", "json"]
+    printed = subprocess.run(command + options, cwd=tmp_path, capture_output=True, check=True).stdout
+    document = json.loads(printed)
+    assert document["results"] == figures(bins)["results"]
+    assert document["variables"] == [{**variable, "value_kind": None} for variable in figures(bins)["variables"]]
+
+
+def test_a_column_of_rare_categories_alone_is_left_out_or_refused():
+    table = pa.table({"c": [f"c{i % 100}" for i in range(1000)], "x": range(1000), "y": [i < 500 for i in range(1000)]})
+
+    for data, reduce in [(table, None), (table.to_reader(), None), (duckdb.from_arrow(table), "engine")]:
+        bins = mb.supervised_bins(data, "y", rare=0.02, reduce=reduce)
+        assert bins.left_out == {"c": "text: rare categories alone"} and list(bins) == ["x"]
+    with pytest.raises(mb.DataError, match=r"column 'c'.*there is a single category, '\(rare\)'"):
+        mb.supervised_bins(table, "y", ["c"], rare=0.02)
+    with pytest.raises(ValueError, match="rare must be from 0 to 1, not 2"):
+        mb.supervised_bins(table, "y", rare=2)

@@ -29,7 +29,7 @@ ColumnPlan MakeCountPlan(const ColumnPlan& plan)
     return counted;
 }
 
-/// By variable index of an attribute: the index of the target whose rates order its categories.
+/// The attributes, each with the target whose rates order its categories, if there is one.
 std::vector<CategoryTally::Pair> FindPairs(const Variables& variables,
                                            const std::vector<std::shared_ptr<const Variable>>& described)
 {
@@ -45,10 +45,10 @@ std::vector<CategoryTally::Pair> FindPairs(const Variables& variables,
             pairs.push_back({variables.pairAttributes[i], variables.pairTargets[i]});
     }
     const int target = variables.list.GetTargetIndex();
-    for (std::size_t i = 0; i < described.size() && target >= 0; ++i)
+    for (std::size_t i = 0; i < described.size() && variables.pairAttributes.empty(); ++i)
     {
         if (described[i]->role == VariableRole::kAttribute)
-            pairs.push_back({static_cast<int>(i), target});
+            pairs.push_back({static_cast<int>(i), target < 0 ? std::nullopt : std::optional(target)});
     }
     return pairs;
 }
@@ -59,7 +59,8 @@ void OrderCategories(TableReader& table, ColumnPlan& plan, Progress& progress)
 {
     const ColumnPlan counted = MakeCountPlan(plan);
     const auto isAttribute = [](const Column& column) { return column.isAttribute; };
-    if (!plan.isByRate || std::none_of(counted.columns.begin(), counted.columns.end(), isAttribute))
+    const bool areCounted = plan.isByRate || plan.rareShare > 0.0;
+    if (!areCounted || std::none_of(counted.columns.begin(), counted.columns.end(), isAttribute))
         return;
     Variables variables = MakeVariables(counted);
     const std::vector<std::shared_ptr<const Variable>> described = DescribeVariables(counted, variables);
@@ -77,8 +78,16 @@ void OrderCategories(TableReader& table, ColumnPlan& plan, Progress& progress)
         const auto attribute = static_cast<std::size_t>(pair.attribute);
         Column& column = plan.columns[variables.columns[attribute]];
         const CategoryCodes codes =
-            MakeCategoryCodes(described[attribute]->categories, *tally.Find(pair), true, 0.0, true);
+            MakeCategoryCodes(described[attribute]->categories, *tally.Find(pair), true, plan.rareShare, plan.isByRate);
+        if (codes.names.size() < 2 && !column.isNamed)
+        {
+            column.isAttribute = false;
+            column.reasonLeftOut = "rare categories alone";
+            continue;
+        }
         column.order = codes.names;
-        column.orderTarget = described[static_cast<std::size_t>(*pair.target)]->name;
+        column.rare = codes.rare;
+        column.rareName = codes.rareCode ? codes.names[*codes.rareCode] : "";
+        column.orderTarget = plan.isByRate ? described[static_cast<std::size_t>(*pair.target)]->name : "";
     }
 }

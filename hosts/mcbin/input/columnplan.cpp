@@ -340,6 +340,7 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     plan.isBadMissing = options.isBadMissing;
     plan.areTextsBinned = options.areTextsBinned;
     plan.isByRate = options.areTextsBinned;
+    plan.rareShare = options.rareShare;
     plan.weights.rounding = options.rounding;
     for (const std::string& name : table.GetColumnNames())
     {

@@ -72,6 +72,7 @@ struct ColumnPlan
     std::vector<std::pair<std::size_t, std::size_t>> pairs; ///< attribute and target; empty without a list of pairs
     std::vector<std::string> missingTexts;                  ///< of all columns, beside the empty one
     bool areTextsBinned = false; ///< columns of text are attributes though they are not named, if they can be
+    double rareShare = 0.0;      ///< categories of less than this share of the weight have a code together
     bool isByRate = false;       ///< categories that have no order are ordered by the rate of the target
     bool isBadMissing = false;
     long numRows = 0;

@@ -107,9 +107,16 @@ Variable DescribeVariable(const Column& column, const Categories* categories, co
     {
         variable.missingTexts = column.missingTexts;
         variable.orderTarget = column.orderTarget;
-        variable.categoryOrder = column.order.empty()         ? CategoryOrder::kText
-                                 : column.orderTarget.empty() ? CategoryOrder::kDeclared
+        const bool isDeclared = !column.order.empty() && column.orderTarget.empty() && column.rare.empty();
+        variable.categoryOrder = isDeclared                   ? CategoryOrder::kDeclared
+                                 : column.orderTarget.empty() ? CategoryOrder::kText
                                                               : CategoryOrder::kRate;
+        if (!column.rare.empty())
+        {
+            const auto found = std::find(column.order.begin(), column.order.end(), column.rareName);
+            const auto code = static_cast<std::size_t>(found - column.order.begin());
+            variable.rare = RareCategories{code, plan.rareShare, column.rare};
+        }
         return variable;
     }
     variable.missingNumbers = column.missingNumbers;

@@ -48,6 +48,10 @@ class Variable:
     """What the order of texts follows: `"text"`, `"rate"` of `order_target`, or what was `"declared"`; None otherwise,
     and where it is not known."""
     order_target: str | None = None
+    rare: tuple[str, ...] = ()
+    """The categories that share a code, as each has too little weight; unseen ones have it as well."""
+    rare_code: int | None = None
+    """That code; None where there is none."""
 
     @classmethod
     def from_core(cls, core: _core.Variable) -> Variable:
@@ -66,6 +70,8 @@ class Variable:
             core.grid,
             core.category_order,
             core.order_target,
+            tuple(core.rare),
+            core.rare_code,
         )
 
     @property

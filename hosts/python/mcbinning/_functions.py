@@ -13,7 +13,7 @@ from ._plan import Plan, columns_left_out, name_missing, name_orders, named_in, 
 from ._progress import Progress
 from ._result import BinningResult
 from ._runs import run
-from ._settings import Reducing, RunSettings, check_settings, directory_of
+from ._settings import Reducing, RunSettings, check_settings, check_share, directory_of
 from ._sources import name_of
 from ._types import CategoryOrder, Closed, Distinct, MemoryLimit, Missing, Reduce, Rounding
 
@@ -27,6 +27,7 @@ def supervised_bins(
     pairs: Iterable[tuple[Any, Any]] | None = None,
     *,
     category_order: CategoryOrder = "rate",
+    rare: float = 0.0,
     max_distinct: int | None = None,
     n_bins: int = 1000,
     closed: Closed = "right",
@@ -74,6 +75,9 @@ def supervised_bins(
         categorical have. "rate": by the share of the target's second category, or with several along the first
         principal direction of their shares; of an attribute with several targets the first one counts. "text": by
         their bytes. A dict tells by column all categories in their order; the others follow their rate.
+    rare : float, default=0.0
+        Categories with less than this share of the weight, 0 to 1, that have no order of their own become one,
+        "(rare)", to which `transform` and SQL count categories that were never seen, too.
     max_distinct : int, default=None
         An attribute with more distinct values than this, at least 1, is pre-binned into `n_bins` bins of equal
         frequency, between which it is then cut. None: never.
@@ -160,6 +164,7 @@ def supervised_bins(
         raise TypeError("pairs name the attributes, so attributes can't be given, too")
     check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding, smoothing=smoothing)
     order = name_orders(category_order)
+    check_share("rare", rare)
     reducing = Reducing(reduce, max_groups, distinct)
     source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
     target, weight = (None if label is None else name_of(label) for label in (target, weight))
@@ -177,6 +182,7 @@ def supervised_bins(
         rounding,
         optional=frozenset() if is_chosen else texts_of(source, [target, weight, *named_in(order)]),
         category_order=order,
+        rare=rare,
         left_out={} if is_chosen else columns_left_out(source, [target, weight], True),
     )
     settings = RunSettings(n_bins, max_distinct, small_bin_ratio, smoothing, closed == "right", directory_of(temp_dir))
@@ -191,6 +197,7 @@ def equal_frequency_bins(
     missing: Missing | None = None,
     *,
     category_order: Mapping[Any, Sequence[str]] | None = None,
+    rare: float = 0.0,
     n_bins: int = 10,
     closed: Closed = "right",
     rounding: Rounding = "none",
@@ -222,6 +229,9 @@ def equal_frequency_bins(
     category_order : dict, default=None
         By column: all its categories in the order in which they are cut. The others are cut in the order of their
         bytes, or in the one that an ordered categorical declares.
+    rare : float, default=0.0
+        Categories with less than this share of the weight, 0 to 1, that have no order of their own become one,
+        "(rare)", to which `transform` and SQL count categories that were never seen, too.
     n_bins : int, default=10
         The number of bins, at least 2.
     closed : {"right", "left"}, default="right"
@@ -274,6 +284,7 @@ def equal_frequency_bins(
     [25.0, 25.0, 25.0, 25.0]
     """
     check_settings(closed, n_bins, rounding=rounding)
+    check_share("rare", rare)
     reducing = Reducing(reduce, max_groups, distinct)
     source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
     weight = None if weight is None else name_of(weight)
@@ -286,6 +297,7 @@ def equal_frequency_bins(
         name_missing(missing),
         rounding,
         category_order="text" if category_order is None else name_orders(category_order),
+        rare=rare,
         left_out=columns_left_out(source, [weight], False) if attributes is None else {},
     )
     settings = RunSettings(n_bins, None, None, 0.5, closed == "right", directory_of(temp_dir))

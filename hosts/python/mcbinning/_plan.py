@@ -101,6 +101,8 @@ class Plan:
     optional: frozenset[str] = frozenset()
     """Columns of text that nobody has named. They are binned if they can be."""
     category_order: CategoryOrder = "rate"
+    rare: float = 0.0
+    """Categories that have no order of their own, and less than this share of the weight, have a code together."""
     left_out: Mapping[str, str] = field(default_factory=dict)
     """By name: why a column is not binned."""
 
@@ -142,12 +144,13 @@ class Plan:
             feed = self._feed_columns(self.names)
             feed.spool(directory)
             plan = self.settle({name: feed.describe_unusable(self.names.index(name)) for name in self.optional})
-            for name in reversed(self.names):
-                if name not in plan.names:
-                    feed.drop(self.names.index(name))
+            self._drop(feed, plan)
             for name in plan.categorical:
                 plan.check_categories(name, feed.categories(plan.names.index(name)))
             codes = plan.count_categories(lambda: feed, plan.names)
+            kept = plan.settle(plan.find_all_rare(codes))
+            plan._drop(feed, kept)
+            plan = kept
         else:
             known = self._feed_columns(to_learn)
             known.learn()
@@ -158,16 +161,24 @@ class Plan:
                 feed = plan._feed_columns(names)
                 feed.set_weights(known.weights())
                 for name, found in categories.items():
-                    feed.set_categories(names.index(name), found)
+                    if name in names:
+                        feed.set_categories(names.index(name), found)
                 return feed
 
             for name, found in categories.items():
                 plan.check_categories(name, found)
             counted = plan.categorical if self.weight is None else [*plan.categorical, self.weight]
             codes = plan.count_categories(lambda: feed_columns(counted), counted)
+            plan = plan.settle(plan.find_all_rare(codes))
             feed = feed_columns(plan.names)
         plan.set_codes(feed, plan.names, codes)
         return plan, feed
+
+    def _drop(self, feed: _core.Feed, kept: Plan) -> None:
+        """Leaves out of a feed of the plan's columns what another plan lacks."""
+        for name in reversed(self.names):
+            if name not in kept.names:
+                feed.drop(self.names.index(name))
 
     def settle(self, unusable: Mapping[str, str]) -> Plan:
         """Without the optional columns of which a reason tells that they can't be binned."""
@@ -199,29 +210,43 @@ class Plan:
     ) -> dict[str, _core.CategoryCodes]:
         """By name of an attribute whose categories are to be ordered by the rates of a target: their codes.
         `open_counted` gives a feed of the columns `names`, which knows their categories."""
-        if self.category_order == "text":
+        to_count = self.unordered
+        if not to_count or not (self.is_by_rate or self.rare > 0.0):
             return {}
-        to_count = {name: target for name, target in self.unordered.items() if target is not None}
-        if not to_count:
-            return {}
-        pairs = [(names.index(name), names.index(target)) for name, target in to_count.items()]
-        return dict(zip(to_count, open_counted().count_categories(pairs, rare=0.0, by_rate=True)))
+        pairs = [
+            (names.index(name), None if target is None else names.index(target)) for name, target in to_count.items()
+        ]
+        return dict(zip(to_count, open_counted().count_categories(pairs, rare=self.rare, by_rate=self.is_by_rate)))
+
+    @property
+    def is_by_rate(self) -> bool:
+        return self.category_order != "text" and bool(self.targets)
+
+    def find_all_rare(self, codes: Mapping[str, _core.CategoryCodes]) -> dict[str, str]:
+        """The optional columns of which the codes leave a single category, with the reason. Others are an error."""
+        alone = [name for name, found in codes.items() if len(found.names) < 2]
+        for name in alone:
+            if name not in self.optional:
+                self.check_categories(name, codes[name].names)
+        return {name: "rare categories alone" for name in alone}
 
     def set_codes(self, feed: _core.Feed, names: Sequence[str], codes: Mapping[str, _core.CategoryCodes]) -> None:
         """Tells the feed of the columns `names` in which order the categories have their codes."""
         for name, found in codes.items():
             if name in names:
-                feed.set_codes(names.index(name), found, "rate", self.unordered[name] or "")
+                target = (self.unordered[name] or "") if self.is_by_rate else ""
+                kind = "rate" if self.is_by_rate else "text"
+                feed.set_codes(names.index(name), found, rare=self.rare, order=kind, target=target)
         for index, name in enumerate(names):
             column = self.column(name) if name in self.categorical else None
             if column is not None and column.is_ordered and column.kind == "text":
-                feed.set_codes(index, _core.CategoryCodes(list(map(str, feed.categories(index)))), "declared")
+                feed.set_codes(index, _core.CategoryCodes(list(map(str, feed.categories(index)))), order="declared")
         if isinstance(self.category_order, str):
             return
         for name, order in self.category_order.items():
             if name in names:
                 self._check_order(name, order, feed.categories(names.index(name)))
-                feed.set_codes(names.index(name), _core.CategoryCodes(list(order)), "declared")
+                feed.set_codes(names.index(name), _core.CategoryCodes(list(order)), order="declared")
 
     def _check_order(self, name: str, order: Sequence[Any], categories: Sequence[Any]) -> None:
         if len(set(order)) < len(order):

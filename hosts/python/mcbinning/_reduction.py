@@ -202,7 +202,9 @@ class _Reducer:
         self.plan = self._plan = plan.settle(unusable)
         self._categories = {name: self._learn(name) for name in self.plan.categorical}
         self._codes: dict[str, _core.CategoryCodes] = {}
-        self._codes = self._order_categories()
+        codes = self._order_categories()
+        self.plan = self._plan = self._plan.settle(self._plan.find_all_rare(codes))
+        self._codes = codes
 
     def describe(self) -> _core.Bins:
         """The bins before any is found."""

@@ -64,12 +64,16 @@ def check_settings(
     check_whole("n_bins", n_bins, 2)
     if max_distinct is not None:
         check_whole("max_distinct", max_distinct, 1)
-    if not 0.0 <= small_bin_ratio <= 1.0:
-        raise ValueError(f"small_bin_ratio must be from 0 to 1, not {small_bin_ratio}")
+    check_share("small_bin_ratio", small_bin_ratio)
     if not 0.0 <= smoothing < math.inf:
         raise ValueError(f"smoothing must be a finite number of at least 0, not {smoothing}")
     if rounding not in ("none", "truncate", "closest"):
         raise ValueError(f"rounding must be 'none', 'truncate' or 'closest', not {rounding!r}")
+
+
+def check_share(name: str, value: float) -> None:
+    if not 0.0 <= value <= 1.0:
+        raise ValueError(f"{name} must be from 0 to 1, not {value}")
 
 
 def check_whole(name: str, value: Any, least: int) -> None:

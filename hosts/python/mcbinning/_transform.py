@@ -85,6 +85,8 @@ def add_variable(
         feed.declare_missing(index, _as_numbers(values, variable), variable.missing_interval, [])
     if variable.categories is not None:
         feed.set_categories(index, _as_in_column(list(variable.categories), variable, columns[position].kind), unseen)
+    if variable.rare_code is not None:
+        feed.set_unseen_code(index, variable.rare_code)
 
 
 def _as_in_column(categories: list[Any], variable: Variable, kind: str) -> list[Any]:

@@ -260,6 +260,10 @@ void BindVariable(nb::module_& module)
                                     ? std::optional<std::string>(GetName(kCategoryOrderNames, *self.categoryOrder))
                                     : std::nullopt;
                      })
+        .def_prop_ro("rare_code",
+                     [](const Variable& self) { return self.rare ? std::optional(self.rare->code) : std::nullopt; })
+        .def_prop_ro("rare", [](const Variable& self)
+                     { return self.rare ? self.rare->categories : std::vector<std::string>(); })
         .def_prop_ro("order_target", [](const Variable& self)
                      { return self.orderTarget.empty() ? std::nullopt : std::optional(self.orderTarget); })
         .def_prop_ro("rounding",

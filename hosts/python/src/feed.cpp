@@ -244,7 +244,8 @@ std::vector<CategoryCodes> Feed::CountCategories(const std::vector<std::pair<int
     return codes;
 }
 
-void Feed::SetCodes(std::size_t index, const CategoryCodes& codes, const std::string& order, const std::string& target)
+void Feed::SetCodes(std::size_t index, const CategoryCodes& codes, double rareShare, const std::string& order,
+                    const std::string& target)
 {
     Field& field = fFields.at(index);
     field.recoding.names = codes.names;
@@ -257,6 +258,8 @@ void Feed::SetCodes(std::size_t index, const CategoryCodes& codes, const std::st
     for (const auto& [name, value] : kCategoryOrderNames)
         field.categoryOrder = order == name ? value : field.categoryOrder;
     field.orderTarget = target;
+    if (codes.rareCode)
+        field.rare = RareCategories{*codes.rareCode, rareShare, codes.rare};
 }
 
 std::pair<std::int64_t, double> Feed::GetWeights() const

@@ -65,8 +65,13 @@ public:
     std::vector<CategoryCodes> CountCategories(const std::vector<std::pair<int, std::optional<int>>>& pairs,
                                                double rareShare, bool isByRate);
 
-    /// Tells the codes of the categories, which are texts, and what has decided on their order.
-    void SetCodes(std::size_t index, const CategoryCodes& codes, const std::string& order, const std::string& target);
+    /// Tells the codes of the categories, which are texts, the share below which they are rare, and what has decided on
+    /// their order.
+    void SetCodes(std::size_t index, const CategoryCodes& codes, double rareShare, const std::string& order,
+                  const std::string& target);
+
+    /// Tells the code of a category that is not among those that were told.
+    void SetUnseenCode(std::size_t index, std::size_t code) { fFields.at(index).unseenCode = code; }
 
     /// How many weights are above 0, and the largest. Known once the records have been read for it, and where they
     /// were read by another feed, from there.

@@ -64,6 +64,8 @@ struct Field
         std::vector<double> codes;      ///< the code of the library, by that in the order of `texts`
     };
     Recoding recoding;
+    std::optional<RareCategories> rare;         ///< of the library's codes
+    std::optional<std::size_t> unseenCode;      ///< what a category has that is not among the known ones
     std::optional<CategoryOrder> categoryOrder; ///< nothing for that which the column has
     std::string orderTarget;                    ///< the name of the target whose rates have ordered the categories
 

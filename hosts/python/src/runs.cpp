@@ -62,6 +62,7 @@ std::shared_ptr<Variable> MakeVariable(const Field& field, bool isTarget)
     if (variable->kind == VariableKind::kStringCategorical)
         variable->categoryOrder = field.GetCategoryOrder();
     variable->orderTarget = field.orderTarget;
+    variable->rare = field.rare;
     for (const double number : field.numbers.GetKeys(field.isComplete))
         variable->categories.push_back(FormatCategoryNumber(number));
     variable->rounding = field.rounding;

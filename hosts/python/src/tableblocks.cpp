@@ -77,6 +77,8 @@ double EncodeCategory(Field& field, Table& table, const View& category, std::int
 {
     if (const std::optional<std::size_t> code = table.Find(category))
         return static_cast<double>(*code);
+    if (field.unseenCode)
+        return static_cast<double>(*field.unseenCode);
     if (field.isComplete && field.unseen == Field::Unseen::kKept)
         return KeepUnseen(field, GetName(category));
     if (field.isComplete)
