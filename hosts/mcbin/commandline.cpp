@@ -310,6 +310,10 @@ void AddOutput(CLI::App& command, OutputOptions& output)
             [](const std::string& file) { return file == "-" ? "standard output is for the bins" : ""; }, "", ""))
         ->option_text("FILE.html")
         ->group("Output");
+    command
+        .add_flag("--categories", output.areCategoriesShown,
+                  "With --format table: below the bins of an attribute of categories a row for each of them")
+        ->group("Output");
     command.add_flag("--strict", output.isStrict, "End with exit code 3 if an attribute carries a warning or an error")
         ->group("Output");
 }

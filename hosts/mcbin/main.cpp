@@ -145,8 +145,9 @@ std::optional<OutputFile> OpenFile(const std::string& name)
 }
 
 /// Prints and writes what was asked for. \return the exit code.
-int Present(const Outcome& outcome, const OutputOptions& options, std::optional<OutputFile>& report)
+int Present(Outcome outcome, const OutputOptions& options, std::optional<OutputFile>& report)
 {
+    outcome.areCategoriesShown = options.areCategoriesShown;
     const std::exception_ptr failure = report ? WriteReport(*report, outcome) : nullptr;
     WriteOut(Print(outcome, options));
     for (const std::string& note : outcome.notes) Tell(note);

@@ -44,8 +44,9 @@ struct OutputOptions
     Format format = Format::kTable;
     std::string report; ///< the file for the page; empty for none
     SqlOptions sql;
-    bool isStrict = false; ///< the exit code tells of a warning
-    bool isQuiet = false;  ///< no progress line, even on a terminal
+    bool areCategoriesShown = false; ///< in tables
+    bool isStrict = false;           ///< the exit code tells of a warning
+    bool isQuiet = false;            ///< no progress line, even on a terminal
 };
 
 struct BinOptions

@@ -12,6 +12,7 @@ struct Outcome
     Bins bins;
     std::vector<std::string> leftOut; ///< columns of text, each with the reason and an example
     std::vector<std::string> notes;   ///< for the user
+    bool areCategoriesShown = false;  ///< in tables: below the bins of a categorical attribute each of its categories
 };
 
 #endif

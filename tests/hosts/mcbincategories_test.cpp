@@ -133,3 +133,17 @@ TEST_F(McbinCategories, ColumnsWithoutUsableCategoriesAreLeftOutWithTheReason)
               RunOn(few, "supervised", "--target y").err.find("c (2 categories in 9 records, such as"));
     EXPECT_NE(std::string::npos, RunOn(few + "p,1\n", "supervised", "--target y").out.find("c by y"));
 }
+
+TEST_F(McbinCategories, TablesTellOfEachCategoryOnRequest)
+{
+    ASSERT_EQ(0,
+              RunOn(MakeCities(), "supervised", "--target bought --attributes city --format json >bins.json").exitCode);
+
+    // Of Bonn's 12 rows 1 has bought, of all 60 there are 30: ln((1 / 30) / (11 / 30)) = -2.398.
+    const Outcome shown = Run("show bins.json --categories");
+    for (const char* words : {"  each category\n", "  {Bonn}         12   20.0%  11    1   8.3%  -2.398  0.7993",
+                              "  {Aachen}       12   20.0%   1   11  91.7%  +2.398  0.7993"})
+        EXPECT_NE(std::string::npos, shown.out.find(words)) << words << shown.out;
+    EXPECT_EQ(std::string::npos, Run("show bins.json").out.find("{Bonn} "));
+    EXPECT_EQ(Run("supervised data.csv --target bought --attributes city --categories").out, shown.out);
+}

@@ -3,6 +3,7 @@
 #include "bins/labels.h"
 #include "bins/measures.h"
 #include "bins/numbers.h"
+#include "bins/rows.h"
 #include "bins/utf8.h"
 #include "bins/words.h"
 #include "hosts/mcbin/outcome.h"
@@ -63,6 +64,11 @@ void PrintTables(std::ostream& os, const Outcome& outcome, const Screen& screen)
     {
         PrintHeading(os, *result, screen);
         PrintBinTable(os, *result, screen);
+        if (outcome.areCategoriesShown && !result->categories.empty())
+        {
+            os << "  each category\n";
+            PrintBinTable(os, SplitByCategory(*result), screen);
+        }
         PrintStatus(os, *result);
         os << '\n';
     }
