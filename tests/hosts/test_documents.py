@@ -36,10 +36,11 @@ def shell(mcbin, tmp_path):
     return run
 
 
-def test_the_walk_through_shows_what_its_commands_print(shell):
-    blocks = read_blocks("docs/walkthrough.md")
+@pytest.mark.parametrize(("document", "least"), [("docs/walkthrough.md", 7), ("docs/workbench.md", 7)])
+def test_a_guide_shows_what_its_commands_print(shell, document, least):
+    blocks = read_blocks(document)
 
-    assert len(blocks) >= 7
+    assert len(blocks) >= least
     for block in blocks:
         for command, output in read_commands(block):
             assert shell(command).rstrip("\n") == output.rstrip("\n"), command

@@ -12,7 +12,12 @@ GUIDES = [(ROOT / "docs" / name).read_text(encoding="utf-8") for name in ("pytho
 BLOCKS = [block for guide in GUIDES for block in re.findall(r"^```python\n(.*?)^```", guide, re.M | re.S)]
 
 
-@pytest.mark.parametrize("code", BLOCKS, ids=lambda code: code.splitlines()[0])
+WORKBENCH = re.findall(
+    r"^```python\n(.*?)^```", (ROOT / "docs" / "workbench.md").read_text(encoding="utf-8"), re.M | re.S
+)
+
+
+@pytest.mark.parametrize("code", [*BLOCKS, "".join(WORKBENCH)], ids=lambda code: code.splitlines()[0])
 def test_code_of_the_guide_runs(code, tmp_path, monkeypatch):
     (tmp_path / "examples").symlink_to(ROOT / "examples")
     monkeypatch.chdir(tmp_path)
@@ -22,4 +27,5 @@ def test_code_of_the_guide_runs(code, tmp_path, monkeypatch):
 
 
 def test_the_guides_have_their_eight_walks():
+    assert len(WORKBENCH) >= 6
     assert len(BLOCKS) == 8 and len(BLOCKS[0].splitlines()) == 10

@@ -180,12 +180,16 @@ def test_columns_that_can_not_be_categories_are_left_out_with_the_reason():
         "mostly": "text: text among numbers",
         "gone": "text: a single category",
     }
-    for data, reduce in [(table, None), (table.to_reader(max_chunksize=50), None), (duckdb.from_arrow(table), "engine")]:
+    for data, reduce in [
+        (table, None),
+        (table.to_reader(max_chunksize=50), None),
+        (duckdb.from_arrow(table), "engine"),
+    ]:
         bins = mb.supervised_bins(data, "y", missing=missing, reduce=reduce)
         assert bins.left_out == expected and list(bins) == ["good"]
         assert bins["good"].gain == 1.0
     assert len(mb.supervised_bins(table, "y", ["few"])["few"].variable.categories) == 121, "it is named"
-    with pytest.raises(mb.DataError, match="column 'id'.*more than 256 categories"):
+    with pytest.raises(mb.DataError, match=r"column 'id'.*more than 256 categories"):
         mb.supervised_bins(table, "y", ["id"])
     with pytest.raises(mb.DataError, match=r"nothing to bin.*'id' \(text: more than 256 categories\)"):
         mb.supervised_bins(table.select(["id", "y"]), "y")

@@ -331,7 +331,9 @@ def test_copies_and_pickles_are_equal_to_the_last_bit(mixed):
     fitted = mb.SupervisedBinner(encode="interval").fit(mixed[["x", "zoned"]], mixed["y"])
 
     for again in (pickle.loads(pickle.dumps(result)), copy.deepcopy(result), copy.copy(result)):
-        assert again.to_json() == result.to_json() and again.left_out == result.left_out == {"id": "text: more than 256 categories"}
+        assert again.to_json() == result.to_json() and again.left_out == result.left_out == {
+            "id": "text: more than 256 categories"
+        }
         assert [found.labels for found in again.bins] == [found.labels for found in result.bins]
     for found in result.values():
         again = pickle.loads(pickle.dumps(found))

@@ -19,7 +19,6 @@ def grid_factors(positive: int, largest: float) -> tuple[float, float]:
 
 def status_words(code: int, is_warning: bool) -> str: ...
 def describe_not_json(line: int) -> str: ...
-
 def describe_unusable(categories: list[str], records: int) -> str:
     """Why a column of text with these categories, in so many records, is not binned; empty if it is."""
 

@@ -7,6 +7,7 @@ from typing import TYPE_CHECKING
 import numpy as np
 
 from ._features import require
+from ._values import Floats
 
 if TYPE_CHECKING:
     import matplotlib.axes
@@ -55,6 +56,7 @@ def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> m
         ax.set_ylim(0.0, 1.0)
         ax.set_ylabel(f"share of {found.target.name}")
         ax.legend(title=found.target.name, fontsize="small")
+        _add_evidence(ax, found, lefts + widths / 2)
     ticks, texts = list(lefts[1 : found.n_bins]), list(found.border_texts)
     if found.missing is not None:
         ticks.append(lefts[-1] + widths[-1] / 2)
@@ -63,6 +65,18 @@ def plot_bins(found: AttributeBins, ax: matplotlib.axes.Axes | None = None) -> m
     ax.set_xticks(ticks, texts, rotation=45, ha="right")
     ax.set_xlabel(f"{found.attribute}: cut points, over the share of the weight")
     return ax
+
+
+def _add_evidence(ax: matplotlib.axes.Axes, found: AttributeBins, middles: Floats) -> None:
+    """The weights of evidence as a line with an axis of its own, and that of the missing as a point beside it."""
+    if found.woe is None or not np.isfinite(found.woe).all():
+        return
+    line = ax.twinx()
+    line.plot(middles[: found.n_bins], found.woe, "o-", color="black", markersize=4, linewidth=1)
+    if found.missing is not None and found.missing.woe is not None:
+        line.plot(middles[-1:], [found.missing.woe], "o", color="black", markersize=4)
+    line.axhline(0.0, color="black", linewidth=0.5, linestyle=":")
+    line.set_ylabel("weight of evidence")
 
 
 def plot_all(result: BinningResult, columns: int) -> matplotlib.figure.Figure:
@@ -99,7 +113,9 @@ def plot_evaluation(evaluation: AttributeEvaluation, ax: matplotlib.axes.Axes | 
     for offset, colour, name, label in ((-0.2, "0.6", "first", "then"), (0.2, "C0", "second", "now")):
         ax.bar(positions + offset, frame[f"{name}_share"], 0.4, color=colour, label=label)
         if lines is not None and f"{name}_rate" in rates:
-            lines.plot(positions, frame[f"{name}_rate"].astype(float), "o-", color=colour, markeredgecolor="white")
+            figures, is_bin = frame[f"{name}_rate"].astype(float), frame["bin"].notna()
+            for shown, style in ((is_bin, "o-"), (~is_bin, "o")):  # no line leads to the missing
+                lines.plot(positions[shown], figures[shown], style, color=colour, markeredgecolor="white")
     if lines is not None:
         lines.set_ylim(bottom=0.0)
         lines.set_ylabel("rate")

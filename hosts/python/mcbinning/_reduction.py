@@ -60,9 +60,7 @@ class Tally:
     """That of the grid, if a weight has moved."""
 
 
-def bin_reduced(
-    plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progress
-) -> tuple[Plan, _core.Bins]:
+def bin_reduced(plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progress) -> tuple[Plan, _core.Bins]:
     """As the run over all rows, but for what it tells of the reduction. That run itself, where it is to choose and the
     engine would be dearer."""
     assert plan.source.open_engine is not None
