@@ -20,7 +20,7 @@ DATA = "x,<b>&y,buyer,colour,n\n" + "".join(
 )
 
 CELLS = """return [...document.querySelectorAll('section')].map(section =>
-    [...section.querySelectorAll('table tr')].map(row => [...row.cells].map(cell => cell.textContent)))"""
+    [...section.querySelectorAll('table.bins tr')].map(row => [...row.cells].map(cell => cell.textContent)))"""
 
 # Of each rectangle of a chart: where it is on the page, its class, and its colour and that of the class in the key.
 RECTANGLES = """return [...document.querySelectorAll('section')].map(section =>
@@ -130,3 +130,32 @@ def test_the_text_stands_out_from_the_ground(browser, findings, scheme):
 
     assert (ink > ground) == (scheme == "dark")
     assert (max(ink, ground) + 0.05) / (min(ink, ground) + 0.05) >= 7  # what the guidelines on contrast want
+
+
+def test_the_page_of_an_evaluation_has_both_populations_side_by_side(mcbin, browser, tmp_path):
+    head, *rows = DATA.splitlines(keepends=True)
+    (tmp_path / "first.csv").write_text(DATA)
+    (tmp_path / "second.csv").write_text(head + "".join(rows[50:]))
+    command = f"{mcbin} supervised first.csv --target buyer --format json >bins.json"
+    subprocess.run(["bash", "-c", command], cwd=tmp_path, check=True)
+    call = [mcbin, "evaluate", "bins.json", "second.csv", "--report", "page.html", "--format", "json"]
+    done = subprocess.run(call, cwd=tmp_path, capture_output=True, check=True)
+    browser.get((tmp_path / "page.html").as_uri())
+
+    document = json.loads(done.stdout)
+    sections = browser.execute_script(CELLS)
+    assert len(sections) == len(document["attributes"]) > 1
+    for attribute, first, second, (_, _, *shown) in zip(
+        document["attributes"], document["first"]["results"], document["second"]["results"], sections
+    ):
+        assert len(shown) == len(attribute["parts"]) + 1
+        for part, then, now, row in zip(attribute["parts"], groups_of(first), groups_of(second), shown):
+            assert [float(row[2]), float(row[6])] == [then["weight"], now["weight"]]
+            assert row[1] == part["label"] and float(row[-1]) == pytest.approx(part["stability"], abs=1e-4)
+    heights = browser.execute_script(
+        "return [...document.querySelectorAll('section:first-of-type rect.second')].map(r => +r.getAttribute('height'))"
+    )
+    found = [group["weight"] for group in groups_of(document["second"]["results"][0])]
+    assert np.allclose(np.divide(heights, sum(heights)), np.divide(found, sum(found)), atol=1e-3)
+    assert browser.execute_script("return document.querySelectorAll('script, link, img').length") == 0
+    browser.set_window_size(900, 6000)
