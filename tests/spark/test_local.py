@@ -9,6 +9,7 @@ import types
 import warnings
 
 import mcbinning as mb
+import pandas as pd
 import numpy as np
 import pyarrow as pa
 import pyarrow.parquet as pq
@@ -106,11 +107,24 @@ def test_transform_knows_missing_and_unseen_categories(spark):
     document["data"]["missing_text"] = ["NA"]  # as a text file has it
     bins = mb.BinningResult.from_json(json.dumps(document))
     new = spark.createDataFrame([("red",), ("none",), ("NA",), (None,), ("green",)], "x string")
-    assert [row["x_bin"] for row in bins.transform(new, unseen="missing").collect()] == [1, None, None, None, None]
+    assert [row["x_bin"] for row in bins.transform(new, unseen="missing").collect()] == [0, None, None, None, None]
     known = new.where("x IS NULL OR x <> 'green'")
-    assert [row["x_bin"] for row in bins.transform(known).collect()] == [1, None, None, None]
+    assert [row["x_bin"] for row in bins.transform(known).collect()] == [0, None, None, None]
     with pytest.raises(Exception, match="column 'x': green is not among the categories"):
         bins.transform(new).collect()
+
+
+def test_unseen_categories_are_in_the_bin_of_the_rare_ones(spark):
+    values = ["red"] * 20 + ["blue"] * 20 + ["green", "white"]
+    frame = pd.DataFrame({"x": values, "y": [i < 20 for i in range(42)]})
+    bins = mb.supervised_bins(frame, "y", ["x"], rare=0.1)
+    assert bins["x"].variable.rare == ("green", "white")
+
+    new = spark.createDataFrame([("red",), ("green",), ("black",), (None,)], "x string")
+    rows = bins.transform(new).collect()
+    placed = bins.transform(new.toPandas())["x_bin"].tolist()
+    assert [row["x_bin"] for row in rows] == [None if number is pd.NA else number for number in placed]
+    assert rows[1]["x_bin"] == rows[2]["x_bin"] != rows[0]["x_bin"]
 
 
 def test_transform_refuses_what_it_was_not_made_for(spark):
