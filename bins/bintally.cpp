@@ -18,11 +18,12 @@ Bin MakeGroup(std::size_t numCategories)
     return group;
 }
 
-void AddTo(Bin& bin, std::optional<std::size_t> code, double weight)
+/// \param code of the category, if the bin has weights by category.
+void AddTo(Bin& bin, std::size_t code, double weight)
 {
     bin.weight += weight;
-    if (code)
-        bin.weights[*code] += weight;
+    if (!bin.weights.empty())
+        bin.weights[code] += weight;
 }
 
 } // namespace
@@ -46,19 +47,18 @@ BinTally::BinTally(const AttributeBins& bins, bool hasTarget) : fKnown(bins), fB
 void BinTally::Add(const Binner::Found& found, std::optional<std::size_t> code, double weight)
 {
     fBins.weightWithMissing += weight;
-    if (!fHasTarget)
-        code.reset();
-    else if (!code)
+    if (fHasTarget && !code)
         return;
+    const std::size_t category = code.value_or(0);
     if (found.isBad)
-        AddTo(fStrangers.unseen, code, weight);
+        AddTo(fStrangers.unseen, category, weight);
     else if (!found.bin)
-        AddTo(*fBins.missing, code, weight);
+        AddTo(*fBins.missing, category, weight);
     else
     {
-        AddTo(fBins.bins[*found.bin], code, weight);
+        AddTo(fBins.bins[*found.bin], category, weight);
         if (!fBins.categories.empty())
-            AddTo(fBins.categories[static_cast<std::size_t>(found.value)], code, weight);
+            AddTo(fBins.categories[static_cast<std::size_t>(found.value)], category, weight);
         fBins.weight += weight;
         AddValue(found.value, weight);
     }

@@ -33,6 +33,9 @@ public:
     /// \param weight above 0, and one of those whose sums are exact.
     void Add(const Binner::Found& found, std::optional<std::size_t> code, double weight);
 
+    /// Takes in a value of records that have been counted with another one of their bin.
+    void Widen(double value) { AddValue(value, 0.0); }
+
     /// Tells of a category that the bins were made without. After some it does nothing.
     void NameUnseen(std::string_view category);
 

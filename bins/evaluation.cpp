@@ -82,6 +82,14 @@ Evaluation BeginEvaluation(Bins first)
     return evaluation;
 }
 
+void AddResults(Evaluation& whole, const Evaluation& part)
+{
+    const auto append = [](auto& all, const auto& further) { all.insert(all.end(), further.begin(), further.end()); };
+    append(whole.second.results, part.second.results);
+    append(whole.indices, part.indices);
+    append(whole.strangers, part.strangers);
+}
+
 std::vector<EvaluationRow> MakeRows(const Evaluation& evaluation, std::size_t index)
 {
     const AttributeBins& first = evaluation.GetFirst(index);

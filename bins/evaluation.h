@@ -26,6 +26,9 @@ struct Evaluation
 /// An evaluation in which nothing has been counted yet.
 Evaluation BeginEvaluation(Bins first);
 
+/// Adds the results of an evaluation of the same bins in the same population.
+void AddResults(Evaluation& whole, const Evaluation& part);
+
 /// A row of a table of both populations.
 struct EvaluationRow
 {

@@ -2,6 +2,7 @@
 
 from __future__ import annotations
 
+import decimal
 import json
 import pickle
 import subprocess
@@ -38,7 +39,7 @@ def bins(people) -> mb.BinningResult:
 def same(left: mb.AttributeBins, right: mb.AttributeBins) -> bool:
     frames = left.to_pandas(), right.to_pandas()
     figures = [(found.gain, found.minimum, found.maximum, found.weight_with_missing) for found in (left, right)]
-    return frames[0].equals(frames[1]) and figures[0] == figures[1]
+    return frames[0].equals(frames[1]) and np.array_equal(*figures, equal_nan=True)
 
 
 @pytest.mark.parametrize(
@@ -156,3 +157,41 @@ def test_cut_points_of_a_person_s_choice(people, bins):
         bins["age"].move(1.25, 2, people)
     with pytest.raises(ValueError, match="is a cut point already"):
         bins["age"].split(bins["age"].cut_points[0], people)
+
+
+@pytest.mark.parametrize("closed", ["right", "left"])
+def test_an_engine_counts_what_a_run_over_the_rows_counts(people, closed):
+    frame = people.assign(
+        size=np.where(people.index % 50 == 0, np.inf, people["age"] * 1.5),
+        day=pd.Timestamp("2024-01-01") + pd.to_timedelta(people["age"].fillna(0) * 3600.5, unit="s"),
+        price=[decimal.Decimal(int(value * 100)) / 100 for value in people["age"].fillna(1.0)],
+        flag=people["age"] > 50,
+    )
+    names = ["age", "size", "day", "price", "flag", "town"]
+    missing = {"age": [20, (30, 35)], "town": "south"}
+    bins = mb.supervised_bins(frame, "y", names, "w", missing, closed=closed)
+    moved = frame[frame["age"] != 40].assign(town=lambda new: new["town"].replace("west", "a tent"))
+    moved.loc[moved.index[:9], "y"] = "perhaps"
+    moved.loc[moved.index[:50], "size"] = -np.inf
+    warehouse = duckdb.connect()
+    warehouse.register("moved", pa.Table.from_pandas(moved))
+    asked = []
+
+    def run(sql):
+        asked.append(sql)
+        return warehouse.sql(sql)
+
+    for data, source in (
+        (moved, mb.query_source(run, "duckdb", "moved")),
+        (moved.drop(columns="y"), mb.query_source(run, "duckdb", "(SELECT * EXCLUDE (y) FROM moved) AS m")),
+    ):
+        by_rows, by_engine = bins.evaluate(data), bins.evaluate(source)
+        for key in bins:
+            left, right = by_rows[key], by_engine[key]
+            assert same(left.second, right.second) and left.stability == right.stability, key
+            assert (left.weight_below, left.weight_above) == (right.weight_below, right.weight_above)
+            assert (left.unseen_weight, left.unseen_categories) == (right.unseen_weight, right.unseen_categories)
+        assert by_engine.weight_of_unseen_targets == by_rows.weight_of_unseen_targets
+        assert by_engine.second.records == by_rows.second.records == len(moved)
+        assert by_engine.second.weight_grid == by_rows.second.weight_grid
+    assert not any(sql.startswith("SELECT *") and "LIMIT 0" not in sql for sql in asked), "no rows are asked for"

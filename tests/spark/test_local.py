@@ -127,6 +127,35 @@ def test_unseen_categories_are_in_the_bin_of_the_rare_ones(spark):
     assert rows[1]["x_bin"] == rows[2]["x_bin"] != rows[0]["x_bin"]
 
 
+def test_evidence_and_evaluations_are_those_of_the_rows(spark, frame):
+    bins = made_of([0.5, 1.5, None, 2.5, 3.5, None])
+    new = spark.sql(
+        "SELECT * FROM VALUES (0.5D, 1), (NULL, 0), (DOUBLE('NaN'), 1), (9.5D, 0), (-1.0D, 2) AS rows(x, t)"
+    )
+    for encode in ("woe", "rate"):
+        found = bins.transform(new, encode=encode).toArrow()
+        expected = bins.transform(found.select(["x"]), encode=encode)[f"x_{encode}"]
+        assert found[f"x_{encode}"].to_pylist() == expected.to_pylist()
+    texts = made_of(["red", "red", "blue", "none"], missing={"x": "none"})
+    with pytest.raises(Exception, match="column 'x': green is not among the categories"):
+        texts.transform(spark.sql("SELECT 'green' AS x"), encode="rate").collect()
+
+    wide = mb.supervised_bins(frame.toArrow(), "t", [*KINDS, "moment"], weight="w", missing=MISSING | {"w": [0.5]})
+    new = frame.where("ABS(HASH(t, w)) % 3 <> 0")
+    by_rows, by_engine = wide.evaluate(new.toArrow()), wide.evaluate(new)
+    for key in wide:
+        left, right = by_rows[key], by_engine[key]
+        assert figures_of(left) == figures_of(right), key
+    assert by_engine.second.records == by_rows.second.records == new.count()
+
+
+def figures_of(evaluation):
+    second = evaluation.second
+    weights = second.weights.tolist(), second.target_weights.tolist(), second.minimum, second.maximum
+    strangers = evaluation.weight_below, evaluation.weight_above, evaluation.unseen_weight
+    return str((weights, strangers, evaluation.stability))
+
+
 def test_transform_refuses_what_it_was_not_made_for(spark):
     numbers, texts, instants = made_of([1.0, 2.0]), made_of(["a", "b"]), made_of(INSTANTS)
     refusals = [

@@ -153,6 +153,17 @@ class Evaluation:
     indices: list[int]
     weight_of_unseen_targets: float
 
+    @staticmethod
+    def join(
+        first: Bins,
+        parts: list[Evaluation],
+        data_name: str | None,
+        records: int,
+        records_without_weight: int | None,
+        step: float | None,
+        weight_of_unseen_targets: float,
+    ) -> Evaluation:
+        """The whole of an evaluation whose results were found one by one."""
     def rows(self, index: int) -> list[tuple[_Row, _Row, float | None]]: ...
     def flags(self, index: int) -> list[str]: ...
     def outside(self, index: int) -> tuple[float, float]:
@@ -195,8 +206,15 @@ class Feed:
     def set_weights(self, weights: tuple[int, float]) -> None: ...
     def read(self, max_rows: int) -> list[_Floats]: ...
     def spool(self, directory: str) -> None: ...
-    def count(self, first: Bins, counted: list[tuple[int, int, int | None]], data_name: str | None) -> Evaluation:
-        """Counts all records; `counted` are indices of results, of the field of each, and of its target's."""
+    def count(
+        self,
+        first: Bins,
+        counted: list[tuple[int, int, int | None]],
+        data_name: str | None,
+        are_groups: bool = False,
+    ) -> Evaluation:
+        """Counts all records; `counted` are indices of results, of the field of each, and of its target's. A group that
+        weighs 0 has a further value of records that another group counts."""
     def describe(
         self,
         *,

@@ -44,6 +44,10 @@ def count(
         counted.append((index, attribute, fields.add_target(found.target, target)))
     fields.add_weight(weight)
     check_names(source, fields.names)
+    if source.is_reduced and source.open_engine is not None:
+        from ._enginecounting import count_in_engine
+
+        return count_in_engine(result, source, counted, fields.columns)
     feed = fields.open(directory_of(temp_dir))
     return feed.count(result._core, counted, source.name)
 
@@ -57,6 +61,11 @@ class _Fields:
         self._known = [column.name for column in source.columns]
         self._fields: dict[tuple[str, str], Variable] = {}
         """By what the column is for, and its name."""
+
+    @property
+    def columns(self) -> list[tuple[Variable, str]]:
+        """Each variable and the name of its column."""
+        return [(variable, name) for (_, name), variable in self._fields.items()]
 
     @property
     def names(self) -> list[str]:

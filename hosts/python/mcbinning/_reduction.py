@@ -32,32 +32,17 @@ from ._rows import bin_rows
 from ._settings import Reducing, RunSettings
 from ._shapes import Deal, Weights
 from ._sources import open_batches, open_stream
+from ._tallies import EXACT_DIGITS, Tally, number_of, tally_weights
 
 _SECONDS_BETWEEN_REPORTS = 0.2
 _FEW_GROUPS = 1 << 22
 """So many, of some 100 MB, are told one by one even where that need not be."""
 _MOST_TO_LIST = 1 << 10
 """So many values tell that there are too many categories, even if some hundreds of them are declared missing."""
-_EXACT_DIGITS = 15
-"""A decimal of so many digits has a double of its own, which all engines find."""
 
 
 class TooManyGroups(Exception):
     """A group-by gives more groups than may be taken."""
-
-
-@dataclass(frozen=True)
-class Tally:
-    """What is known of all rows before the first attribute is looked at."""
-
-    records: int
-    without_weight: int | None
-    total: float
-    """Of all weights."""
-    weights: Weights
-    """On their grid."""
-    step: float | None
-    """That of the grid, if a weight has moved."""
 
 
 def bin_reduced(plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progress) -> tuple[Plan, _core.Bins]:
@@ -150,26 +135,9 @@ def _reporting_progress(engine: Engine, report: Report | None) -> Iterator[None]
 
 
 def _tally(plan: Plan, queries: CountedQueries) -> Tally:
-    """Checks the weights and puts them on the grid that a run over the rows has."""
     if plan.weight is None:
-        records = int(queries.row(_shapes.check_weights(Weights(None)))["records"])
-        return Tally(records, None, float(records), Weights(None), None)
-    values, interval = plan.missing_of(plan.weight)
-    weights = Weights(plan.weight, plan.rounding, values, interval)
-    found = queries.row(_shapes.check_weights(weights))
-    for fault, words in (("nan", "NaN"), ("negative", "negative"), ("infinite", "infinite")):
-        if found[fault]:
-            number = int(found[fault])
-            raise DataError(f"{number} weights are {words}" if number > 1 else f"one weight is {words}", plan.weight)
-    grid = _core.grid_factors(int(found["positive"]), float(found["largest"]))
-    on_grid = replace(weights, grid=grid if found["positive"] else None)
-    sums = queries.row(_shapes.sum_weights(on_grid))
-    if not math.isfinite(sums["total"]):
-        raise DataError("the weights sum to more than any number", plan.weight)
-    counts = int(found["records"]), int(found["without_weight"])
-    if not sums["moved"]:
-        return Tally(*counts, float(sums["total"]), weights, None)
-    return Tally(*counts, float(sums["total"]), on_grid, grid[0] * grid[1])
+        return tally_weights(Weights(None), queries)
+    return tally_weights(Weights(plan.weight, plan.rounding, *plan.missing_of(plan.weight)), queries)
 
 
 @dataclass(frozen=True)
@@ -375,15 +343,7 @@ class _Reducer:
         return is_walked and attribute not in self._categories and self._number_of(attribute) is not None
 
     def _number_of(self, attribute: str) -> str | None:
-        """SQL for the values of a column as doubles; None if engines may differ in them."""
-        kind = self._schema.field(attribute).type
-        if pa.types.is_timestamp(kind):
-            ticks = self._queries.engine.microseconds(attribute)
-            return None if ticks is None else f"CAST({ticks} AS DOUBLE)"
-        is_exact = pa.types.is_integer(kind) or pa.types.is_floating(kind)
-        if pa.types.is_decimal(kind):
-            is_exact = kind.precision <= _EXACT_DIGITS
-        return _shapes.as_double(attribute) if is_exact else None
+        return number_of(attribute, self._schema, self._queries.engine)
 
     def _has_many_values(self, attribute: str) -> bool:
         """Whether there will be too many groups, as far as an estimate tells."""
@@ -399,9 +359,9 @@ class _Reducer:
 
     def _refuse_wide_decimals(self, weight: str | None) -> None:
         kind = None if weight is None else self._schema.field(weight).type
-        if kind is not None and pa.types.is_decimal(kind) and kind.precision > _EXACT_DIGITS:
+        if kind is not None and pa.types.is_decimal(kind) and kind.precision > EXACT_DIGITS:
             raise DataError(
-                f"weights of more than {_EXACT_DIGITS} digits are rounded by each engine in its own way: cast the "
+                f"weights of more than {EXACT_DIGITS} digits are rounded by each engine in its own way: cast the "
                 "column to doubles in the engine",
                 weight,
             )

@@ -184,6 +184,17 @@ def type_name(value: Any) -> str:
     return {"date": "DATE", "datetime": "TIMESTAMP"}.get(type(value).__name__, "DECIMAL(38, 18)")
 
 
+def _compare(value: str, sign: str, border: float) -> str:
+    """Not every engine has a literal for an infinity, but all have the numbers next to it."""
+    if abs(border) <= LARGEST:
+        return f"{value} {sign} {double(border)}"
+    if sign == "<":
+        return f"{value} <= {double(LARGEST)}" if border > 0 else "FALSE"
+    if sign == ">":
+        return "FALSE" if border > 0 else f"{value} >= {double(-LARGEST)}"
+    return f"{value} > {double(LARGEST)}" if border > 0 else "TRUE"
+
+
 @dataclass(frozen=True)
 class Deal:
     """How the values of one attribute are dealt out into buckets. A bucket's number rises with the value, but for what
@@ -262,6 +273,26 @@ class Deal:
             f"SELECT category_, SUM(weight_) AS weight_ FROM (SELECT {self.category} AS category_, "
             f"CASE WHEN {self.weights.counts} THEN {self.weights.on_grid} ELSE {double(0.0)} END AS weight_ "
             f"FROM {ROWS} WHERE NOT ({self.is_valid})) AS missing_ GROUP BY category_"
+        )
+
+    def count_bins(self, cut_points: Sequence[float], closed: str, extremes: tuple[float, float]) -> str:
+        """The weights of the rows in bins, by category and by where the values lie to the extremes of the bins, each
+        with its least and its largest value. The rows without a valid value are a bin, too."""
+        v = self.number
+        beyond = ">" if closed == "right" else ">="
+        bins = " + ".join(f"CASE WHEN {_compare(v, beyond, cut)} THEN 1 ELSE 0 END" for cut in cut_points) or "0"
+        low, high = extremes
+        region = (
+            f"CASE WHEN {_compare(v, '<', low)} THEN -1 WHEN {_compare(v, '>', high)} THEN 1 ELSE 0 END"
+            if low <= high
+            else "0"
+        )
+        return (
+            "SELECT bin_, region_, category_, MIN(value_) AS low_, MAX(value_) AS high_, SUM(weight_) AS weight_ FROM ("
+            f"SELECT CASE WHEN {self.is_valid} THEN {bins} ELSE -1 END AS bin_, "
+            f"CASE WHEN {self.is_valid} THEN {region} ELSE 0 END AS region_, {self.category} AS category_, "
+            f"{quote_name(self.attribute)} AS value_, {self.weights.on_grid} AS weight_ "
+            f"FROM {ROWS} WHERE {self.weights.counts}) AS counted_ GROUP BY bin_, region_, category_"
         )
 
     def count_values(self, is_exact: bool) -> str:

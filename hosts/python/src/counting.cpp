@@ -29,8 +29,9 @@ Binner::Found Find(const AttributeBins& bins, const Field& field, double value)
 class Counter
 {
 public:
-    Counter(Bins first, const std::vector<Counted>& counted, const std::vector<Field>& fields, WeightGrid grid)
-        : fCounted(counted), fFields(fields), fWeight(FindWeight(fields)), fGrid(grid),
+    Counter(Bins first, const std::vector<Counted>& counted, const std::vector<Field>& fields, WeightGrid grid,
+            bool areGroups)
+        : fCounted(counted), fFields(fields), fWeight(FindWeight(fields)), fGrid(grid), fAreGroups(areGroups),
           fEvaluation(BeginEvaluation(std::move(first)))
     {
         for (const Counted& one : fCounted)
@@ -50,6 +51,8 @@ public:
             const double weight = GetWeight(block, row);
             if (weight > 0.0)
                 AddRecord(block, row, weight);
+            else if (fAreGroups)
+                Widen(block, row);
         }
     }
 
@@ -98,6 +101,19 @@ private:
         }
     }
 
+    /// Of a group whose category is known, or that has none.
+    void Widen(const Block& block, std::size_t row)
+    {
+        for (std::size_t i = 0; i < fTallies.size(); ++i)
+        {
+            const Counted& counted = fCounted[i];
+            const Binner::Found found =
+                Find(fEvaluation.GetFirst(i), fFields[counted.attribute], block.At(counted.attribute, row));
+            if (found.bin && (!counted.target || GetCode(block, row, counted.target)))
+                fTallies[i].Widen(found.value);
+        }
+    }
+
     std::optional<std::size_t> GetCode(const Block& block, std::size_t row, std::optional<std::size_t> target) const
     {
         const double code = target ? block.At(*target, row) : -1.0;
@@ -109,6 +125,7 @@ private:
     const std::vector<Field>& fFields;
     std::optional<std::size_t> fWeight;
     WeightGrid fGrid;
+    bool fAreGroups;
     Evaluation fEvaluation;
     std::vector<BinTally> fTallies; ///< by element of fCounted
     std::set<std::size_t> fTargets;
@@ -119,9 +136,9 @@ private:
 } // namespace
 
 Evaluation CountRecords(Bins first, const std::vector<Counted>& counted, BlockSource& source,
-                        const std::vector<Field>& fields, WeightGrid grid)
+                        const std::vector<Field>& fields, WeightGrid grid, bool areGroups)
 {
-    Counter counter(std::move(first), counted, fields, grid);
+    Counter counter(std::move(first), counted, fields, grid, areGroups);
     Block block(fields.size());
     while (source.Next(block)) counter.Add(block);
     return counter.Finish();

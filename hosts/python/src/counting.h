@@ -21,7 +21,8 @@ struct Counted
 /// Counts all records in the bins of `first`. Its categories are those of the fields, by code; a field that keeps unseen
 /// categories tells their names.
 /// \param grid for the weights, if a field has them.
+/// \param areGroups whether records are groups of equal bins: one that weighs 0 has a further value of a group.
 Evaluation CountRecords(Bins first, const std::vector<Counted>& counted, BlockSource& source,
-                        const std::vector<Field>& fields, WeightGrid grid);
+                        const std::vector<Field>& fields, WeightGrid grid, bool areGroups);
 
 #endif

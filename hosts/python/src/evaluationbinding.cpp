@@ -1,12 +1,19 @@
 #include "hosts/python/src/evaluationbinding.h"
 
 #include "bins/evaluation.h"
+#include "bins/run.h"
 #include "hosts/python/src/rowtuples.h"
 
 #include <nanobind/stl/optional.h>
 #include <nanobind/stl/pair.h>
 #include <nanobind/stl/string.h>
 #include <nanobind/stl/vector.h>
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace nb = nanobind;
 using namespace nb::literals;
@@ -23,12 +30,29 @@ nb::list GetRows(const Evaluation& evaluation, std::size_t index)
     return rows;
 }
 
+/// The whole of an evaluation whose results were found one by one.
+Evaluation Join(Bins first, const std::vector<Evaluation>& parts, const std::optional<std::string>& dataName,
+                std::int64_t numRecords, std::optional<std::int64_t> numWithoutWeight, std::optional<double> step,
+                double weightOfUnseenTargets)
+{
+    Evaluation whole = BeginEvaluation(std::move(first));
+    for (const Evaluation& part : parts) AddResults(whole, part);
+    whole.second.dataName = dataName;
+    whole.second.numRecords = numRecords;
+    whole.second.numRecordsWithoutWeight = numWithoutWeight;
+    SetWeightGrid(whole.second, step);
+    whole.weightOfUnseenTargets = weightOfUnseenTargets;
+    return whole;
+}
+
 } // namespace
 
 void BindEvaluation(nb::module_& module)
 {
     using Self = const Evaluation&;
     nb::class_<Evaluation>(module, "Evaluation")
+        .def_static("join", &Join, "first"_a, "parts"_a, "data_name"_a.none(), "records"_a,
+                    "records_without_weight"_a.none(), "step"_a.none(), "weight_of_unseen_targets"_a)
         .def_ro("first", &Evaluation::first, nb::rv_policy::copy)
         .def_ro("second", &Evaluation::second, nb::rv_policy::copy)
         .def_ro("indices", &Evaluation::indices)

@@ -337,7 +337,8 @@ Bins Feed::Bin(const Settings& settings, const RunRequest& request, const std::o
     return bins;
 }
 
-Evaluation Feed::Count(Bins first, const std::vector<Counted>& counted, const std::optional<std::string>& dataName)
+Evaluation Feed::Count(Bins first, const std::vector<Counted>& counted, const std::optional<std::string>& dataName,
+                       bool areGroups)
 {
     std::optional<TableBlocks> table;
     if (!fSpool)
@@ -349,7 +350,7 @@ Evaluation Feed::Count(Bins first, const std::vector<Counted>& counted, const st
     {
         const nb::gil_scoped_release released;
         PolledBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table);
-        evaluation = CountRecords(std::move(first), counted, blocks, fFields, WeightGrid(tally));
+        evaluation = CountRecords(std::move(first), counted, blocks, fFields, WeightGrid(tally), areGroups);
     }
     evaluation.second.dataName = dataName;
     return evaluation;

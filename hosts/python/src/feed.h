@@ -97,8 +97,9 @@ public:
     Bins Bin(const Settings& settings, const RunRequest& request, const std::optional<std::string>& dataName,
              const nanobind::object& progress);
 
-    /// Counts the records in bins that are there already.
-    Evaluation Count(Bins first, const std::vector<Counted>& counted, const std::optional<std::string>& dataName);
+    /// Counts the records in bins that are there already; `areGroups` is that of CountRecords().
+    Evaluation Count(Bins first, const std::vector<Counted>& counted, const std::optional<std::string>& dataName,
+                     bool areGroups);
 
 private:
     Batches* GetBatches() const;

@@ -56,11 +56,11 @@ Bins DescribeFeed(const Feed& feed, bool hasTargets, std::optional<int> target, 
 /// `counted` has of each result its index, the index of its attribute's field, and that of its target's or None.
 Evaluation CountFeed(Feed& feed, Bins first,
                      const std::vector<std::tuple<std::size_t, std::size_t, std::optional<std::size_t>>>& counted,
-                     const std::optional<std::string>& dataName)
+                     const std::optional<std::string>& dataName, bool areGroups)
 {
     std::vector<Counted> fields;
     for (const auto& [result, attribute, target] : counted) fields.push_back({result, attribute, target});
-    return feed.Count(std::move(first), fields, dataName);
+    return feed.Count(std::move(first), fields, dataName, areGroups);
 }
 
 /// The step of the grid of weights, of which so many are positive, as the product of two powers of two.
@@ -171,7 +171,7 @@ NB_MODULE(_core, module)
         .def("learn", &Feed::Learn)
         .def("read", &Feed::Read, "max_rows"_a)
         .def("spool", &Feed::SpoolRecords, "directory"_a)
-        .def("count", &CountFeed, "first"_a, "counted"_a, "data_name"_a.none())
+        .def("count", &CountFeed, "first"_a, "counted"_a, "data_name"_a.none(), "are_groups"_a = false)
         .def("describe", &DescribeFeed, nb::kw_only(), "has_targets"_a, "target"_a.none() = nb::none(), "n_bins"_a,
              "max_distinct"_a.none() = nb::none(), "small_bin_ratio"_a.none() = nb::none(),
              "smoothing"_a = Settings().smoothing, "right_closed"_a, "data_name"_a.none() = nb::none())
