@@ -9,8 +9,8 @@ import types
 import warnings
 
 import mcbinning as mb
-import pandas as pd
 import numpy as np
+import pandas as pd
 import pyarrow as pa
 import pyarrow.parquet as pq
 import pytest
