@@ -36,18 +36,26 @@ TableReader::TableReader(const TableOptions& options) : fReader(Open(options)), 
 
 void TableReader::NameColumns(const CsvRow& header)
 {
+    std::vector<std::string> given;
     for (std::size_t i = 0; i < header.Size(); ++i)
     {
         const bool isNamed = fHasHeader && !header[i].empty();
-        const std::string name = isNamed ? std::string(header[i]) : "column " + std::to_string(i + 1);
-        std::string unique = name;
-        const auto isTaken = [&]
-        { return std::find(fColumnNames.begin(), fColumnNames.end(), unique) != fColumnNames.end(); };
-        for (int number = 2; isTaken(); ++number) unique = name + "_" + std::to_string(number);
-        if (unique != name)
-            fNotes.push_back("another column is named " + Quote(name) + ", so column " + std::to_string(i + 1) +
-                             " is called " + Quote(unique));
-        fColumnNames.push_back(unique);
+        given.push_back(isNamed ? std::string(header[i]) : "column " + std::to_string(i + 1));
+    }
+    const auto isIn = [](const std::vector<std::string>& names, const std::string& name)
+    { return std::find(names.begin(), names.end(), name) != names.end(); };
+    for (std::size_t i = 0; i < given.size(); ++i)
+    {
+        std::string name = given[i];
+        if (isIn(fColumnNames, name))
+        {
+            // A column that the file names "x_2" keeps its name, so that who asks for it gets no other one.
+            for (int number = 2; isIn(fColumnNames, name) || isIn(given, name); ++number)
+                name = given[i] + "_" + std::to_string(number);
+            fNotes.push_back("another column is named " + Quote(given[i]) + ", so column " + std::to_string(i + 1) +
+                             " is called " + Quote(name));
+        }
+        fColumnNames.push_back(name);
     }
 }
 

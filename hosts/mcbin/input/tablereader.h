@@ -21,9 +21,9 @@ struct TableOptions
     std::string spoolDirectory; ///< for a copy of what can't be read twice by itself; empty for the library's default
 };
 
-/// Reads a table: a delimited file whose first row names the columns, unless there is no such row, and whose every other
-/// row has a field for each of them. A column without a name is called "column 1", "column 2", ... after its position,
-/// and one whose name another has before it gets "_2", "_3", ... behind it.
+/// Reads a table: a delimited file whose first row names the columns, unless there is no such row, and whose every
+/// other row has a field for each of them. A column without a name is called "column 1", "column 2", ... after its
+/// position, and one whose name another has before it gets the first of "_2", "_3", ... behind it that no other has.
 class TableReader
 {
 public:
