@@ -74,7 +74,7 @@ std::vector<OutputColumn> MakeColumns(const TableReader& table, const Bins& bins
 std::string MakeHeader(const TableReader& table, const std::vector<OutputColumn>& columns, bool isInPlace)
 {
     if (!table.GetHeader())
-        return "";
+        return std::string(table.GetMark());
     std::string header = *table.GetHeader();
     if (!isInPlace)
     {

@@ -1,5 +1,7 @@
 #include "tests/hosts/mcbinrun.h"
 
+#include <zstd.h>
+
 #include <algorithm>
 #include <string>
 #include <vector>
@@ -46,6 +48,13 @@ std::string Replace(std::string text, const std::string& what, const std::string
     for (std::size_t at = 0; (at = text.find(what, at)) != std::string::npos; at += with.size())
         text.replace(at, what.size(), with);
     return text;
+}
+
+std::string CompressZstd(const std::string& text)
+{
+    std::string compressed(ZSTD_compressBound(text.size()), '\0');
+    compressed.resize(ZSTD_compress(compressed.data(), compressed.size(), text.data(), text.size(), 3));
+    return compressed;
 }
 
 using McbinInput = Mcbin;
@@ -344,12 +353,7 @@ TEST_F(McbinInput, CompressedFilesAreReadAsWhatTheyStandFor)
     Write("data.csv", heights);
     Shell("gzip -c data.csv >one.gz; head -c 40 data.csv | gzip -c >two.gz; tail -c +41 data.csv | gzip -c >>two.gz; "
           "cp two.gz padded.gz; head -c 512 /dev/zero >>padded.gz");
-    // A frame of zstd with one block that is stored as it is.
-    ASSERT_LT(heights.size(), 256u) << "its size is told in one byte";
-    const std::string stored = {static_cast<char>(heights.size()),
-                                static_cast<char>((heights.size() << 3U | 1U) & 255U),
-                                static_cast<char>(heights.size() >> 5U), '\0'};
-    Write("one.zst", "\x28\xB5\x2F\xFD\x20" + stored + heights);
+    Write("one.zst", CompressZstd(heights.substr(0, 40)) + CompressZstd(heights.substr(40)));
 
     for (const char* command :
          {"mcbin supervised one.gz --target size", "mcbin supervised two.gz --target size",
@@ -366,7 +370,8 @@ TEST_F(McbinInput, CompressedFilesAreReadAsWhatTheyStandFor)
     };
     const Case cases[] = {
         {"head -c 100 one.gz", "file: the compressed data end too early"},
-        {"head -c 100 one.zst", "file: the compressed data end too early"},
+        {"head -c 60 one.zst", "file: the compressed data end too early"},
+        {"head -c 30 one.zst; tail -c +34 one.zst", "file: the zstd data are damaged"},
         {"head -c -8 one.gz; printf 12345678", "file: the gzip data are damaged"},
         {"cat two.gz data.csv", "file: the gzip data are damaged"},
         {"printf 'PK\\003\\004....'", "file: this is zip, and no text; read it with: unzip -p FILE | mcbin"},
@@ -390,6 +395,13 @@ TEST_F(McbinInput, TablesWithoutAHeaderWithCommentsAndWithNamesTwice)
     EXPECT_EQ(named, Shell("cat data.csv | mcbin supervised - --target 'column 2' --no-header").out);
     Shell("mcbin supervised data.csv --target 'column 2' --no-header --format json >bins.json");
     EXPECT_EQ("1,a,0\n2,a,0\n3,b,1\n4,b,1\n", Run("apply bins.json data.csv --no-header").out);
+    Write("data.csv", "\xEF\xBB\xBF"
+                      "1,a\n");
+    EXPECT_EQ("\xEF\xBB\xBF"
+              "1,a,0\n",
+              Run("apply bins.json data.csv --no-header").out);
+    EXPECT_EQ("mcbin: data.csv: --comment: ',' separates the fields\n",
+              RunOn("x,y\n1,a\n2,b\n", "supervised", "--target y --comment ,").err);
 
     for (const char* text : {"# made; by; hand\nx,y\n1,a\n#\n2,\"a\"\n3,b\n# end\n4,b",
                              "# of\r\nx,y\r\n1,a\r\n2,a\r\n#\r\n3,b\r\n4,b\r\n"})

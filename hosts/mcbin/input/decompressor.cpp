@@ -124,6 +124,7 @@ void ThrowIfUnreadable(std::string_view firstBytes, const std::string& name)
     static constexpr Form kForms[] = {
         {{"\xFD\x37\x7A\x58\x5A\x00", 6}, "xz", "xz -dc FILE | mcbin ... -"},
         {{"PK\x03\x04", 4}, "zip", "unzip -p FILE | mcbin ... -"},
+        {{"PK\x05\x06", 4}, "an empty zip", "unzip -p FILE | mcbin ... -"},
         {{"PAR1\x15", 5}, "Parquet", "duckdb -csv -c \"FROM 'FILE'\" | mcbin ... -"},
     };
     for (const Form& form : kForms)

@@ -21,6 +21,8 @@ CsvReader Open(const TableOptions& options)
 
 TableReader::TableReader(const TableOptions& options) : fReader(Open(options)), fHasHeader(options.hasHeader)
 {
+    if (options.comment != '\0' && options.comment == fReader.GetDelimiter())
+        throw MakeFailure("--comment: " + Quote(std::string(1, options.comment)) + " separates the fields");
     const CsvRow* const first = fReader.NextRow();
     if (!first)
         throw MakeFailure(fHasHeader ? "the file is empty; its first line should name the columns"

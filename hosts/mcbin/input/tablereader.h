@@ -34,6 +34,8 @@ public:
     /// The first row as it stands in the file, behind the file's UTF-8 mark if it has one, and without its line end.
     /// Nothing without a header.
     const std::optional<std::string>& GetHeader() const { return fHeader; }
+    /// The file's UTF-8 mark; empty if it has none.
+    std::string_view GetMark() const { return fReader.GetMark(); }
     /// What a user should know of the names of columns.
     const std::vector<std::string>& GetNotes() const { return fNotes; }
     /// What ends the first row; LF if nothing does.
