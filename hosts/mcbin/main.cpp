@@ -3,7 +3,7 @@
 #include "bins/labels.h"
 #include "bins/sql.h"
 #include "hosts/mcbin/apply.h"
-#include "hosts/mcbin/commandline.h"
+#include "hosts/mcbin/commandline/commandline.h"
 #include "hosts/mcbin/evaluate.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/jsoninput.h"

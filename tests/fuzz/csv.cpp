@@ -12,7 +12,7 @@
 #include "bins/numbers.h"
 #include "bins/sql.h"
 #include "hosts/mcbin/apply.h"
-#include "hosts/mcbin/commandline.h"
+#include "hosts/mcbin/commandline/commandline.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/jsoninput.h"
 #include "hosts/mcbin/input/tablereader.h"

@@ -56,7 +56,7 @@ TEST(Edit, JoiningAddsWeightsAndNeedsNoData)
     EXPECT_EQ(ComputeModelEntropy(joined), joined.modelEntropy);
     EXPECT_EQ(1u, MergeBins(FourBins(), 0, 3).bins.size());
 
-    for (const auto& [first, last] : {std::pair(1, 1), std::pair(2, 1), std::pair(1, 4)})
+    for (const auto& [first, last] : {std::pair<std::size_t, std::size_t>(1, 1), {2, 1}, {1, 4}})
         EXPECT_THROW(MergeBins(FourBins(), first, last), std::invalid_argument) << first << ' ' << last;
     EXPECT_THROW(JoinBins(FourBins(), {1, 1}), std::invalid_argument);
     EXPECT_THROW(JoinBins(FourBins(), {3}), std::invalid_argument);
