@@ -55,7 +55,7 @@ std::optional<BinOptions> Parse(const std::string& line, const TempDir& director
     {
         return std::nullopt;
     }
-    if (request.command == Request::Command::kText || request.command == Request::Command::kApply)
+    if (request.command != Request::Command::kSupervised && request.command != Request::Command::kEqualFrequency)
         return std::nullopt;
     BinOptions options = request.bin;
     options.table.file = directory.File("table.csv");
@@ -85,7 +85,7 @@ void PrintAll(const Outcome& outcome)
     PrintTables(os, outcome, {80, true});
     PrintHtml(os, outcome);
     ToCsv(outcome.bins);
-    ToSql(outcome.bins, {SqlDialect::kDuckDb, true});
+    ToSql(outcome.bins, {SqlDialect::kDuckDb, Encoding::kLabel, true, "t"});
 }
 
 ApplyOptions MakeApplyOptions(const BinOptions& options, const TempDir& directory, char delimiter)

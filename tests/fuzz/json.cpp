@@ -198,7 +198,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* bytes, std::size_t siz
     const bool isWhole = Apply(options);
     if (isWhole)
         CheckOutput(options);
-    options.areLabels = true;
+    options.encoding = Encoding::kLabel;
     Check(Apply(options) == isWhole, "labels fail where numbers don't, or the other way round");
     if (isWhole)
         CheckOutput(options);

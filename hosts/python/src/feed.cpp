@@ -225,6 +225,7 @@ std::vector<CategoryCodes> Feed::CountCategories(const std::vector<std::pair<int
     Interrupts interrupts;
     const std::vector<std::shared_ptr<const Variable>> variables = MakeVariables(fFields, std::nullopt);
     std::vector<CategoryTally::Pair> counted;
+    counted.reserve(pairs.size());
     for (const auto& [attribute, target] : pairs) counted.push_back({attribute, target});
     CategoryTally tally(variables, counted);
     {

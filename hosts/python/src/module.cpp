@@ -59,6 +59,7 @@ Evaluation CountFeed(Feed& feed, Bins first,
                      const std::optional<std::string>& dataName, bool areGroups)
 {
     std::vector<Counted> fields;
+    fields.reserve(counted.size());
     for (const auto& [result, attribute, target] : counted) fields.push_back({result, attribute, target});
     return feed.Count(std::move(first), fields, dataName, areGroups);
 }
