@@ -143,6 +143,7 @@ struct Settings
         maxDistinct; ///< supervised: an attribute with more distinct values is pre-binned; nothing: never
     std::optional<double> smallBinRatio; ///< supervised: the ratio to the lighter neighbour below which a bin is merged
     double smoothing = 0.5;              ///< that of the results
+    bool areCutsRounded = false;         ///< a cut point is the shortest decimal between the values beside it
 };
 
 /// How records were reduced to groups of equal values, each with its weight, before they were binned; or why not.

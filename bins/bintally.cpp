@@ -30,6 +30,7 @@ void AddTo(Bin& bin, std::size_t code, double weight)
 
 BinTally::BinTally(const AttributeBins& bins, bool hasTarget) : fKnown(bins), fBins(Recut(bins, bins.cutPoints))
 {
+    fRanges.resize(fBins.bins.size());
     fHasTarget = hasTarget && bins.target != nullptr;
     fBins.isEdited = bins.isEdited;
     if (!fHasTarget)
@@ -47,6 +48,8 @@ BinTally::BinTally(const AttributeBins& bins, bool hasTarget) : fKnown(bins), fB
 void BinTally::Add(const Binner::Found& found, std::optional<std::size_t> code, double weight)
 {
     fBins.weightWithMissing += weight;
+    if (found.bin)
+        fRanges[*found.bin].Add(found.value);
     if (fHasTarget && !code)
         return;
     const std::size_t category = code.value_or(0);
@@ -62,6 +65,15 @@ void BinTally::Add(const Binner::Found& found, std::optional<std::size_t> code, 
         fBins.weight += weight;
         AddValue(found.value, weight);
     }
+}
+
+void BinTally::Widen(const Binner::Found& found, std::optional<std::size_t> code)
+{
+    if (!found.bin)
+        return;
+    fRanges[*found.bin].Add(found.value);
+    if (!fHasTarget || code)
+        AddValue(found.value, 0.0);
 }
 
 void BinTally::AddValue(double value, double weight)

@@ -4,7 +4,9 @@
 #include "bins/binner.h"
 #include "bins/bins.h"
 
+#include <algorithm>
 #include <cstddef>
+#include <limits>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -17,6 +19,23 @@ struct Strangers
     std::vector<std::string> unseenCategories; ///< the first few of these, as they came
     double below = 0.0;                        ///< weight of the values below the least that the bins were made of
     double above = 0.0;                        ///< weight of the values above the largest
+};
+
+/// What values lie between; no value if it is empty.
+struct ValueRange
+{
+    double least = std::numeric_limits<double>::infinity();
+    double largest = -std::numeric_limits<double>::infinity();
+
+    bool IsEmpty() const { return least > largest; }
+
+    void Add(double value) { Add({value, value}); }
+
+    void Add(const ValueRange& other)
+    {
+        least = std::min(least, other.least);
+        largest = std::max(largest, other.largest);
+    }
 };
 
 /// Counts records in bins that are there already.
@@ -34,7 +53,7 @@ public:
     void Add(const Binner::Found& found, std::optional<std::size_t> code, double weight);
 
     /// Takes in a value of records that have been counted with another one of their bin.
-    void Widen(double value) { AddValue(value, 0.0); }
+    void Widen(const Binner::Found& found, std::optional<std::size_t> code);
 
     /// Tells of a category that the bins were made without. After some it does nothing.
     void NameUnseen(std::string_view category);
@@ -44,12 +63,16 @@ public:
 
     const Strangers& GetStrangers() const { return fStrangers; }
 
+    /// By bin: the values of all records, those without a category among them.
+    const std::vector<ValueRange>& GetRanges() const { return fRanges; }
+
 private:
     void AddValue(double value, double weight);
 
     const AttributeBins& fKnown;
     AttributeBins fBins; ///< counted
     Strangers fStrangers;
+    std::vector<ValueRange> fRanges;
     bool fHasTarget;
 };
 

@@ -88,6 +88,7 @@ void AddResults(Evaluation& whole, const Evaluation& part)
     append(whole.second.results, part.second.results);
     append(whole.indices, part.indices);
     append(whole.strangers, part.strangers);
+    append(whole.ranges, part.ranges);
 }
 
 std::vector<EvaluationRow> MakeRows(const Evaluation& evaluation, std::size_t index)

@@ -14,9 +14,10 @@
 struct Evaluation
 {
     Bins first;
-    Bins second;                        ///< its results are those of `first` that have bins
-    std::vector<std::size_t> indices;   ///< by result of `second`: that of `first`
-    std::vector<Strangers> strangers;   ///< by result of `second`
+    Bins second;                                 ///< its results are those of `first` that have bins
+    std::vector<std::size_t> indices;            ///< by result of `second`: that of `first`
+    std::vector<Strangers> strangers;            ///< by result of `second`
+    std::vector<std::vector<ValueRange>> ranges; ///< by result of `second`, and by its bin
     double weightOfUnseenTargets = 0.0; ///< of records in `second` with a category of a target that is not known
 
     const AttributeBins& GetFirst(std::size_t index) const { return first.results[indices[index]]; }

@@ -35,6 +35,9 @@ inline constexpr Names<BinRow::Kind, 4> kRowNames = {{"bin", BinRow::Kind::kBin}
                                                      {"unseen", BinRow::Kind::kUnseen},
                                                      {"total", BinRow::Kind::kTotal}};
 
+/// Whether cut points are rounded; those that are not have no name.
+inline constexpr Names<bool, 1> kRoundNames = {{"auto", true}};
+
 /// Whether numbers of distinct values are exact.
 inline constexpr Names<bool, 2> kDistinctNames = {{"exact", true}, {"approximate", false}};
 

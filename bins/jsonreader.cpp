@@ -48,6 +48,8 @@ private:
         // Until there was smoothing, there was none.
         const auto smoothing = json.Find("smoothing");
         settings.smoothing = smoothing ? smoothing->GetNumber() : 0.0;
+        if (const auto round = json.Find("round"); round && !round->IsNull())
+            settings.areCutsRounded = round->Choose(kRoundNames);
         return settings;
     }
 

@@ -23,11 +23,14 @@ JsonValue ToValue(const std::string& number)
 JsonValue ToValue(const Settings& settings)
 {
     const bool isSupervised = settings.method == Method::kSupervised;
-    return Object{{"closed", GetName(kClosedNames, settings.isRightClosed)},
+    Object object{{"closed", GetName(kClosedNames, settings.isRightClosed)},
                   {"n_bins", settings.numBins},
                   {"max_distinct", settings.maxDistinct},
                   {"small_bin_ratio", settings.smallBinRatio},
                   {"smoothing", isSupervised ? JsonValue(settings.smoothing) : JsonValue()}};
+    if (settings.areCutsRounded)
+        object.push_back({"round", GetName(kRoundNames, true)});
+    return object;
 }
 
 JsonValue ToValue(const MCBinning::MCStatus& status)

@@ -1,6 +1,7 @@
 #include "hosts/mcbin/evaluate.h"
 
 #include "bins/binner.h"
+#include "bins/cutrounding.h"
 #include "bins/run.h"
 #include "bins/text.h"
 #include "hosts/mcbin/cutpoints.h"
@@ -215,6 +216,7 @@ private:
         {
             second.results.push_back(column.tally.GetBins());
             fEvaluated.evaluation.strangers.push_back(column.tally.GetStrangers());
+            fEvaluated.evaluation.ranges.push_back(column.tally.GetRanges());
         }
     }
 
@@ -245,4 +247,15 @@ Evaluated EvaluateBins(const EvaluateOptions& options, Progress& progress)
     TableReader table(tableOptions);
     Bins bins = MakeBinsOfCutPoints(table, options, progress);
     return Evaluator(table, std::move(bins), options).Run(progress);
+}
+
+Bins RoundCutPoints(TableReader& table, Bins bins, const BinOptions& options, Progress& progress)
+{
+    const auto hasBins = [](const AttributeBins& result) { return result.HasBins(); };
+    if (std::none_of(bins.results.begin(), bins.results.end(), hasBins))
+        return bins;
+    table.Rewind();
+    EvaluateOptions counting;
+    counting.columns.isBadMissing = options.columns.isBadMissing;
+    return RoundCutPoints(Evaluator(table, std::move(bins), counting).Run(progress).evaluation);
 }

@@ -26,6 +26,7 @@
 #include <new>
 #include <optional>
 #include <sstream>
+#include <utility>
 
 #include <unistd.h>
 
@@ -196,7 +197,10 @@ int Bin(const BinOptions& options)
     tableOptions.spoolDirectory = options.tempDirectory;
     TableReader table(tableOptions);
     std::optional<OutputFile> report = OpenFile(options.output.report);
-    return Present(FindBins(table, options, progress), options.output, report);
+    Outcome outcome = FindBins(table, options, progress);
+    if (options.areCutsRounded && !IsInterrupted())
+        outcome.bins = RoundCutPoints(table, std::move(outcome.bins), options, progress);
+    return Present(std::move(outcome), options.output, report);
 }
 
 int Run(int argc, char** argv)

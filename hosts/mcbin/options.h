@@ -54,7 +54,8 @@ struct BinOptions
     TableOptions table;
     ColumnOptions columns;
     Settings settings;
-    std::string tempDirectory; ///< empty for the library's default
+    bool areCutsRounded = false; ///< to the shortest decimals between the values
+    std::string tempDirectory;   ///< empty for the library's default
     OutputOptions output;
 };
 

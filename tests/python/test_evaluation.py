@@ -195,3 +195,33 @@ def test_an_engine_counts_what_a_run_over_the_rows_counts(people, closed):
         assert by_engine.second.records == by_rows.second.records == len(moved)
         assert by_engine.second.weight_grid == by_rows.second.weight_grid
     assert not any(sql.startswith("SELECT *") and "LIMIT 0" not in sql for sql in asked), "no rows are asked for"
+
+
+FORMS = {
+    "pandas": lambda frame: frame,
+    "a stream": lambda frame: pa.Table.from_pandas(frame).to_reader(),
+    "DuckDB": duckdb.from_df,
+}
+
+
+@pytest.mark.parametrize("closed", ["right", "left"])
+@pytest.mark.parametrize("weight", [None, "w"])
+def test_rounded_cut_points_move_no_record(people, closed, weight):
+    people["age"] += np.random.default_rng(2).random(len(people))
+    chosen = {"attributes": ["age", "town"], "weight": weight, "closed": closed}
+    bins = mb.supervised_bins(people, "y", **chosen)
+    rounded = {name: mb.supervised_bins(form(people), "y", round="auto", **chosen) for name, form in FORMS.items()}
+    engine = mb.supervised_bins(duckdb.from_df(people), "y", round="auto", reduce="engine", **chosen)
+    equal = mb.equal_frequency_bins(FORMS["a stream"](people), ["age"], weight, closed=closed, round="auto")
+
+    for found in [*rounded.values(), engine, mb.BinningResult.from_json(engine.to_json())]:
+        assert found.settings.round == "auto" and bins.settings.round is None
+        assert found["age"].cut_points.tolist() == rounded["pandas"]["age"].cut_points.tolist()
+        assert all(len(str(cut)) <= 6 for cut in found["age"].cut_points)
+        assert found.transform(people).equals(bins.transform(people))
+        assert np.array_equal(found["age"].weights, bins["age"].weights)
+        assert same(found["town"], bins["town"])
+    plain = mb.equal_frequency_bins(people, ["age"], weight, closed=closed)
+    assert equal.transform(people).equals(plain.transform(people)) and not same(equal["age"], plain["age"])
+    with pytest.raises(ValueError, match="round must be 'auto' or None, not 'up'"):
+        mb.supervised_bins(people, "y", round="up")

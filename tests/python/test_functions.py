@@ -79,10 +79,12 @@ def test_same_bits_as_the_command_line_tool(mcbin, tmp_path, closed):
         return json.loads(call.stdout)
 
     supervised = run("supervised", str(IRIS), "--target", "species", "--closed", closed)
+    rounded = run("supervised", str(IRIS), "--target", "species", "--closed", closed, "--round-cuts")
     equal = run("equal-frequency", str(IRIS), "--bins", "7", "--closed", closed)
 
     for native, own in (
         (supervised, mb.supervised_bins(IRIS, "species", closed=closed)),
+        (rounded, mb.supervised_bins(IRIS, "species", closed=closed, round="auto")),
         (equal, mb.equal_frequency_bins(IRIS, n_bins=7, closed=closed)),
     ):
         ours = json.loads(own.to_json())["results"]

@@ -191,6 +191,11 @@ void AddTempDirectory(CLI::App& command, std::string& tempDirectory)
 void AddSettings(CLI::App& command, BinOptions& options)
 {
     AddClosed(command, options.settings);
+    command
+        .add_flag("--round-cuts", options.areCutsRounded,
+                  "Make each cut point the shortest decimal between the values that it parts, which moves no record; "
+                  "the table is read once more")
+        ->group("Settings");
     AddTempDirectory(command, options.tempDirectory);
 }
 

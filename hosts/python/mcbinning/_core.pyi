@@ -116,6 +116,7 @@ class Bins:
     max_distinct: int | None
     small_bin_ratio: float | None
     smoothing: float
+    round: str | None
     data_name: str | None
     records: int | None
     records_without_weight: int | None
@@ -169,6 +170,8 @@ class Evaluation:
     def outside(self, index: int) -> tuple[float, float]:
         """The weights of values below and above those that the bins were made of."""
     def unseen(self, index: int) -> tuple[float, list[str]]: ...
+    def round_cut_points(self) -> Bins:
+        """The first bins, with the shortest decimals between the values of the second ones as cut points."""
     def to_json(self) -> str: ...
     def to_csv(self) -> str: ...
 

@@ -15,7 +15,7 @@ from ._result import BinningResult
 from ._runs import run
 from ._settings import Reducing, RunSettings, check_settings, check_share, directory_of
 from ._sources import name_of
-from ._types import CategoryOrder, Closed, Distinct, MemoryLimit, Missing, Reduce, Rounding
+from ._types import CategoryOrder, Closed, Distinct, MemoryLimit, Missing, Reduce, Round, Rounding
 
 
 def supervised_bins(
@@ -33,6 +33,7 @@ def supervised_bins(
     closed: Closed = "right",
     small_bin_ratio: float = 0.0,
     smoothing: float = 0.5,
+    round: Round | None = None,
     rounding: Rounding = "none",
     reduce: Reduce | None = None,
     max_groups: int = 20_000_000,
@@ -90,6 +91,9 @@ def supervised_bins(
     smoothing : float, default=0.5
         What is added to the weights of a bin's events and others for the weight of evidence, where one of them is 0.
         With 0 such a weight of evidence is infinite.
+    round : {"auto"}, default=None
+        "auto": each cut point between numbers becomes the shortest decimal between the values that it parts, such as
+        34.5 for 34.4871, so that no record comes into another bin. The data are read once more for it.
     rounding : {"none", "truncate", "closest"}, default="none"
         Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
         two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
@@ -162,7 +166,7 @@ def supervised_bins(
         raise TypeError("either target or pairs must be given")
     if pairs is not None and attributes is not None:
         raise TypeError("pairs name the attributes, so attributes can't be given, too")
-    check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding, smoothing=smoothing)
+    check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding, smoothing=smoothing, round=round)
     order = name_orders(category_order)
     check_share("rare", rare)
     reducing = Reducing(reduce, max_groups, distinct)
@@ -185,7 +189,8 @@ def supervised_bins(
         rare=rare,
         left_out={} if is_chosen else columns_left_out(source, [target, weight], True),
     )
-    settings = RunSettings(n_bins, max_distinct, small_bin_ratio, smoothing, closed == "right", directory_of(temp_dir))
+    directory = directory_of(temp_dir)
+    settings = RunSettings(n_bins, max_distinct, small_bin_ratio, smoothing, closed == "right", round, directory)
     plan, bins = run(plan, settings, reducing, progress)
     return make_result(bins, plan.left_out)
 
@@ -200,6 +205,7 @@ def equal_frequency_bins(
     rare: float = 0.0,
     n_bins: int = 10,
     closed: Closed = "right",
+    round: Round | None = None,
     rounding: Rounding = "none",
     reduce: Reduce | None = None,
     max_groups: int = 20_000_000,
@@ -236,6 +242,8 @@ def equal_frequency_bins(
         The number of bins, at least 2.
     closed : {"right", "left"}, default="right"
         The side of a bin that belongs to it: (a, b] or [a, b).
+    round : {"auto"}, default=None
+        "auto": each cut point between numbers becomes the shortest decimal between the values that it parts.
     rounding : {"none", "truncate", "closest"}, default="none"
         Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
         two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
@@ -283,7 +291,7 @@ def equal_frequency_bins(
     >>> bins["income"].weights.tolist()
     [25.0, 25.0, 25.0, 25.0]
     """
-    check_settings(closed, n_bins, rounding=rounding)
+    check_settings(closed, n_bins, rounding=rounding, round=round)
     check_share("rare", rare)
     reducing = Reducing(reduce, max_groups, distinct)
     source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
@@ -300,6 +308,6 @@ def equal_frequency_bins(
         rare=rare,
         left_out=columns_left_out(source, [weight], False) if attributes is None else {},
     )
-    settings = RunSettings(n_bins, None, None, 0.5, closed == "right", directory_of(temp_dir))
+    settings = RunSettings(n_bins, None, None, 0.5, closed == "right", round, directory_of(temp_dir))
     plan, bins = run(plan, settings, reducing, progress)
     return make_result(bins, plan.left_out)

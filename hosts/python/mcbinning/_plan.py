@@ -133,12 +133,13 @@ class Plan:
         in_order = [column.name for column in self.source.columns if column.name in taking_part]
         return in_order + sorted(name for name in taking_part if name is not None and name not in in_order)
 
-    def open_feed(self, directory: str) -> tuple[Plan, _core.Feed]:
+    def open_feed(self, directory: str, is_read_again: bool = False) -> tuple[Plan, _core.Feed]:
         """The plan without the optional columns that can't be binned, and a feed of its columns that knows all
-        categories and what the weights are like."""
+        categories and what the weights are like. Records that come only once are kept for it if they are needed twice,
+        or are to be read again."""
         categorical = self.categorical
         to_learn = categorical if self.weight is None else [*categorical, self.weight]
-        if not to_learn:
+        if not to_learn and not (is_read_again and self.source.is_once):
             return self, self._feed_columns(self.names)
         if self.source.is_once:
             feed = self._feed_columns(self.names)

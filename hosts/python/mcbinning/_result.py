@@ -15,7 +15,7 @@ from ._features import require
 from ._json import read_bins, write_text
 from ._sources import name_of
 from ._status import Status
-from ._types import Closed, Distinct, Encoding, MemoryLimit, Method, Unseen
+from ._types import Closed, Distinct, Encoding, MemoryLimit, Method, Round, Unseen
 
 if TYPE_CHECKING:
     import matplotlib.axes
@@ -33,6 +33,7 @@ class Settings:
     max_distinct: int | None
     small_bin_ratio: float | None
     smoothing: float
+    round: Round | None
 
 
 @dataclass(frozen=True)
@@ -64,7 +65,12 @@ class BinningResult(Mapping[Any, AttributeBins]):
         self._core = core
         self.method = cast(Method, core.method)
         self.settings = Settings(
-            cast(Closed, core.closed), core.n_bins, core.max_distinct, core.small_bin_ratio, core.smoothing
+            cast(Closed, core.closed),
+            core.n_bins,
+            core.max_distinct,
+            core.small_bin_ratio,
+            core.smoothing,
+            cast("Round | None", core.round),
         )
         self.variables = tuple(map(Variable.from_core, core.variables))
         self.status = Status.from_core(core.status)

@@ -21,10 +21,19 @@ def run(plan: Plan, settings: RunSettings, reducing: Reducing, progress: Progres
     if is_reduced and source.open_engine is not None:
         from ._reduction import bin_reduced
 
-        return bin_reduced(plan, settings, reducing, progress)
-    plan, feed = plan.open_feed(settings.temp_dir)
+        plan, bins = bin_reduced(plan, settings, reducing, progress)
+        return plan, bins if settings.round is None else _round(plan, bins, None, settings.temp_dir)
+    plan, feed = plan.open_feed(settings.temp_dir, is_read_again=settings.round is not None)
     with reporting(progress, plan.names, len(plan.pairs), source.rows) as report:
         bins = bin_rows(plan, feed, settings, report)
     if reducing.reduce == "auto":
         bins.reduction = _core.Reduction("", "no engine has the data", 0, True, [])
+    if settings.round is not None:
+        bins = _round(plan, bins, feed if source.is_once else None, settings.temp_dir)
     return plan, bins
+
+
+def _round(plan: Plan, bins: _core.Bins, feed: _core.Feed | None, temp_dir: str) -> _core.Bins:
+    from ._rounding import round_cut_points  # which needs pyarrow
+
+    return round_cut_points(plan, bins, feed, temp_dir)

@@ -11,7 +11,7 @@ from typing import Any
 from . import _core
 from ._errors import BinningError
 from ._status import TEMP_DIR_NOT_FOUND, Status
-from ._types import Distinct, Reduce
+from ._types import Distinct, Reduce, Round
 
 _LARGEST_INT = 2**31 - 1
 
@@ -25,6 +25,7 @@ class RunSettings:
     small_bin_ratio: float | None
     smoothing: float
     right_closed: bool
+    round: Round | None
     temp_dir: str
 
     @property
@@ -58,6 +59,7 @@ def check_settings(
     *,
     rounding: str = "none",
     smoothing: float = 0.5,
+    round: str | None = None,
 ) -> None:
     if closed not in ("right", "left"):
         raise ValueError(f"closed must be 'right' or 'left', not {closed!r}")
@@ -67,6 +69,8 @@ def check_settings(
     check_share("small_bin_ratio", small_bin_ratio)
     if not 0.0 <= smoothing < math.inf:
         raise ValueError(f"smoothing must be a finite number of at least 0, not {smoothing}")
+    if round not in (None, "auto"):
+        raise ValueError(f"round must be 'auto' or None, not {round!r}")
     if rounding not in ("none", "truncate", "closest"):
         raise ValueError(f"rounding must be 'none', 'truncate' or 'closest', not {rounding!r}")
 

@@ -68,6 +68,7 @@ public:
             for (const std::string& name : fFields[fCounted[i].attribute].unseenNames) fTallies[i].NameUnseen(name);
             second.results.push_back(fTallies[i].GetBins());
             fEvaluation.strangers.push_back(fTallies[i].GetStrangers());
+            fEvaluation.ranges.push_back(fTallies[i].GetRanges());
         }
         return std::move(fEvaluation);
     }
@@ -101,7 +102,7 @@ private:
         }
     }
 
-    /// Of a group whose category is known, or that has none.
+    /// Of a group that was counted already.
     void Widen(const Block& block, std::size_t row)
     {
         for (std::size_t i = 0; i < fTallies.size(); ++i)
@@ -109,8 +110,7 @@ private:
             const Counted& counted = fCounted[i];
             const Binner::Found found =
                 Find(fEvaluation.GetFirst(i), fFields[counted.attribute], block.At(counted.attribute, row));
-            if (found.bin && (!counted.target || GetCode(block, row, counted.target)))
-                fTallies[i].Widen(found.value);
+            fTallies[i].Widen(found, GetCode(block, row, counted.target));
         }
     }
 

@@ -1,5 +1,6 @@
 #include "hosts/python/src/evaluationbinding.h"
 
+#include "bins/cutrounding.h"
 #include "bins/evaluation.h"
 #include "bins/run.h"
 #include "hosts/python/src/rowtuples.h"
@@ -69,6 +70,7 @@ void BindEvaluation(nb::module_& module)
             [](Self self, std::size_t index)
             { return std::pair(self.strangers.at(index).unseen.weight, self.strangers.at(index).unseenCategories); },
             "index"_a)
+        .def("round_cut_points", &RoundCutPoints)
         .def("to_json", [](Self self) { return ToJson(self); })
         .def("to_csv", [](Self self) { return ToCsv(self); });
 }

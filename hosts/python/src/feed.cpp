@@ -219,9 +219,7 @@ std::vector<CategoryCodes> Feed::CountCategories(const std::vector<std::pair<int
                                                  double rareShare, bool isByRate)
 {
     std::optional<TableBlocks> table;
-    if (!fSpool)
-        table.emplace(GetBatches(), fFields);
-    LibraryBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table, fFields, GetTally());
+    LibraryBlocks blocks(OpenBlocks(table), fFields, GetTally());
     Interrupts interrupts;
     const std::vector<std::shared_ptr<const Variable>> variables = MakeVariables(fFields, std::nullopt);
     std::vector<CategoryTally::Pair> counted;
@@ -234,8 +232,6 @@ std::vector<CategoryCodes> Feed::CountCategories(const std::vector<std::pair<int
         while (records.HasNext()) tally.Add(*records.Next());
     }
     interrupts.Rethrow();
-    if (fSpool)
-        fSpool->Rewind();
     std::vector<CategoryCodes> codes;
     for (const CategoryTally::Pair& pair : counted)
     {
@@ -325,9 +321,7 @@ Bins Feed::Bin(const Settings& settings, const RunRequest& request, const std::o
                const nb::object& progress)
 {
     std::optional<TableBlocks> table;
-    if (!fSpool)
-        table.emplace(GetBatches(), fFields);
-    LibraryBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table, fFields, GetTally());
+    LibraryBlocks blocks(OpenBlocks(table), fFields, GetTally());
     Interrupts interrupts;
     Bins bins = Describe(settings, request.target, dataName);
     {
@@ -342,19 +336,26 @@ Evaluation Feed::Count(Bins first, const std::vector<Counted>& counted, const st
                        bool areGroups)
 {
     std::optional<TableBlocks> table;
-    if (!fSpool)
-        table.emplace(GetBatches(), fFields);
     WeightTally tally = fWeights.value_or(WeightTally());
     if (const std::optional<std::size_t> index = FindWeight(fFields))
         tally.rounding = fFields[*index].rounding;
+    BlockSource& records = OpenBlocks(table);
     Evaluation evaluation;
     {
         const nb::gil_scoped_release released;
-        PolledBlocks blocks(fSpool ? static_cast<BlockSource&>(*fSpool) : *table);
+        PolledBlocks blocks(records);
         evaluation = CountRecords(std::move(first), counted, blocks, fFields, WeightGrid(tally), areGroups);
     }
     evaluation.second.dataName = dataName;
     return evaluation;
+}
+
+BlockSource& Feed::OpenBlocks(std::optional<TableBlocks>& table)
+{
+    if (!fSpool)
+        return table.emplace(GetBatches(), fFields);
+    fSpool->Rewind();
+    return *fSpool;
 }
 
 Batches* Feed::GetBatches() const

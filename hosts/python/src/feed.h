@@ -102,6 +102,9 @@ public:
                      bool areGroups);
 
 private:
+    /// All records, from the first on. `table` holds what reads them, if they are not kept in a file.
+    BlockSource& OpenBlocks(std::optional<TableBlocks>& table);
+
     Batches* GetBatches() const;
     void TallyArray();
     WeightTally GetTally();
