@@ -2,8 +2,10 @@
 
 #include "bins/text.h"
 #include "hosts/mcbin/commandline/commands.h"
+#include "hosts/mcbin/commandline/completion.h"
+#include "hosts/mcbin/commandline/manpage.h"
+#include "hosts/mcbin/commandline/toolhelp.h"
 #include "hosts/mcbin/helptexts.h"
-#include "hosts/mcbin/manpage.h"
 #include "hosts/mcbin/spelling.h"
 
 #include <mcobnqrt/binfactory.h>
@@ -18,6 +20,7 @@
 #include <optional>
 #include <sstream>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace
@@ -77,15 +80,25 @@ std::unique_ptr<CLI::App> MakeApp(Request& request)
         std::make_unique<CLI::App>("Finds bins in the columns of a text file, shows them, and applies them.", "mcbin");
     app->require_subcommand(0, 1);
     app->set_version_flag("--version", GetVersion);
+    const auto print = [&request](std::string text)
+    {
+        request.command = Request::Command::kText;
+        request.text = std::move(text);
+    };
     app->add_flag_callback(
-           "--man",
-           [&request, tool = app.get()]
-           {
-               request.command = Request::Command::kText;
-               request.text = MakeManPage(DescribeTool(*tool));
-           },
+           "--man", [print, tool = app.get()] { print(MakeManPage(DescribeTool(*tool))); },
            "Print this as a manual page, for man")
         ->group("");
+    app->add_option_function<std::string>(
+           "--completion",
+           [print, tool = app.get()](const std::string& shell)
+           {
+               const ToolHelp help = DescribeTool(*tool);
+               print(shell == "bash" ? MakeBashCompletion(help) : MakeZshCompletion(help));
+           },
+           "Print a script by which the shell completes commands and options")
+        ->check(CLI::IsMember({"bash", "zsh"}))
+        ->option_text("bash|zsh");
     app->footer(std::string("'mcbin COMMAND --help' tells of the options of a command.\n\n") + kExitCodes);
     AddSupervised(*app, request);
     AddEqualFrequency(*app, request);

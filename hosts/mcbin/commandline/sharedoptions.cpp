@@ -244,10 +244,9 @@ void AddOutput(CLI::App& command, OutputOptions& output)
             },
             "table: to read (the default), with control characters of the data as \\x0a. html: the page that --report "
             "writes. json: everything, for apply, show and other programs. csv: a row for each bin, the missing and "
-            "the "
-            "total. sql: a CASE expression for each attribute")
+            "the total. sql: a CASE expression for each attribute")
         ->check(CLI::IsMember({"table", "html", "json", "csv", "sql"}))
-        ->option_text("FORMAT")
+        ->option_text("table|html|json|csv|sql")
         ->group("Output");
     command
         .add_option_function<std::string>(

@@ -1,4 +1,6 @@
-#include "hosts/mcbin/manpage.h"
+#include "hosts/mcbin/commandline/manpage.h"
+
+#include "hosts/mcbin/commandline/toolhelp.h"
 
 #include <cctype>
 

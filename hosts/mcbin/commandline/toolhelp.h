@@ -1,5 +1,5 @@
-#ifndef MCBIN_MANPAGE_H
-#define MCBIN_MANPAGE_H
+#ifndef MCBIN_TOOLHELP_H
+#define MCBIN_TOOLHELP_H
 
 #include <string>
 #include <vector>
@@ -8,8 +8,8 @@
 
 struct OptionHelp
 {
-    std::string name;
-    std::string argument; ///< what it is followed by; empty of a flag
+    std::string name;     ///< as in "--target", or several with commas between them
+    std::string argument; ///< what it is followed by, with | between words to choose from; empty of a flag
     std::string description;
 };
 
@@ -35,8 +35,5 @@ struct ToolHelp
     std::vector<CommandHelp> commands;
     std::string footer;
 };
-
-/// The manual page, in the language of man.
-std::string MakeManPage(const ToolHelp& tool);
 
 #endif
