@@ -4,9 +4,10 @@
 #include "bins/numbers.h"
 
 #include <algorithm>
+#include <cmath>
 
-Binner::Binner(const AttributeBins& bins, const std::vector<std::string>& missingTexts)
-    : fBins(bins), fMissingTexts(missingTexts)
+Binner::Binner(const AttributeBins& bins, const std::vector<std::string>& missingTexts, const NumberForm& numbers)
+    : fBins(bins), fNumbers(numbers), fMissingTexts(missingTexts)
 {
     const Variable& variable = *bins.attribute;
     fMissingTexts.insert(fMissingTexts.end(), variable.missingTexts.begin(), variable.missingTexts.end());
@@ -32,14 +33,14 @@ Binner::Found Binner::Find(std::string_view field)
         return {};
     if (fBins.attribute->kind == VariableKind::kStringCategorical)
         return FindCategory(field);
-    const std::optional<double> value = ParseNumber(field);
-    if (!value)
+    const double value = fNumbers.Parse(field);
+    if (std::isnan(value))
         return {std::nullopt, true, 0.0};
-    if (IsMissing(*value))
+    if (IsMissing(value))
         return {};
     if (fBins.attribute->kind == VariableKind::kNumericCategorical)
-        return FindCategory(FormatCategoryNumber(*value)); // "1.0" is the category 1
-    return {FindBin(fBins.cutPoints, fBins.isRightClosed, *value), false, *value};
+        return FindCategory(FormatCategoryNumber(value)); // "1.0" is the category 1
+    return {FindBin(fBins.cutPoints, fBins.isRightClosed, value), false, value};
 }
 
 bool Binner::IsMissing(double value) const

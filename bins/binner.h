@@ -2,6 +2,7 @@
 #define MCOBNQRT_BINS_BINNER_H
 
 #include "bins/bins.h"
+#include "bins/numberform.h"
 
 #include <cstddef>
 #include <optional>
@@ -22,8 +23,9 @@ public:
     };
 
     /// `missingTexts` count as missing beside what the attribute declares; a number in them stands for all ways to
-    /// write the number, where the attribute has numbers. `bins` must outlive the object.
-    Binner(const AttributeBins& bins, const std::vector<std::string>& missingTexts);
+    /// write the number, where the attribute has numbers. `numbers` is how the values are written. `bins` must outlive
+    /// the object.
+    Binner(const AttributeBins& bins, const std::vector<std::string>& missingTexts, const NumberForm& numbers = {});
 
     Found Find(std::string_view field);
 
@@ -32,6 +34,7 @@ private:
     Found FindCategory(std::string_view field);
 
     const AttributeBins& fBins;
+    NumberForm fNumbers;
     std::vector<std::string> fMissingTexts;
     std::vector<double> fMissingNumbers; ///< the attribute's, and those among the texts
     std::unordered_map<std::string, Found> fFoundByCategory;

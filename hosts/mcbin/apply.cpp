@@ -63,7 +63,7 @@ std::vector<OutputColumn> MakeColumns(const TableReader& table, const Bins& bins
             throw Failure("column " + Quote(attribute.name) +
                           " has been binned for more than one target, so its bins can't take its place");
         }
-        columns.push_back({position, &attribute, column.name, Binner(*column.bins, missingTexts),
+        columns.push_back({position, &attribute, column.name, Binner(*column.bins, missingTexts, table.GetNumberForm()),
                            MakeFields(*column.bins, options.encoding, table.GetDelimiter())});
     }
     if (columns.empty())

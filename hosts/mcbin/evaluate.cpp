@@ -33,11 +33,11 @@ class TargetColumn
 {
 public:
     TargetColumn(std::shared_ptr<const Variable> target, std::size_t position,
-                 const std::vector<std::string>& missingTexts)
+                 const std::vector<std::string>& missingTexts, const NumberForm& numbers)
         : fPosition(position)
     {
         fBins.attribute = std::move(target);
-        fBinner.emplace(fBins, missingTexts);
+        fBinner.emplace(fBins, missingTexts, numbers);
     }
 
     /// Reads the field of the next row. \return false if it is a category that is not known.
@@ -113,8 +113,9 @@ private:
     {
         const AttributeBins& bins = GetFirst().results[index];
         TargetColumn* const target = FindTarget(bins.target);
-        fColumns.push_back({fTable.FindColumn(bins.attribute->name), bins.attribute.get(), Binner(bins, fMissingTexts),
-                            BinTally(bins, target != nullptr), target});
+        fColumns.push_back({fTable.FindColumn(bins.attribute->name), bins.attribute.get(),
+                            Binner(bins, fMissingTexts, fTable.GetNumberForm()), BinTally(bins, target != nullptr),
+                            target});
         fEvaluated.evaluation.indices.push_back(index);
     }
 
@@ -132,7 +133,7 @@ private:
         const std::string& name = fOptions.columns.target.empty() ? target->name : fOptions.columns.target;
         if (fOptions.columns.target.empty() && !HasColumn(fTable, name))
             return nullptr;
-        column = &fTargets.emplace_back(target, fTable.FindColumn(name), fMissingTexts);
+        column = &fTargets.emplace_back(target, fTable.FindColumn(name), fMissingTexts, fTable.GetNumberForm());
         return column;
     }
 

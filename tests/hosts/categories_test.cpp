@@ -25,7 +25,7 @@ TEST(Categories, OfNumbersAreInTheirOrderHoweverTheyAreWritten)
     column.missingNumbers = {99};
     column.missingInterval = {-7, -3};
 
-    Categories categories(column);
+    Categories categories(column, NumberForm());
 
     EXPECT_TRUE(categories.AreNumbers());
     EXPECT_EQ((Names{"0", "1", "9", "10"}), categories.GetNames());
@@ -41,7 +41,7 @@ TEST(Categories, AreTextsIfOneIsNoNumberOrAnIdentifier)
 {
     for (const char* const field : {"007", "x", "nan"})
     {
-        Categories categories(AColumn({"10", "9", field}));
+        Categories categories(AColumn({"10", "9", field}), NumberForm());
         EXPECT_FALSE(categories.AreNumbers()) << field;
         EXPECT_EQ(3U, categories.GetNames().size()) << field;
         EXPECT_LT(categories.FindCode("10"), categories.FindCode("9")) << field;

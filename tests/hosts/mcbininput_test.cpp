@@ -175,7 +175,8 @@ TEST_F(McbinInput, BadInputFailsInWordsThatNameThePlace)
         {"\xFF\xFEx", ": the file is UTF-16; make it UTF-8 first, as by iconv -f UTF-16 -t UTF-8"},
         {"x;y\n1;a\n2,5;b\n3;b\n",
          ", line 3: column 'x': '2,5' is not a number: it has a comma, and numbers are written "
-         "as in 1234.5; --exclude leaves the column out, and --categorical bins its fields as categories"},
+         "as in 1234.5, unless --decimal and --thousands say otherwise; --exclude leaves the column out, and "
+         "--categorical bins its fields as categories"},
         {"x,y\n1,a\n2,b\nmany,a\n", ", line 4: column 'x': 'many' is not a number; if it stands for a missing value, "
                                     "say so with --missing-text, and with --bad missing for all such fields; "
                                     "--exclude leaves the column out, and --categorical bins its fields as categories"},
@@ -197,6 +198,39 @@ TEST_F(McbinInput, AFileWithDecimalCommasHasNoNumbers)
         "mcbin: there is nothing to bin: no column could be an attribute; left out: x (text, such as '1,5' in line 2); "
         "numbers are written as in 1234.5, without commas, $ and %\n",
         RunOn("x;y\n1,5;a\n2,5;b\n", "supervised", "--target y").err);
+}
+
+TEST_F(McbinInput, NumbersAreReadInTheFormThatIsTold)
+{
+    const std::string settings = "--target y --weight w --missing x=-9 --categorical g --format json ";
+    std::string expected =
+        RunOn("x,g,y,w\n1234.5,1.5,a,0.5\n2,2.5,a,1\n-9,2.5,a,1\n1000000.25,1.50,b,2\n7,2.5,b,1000\n", "supervised",
+              settings)
+            .out;
+    struct Case
+    {
+        const char* data;
+        const char* options;
+    };
+    for (const Case& c : {Case{"x;g;y;w\n1.234,5;1,5;a;0,5\n2;2,5;a;1\n-9,0;2,5;a;1\n1.000.000,25;1,50;b;2\n7,00;2,5;b;"
+                               "1.000\n",
+                               "--decimal comma --thousands point"},
+                          {"x,g,y,w\n\"1 234,5\",\"1,5\",a,\"0,5\"\n2,\"2,5\",a,1\n-9,\"2,5\",a,1\n\"1\xc2\xa0"
+                           "000 000,25\",\"1,50\",b,2\n7,\"2,5\",b,1\xe2\x80\xaf"
+                           "000\n",
+                           "--decimal , --thousands space"},
+                          {"x;g;y;w\n1,234.5;1.5;a;.5\n2;2.5;a;1\n-9;2.5;a;1\n1,000,000.25;1.50;b;2\n7;2.5;b;1,000\n",
+                           "--thousands ,"}})
+    {
+        EXPECT_EQ(expected, RunOn(c.data, "supervised", settings + c.options).out) << c.data;
+        Write("bins.json", expected);
+        const Outcome applied = Run(std::string("apply bins.json data.csv ") + c.options);
+        EXPECT_EQ("", applied.err);
+        const Outcome evaluated = Run(std::string("evaluate bins.json data.csv --strict ") + c.options);
+        EXPECT_EQ(0, evaluated.exitCode) << evaluated.out << evaluated.err;
+    }
+    EXPECT_EQ("mcbin: --thousands: the decimal sign can't stand between thousands, too\n",
+              RunOn("x\n1\n", "equal-frequency", "--thousands point").err);
 }
 
 TEST_F(McbinInput, WhatIsNotUtf8DoesNoHarmWhereItIsNotUsed)

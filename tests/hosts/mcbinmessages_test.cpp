@@ -103,10 +103,10 @@ TEST_F(McbinMessages, ATextColumnThatLooksLikeNumbersGetsANote)
         EXPECT_EQ(outcome.err.size() - note.size(), outcome.err.find(note)) << outcome.err;
     }
     EXPECT_EQ("", RunOn("x,z\n1,\"city, zip\"\n2,$\n3,$5\n", "equal-frequency", "").err);
-    EXPECT_EQ(
-        "mcbin: data.csv, line 3: column 'x': '$1,200' is not a number: it has a $ and a comma, and numbers are "
-        "written as in 1234.5; --exclude leaves the column out, and --categorical bins its fields as categories\n",
-        RunOn("x\n1\n\"$1,200\"\n3\n", "equal-frequency", "").err);
+    EXPECT_EQ("mcbin: data.csv, line 3: column 'x': '$1,200' is not a number: it has a $ and a comma, and numbers are "
+              "written as in 1234.5, unless --decimal and --thousands say otherwise; --exclude leaves the column out, "
+              "and --categorical bins its fields as categories\n",
+              RunOn("x\n1\n\"$1,200\"\n3\n", "equal-frequency", "").err);
 }
 
 TEST_F(McbinMessages, WholeNumbersThatBecomeOneGetAWarning)

@@ -81,6 +81,25 @@ void AddFormOfTable(CLI::App& command, TableOptions& table)
         ->option_text("CHAR")
         ->group("Input");
     command
+        .add_option_function<std::string>(
+            "--decimal",
+            [&table](const std::string& name) { table.decimal = name == "comma" || name == "," ? ',' : '.'; },
+            "What stands before the fractions of numbers: point (the default) or comma")
+        ->check(CLI::IsMember({".", ",", "point", "comma"}))
+        ->option_text("point|comma")
+        ->group("Input");
+    command
+        .add_option_function<std::string>(
+            "--thousands",
+            [&table](const std::string& name) {
+                table.thousands = name == "point" ? '.' : name == "apostrophe" ? '\'' : ParseDelimiter(name);
+            },
+            "What may stand between groups of three digits: point, comma, space, apostrophe; nothing if not given. "
+            "Numbers in other options are written as in 1234.5 all the same")
+        ->check(CLI::IsMember({".", ",", " ", "'", "_", "point", "comma", "space", "apostrophe"}))
+        ->option_text("point|comma|space|apostrophe")
+        ->group("Input");
+    command
         .add_flag_callback(
             "--no-header", [&table] { table.hasHeader = false; },
             "The first row is one of the data; the columns are called 'column 1', 'column 2' and so on")

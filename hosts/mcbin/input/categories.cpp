@@ -8,6 +8,7 @@
 #include <mcobnqrt/mccommon.h>
 
 #include <algorithm>
+#include <cmath>
 #include <map>
 
 namespace
@@ -18,20 +19,17 @@ bool IsIdentifier(std::string_view field)
     return field.size() > 1 && field[0] == '0' && field[1] >= '0' && field[1] <= '9';
 }
 
-bool IsNumber(const std::string& field)
-{
-    return ParseNumber(field) && !IsIdentifier(field);
-}
-
 } // namespace
 
-Categories::Categories(const Column& column)
-    : fAreNumbers(column.order.empty() && std::all_of(column.categories.begin(), column.categories.end(), IsNumber))
+Categories::Categories(const Column& column, const NumberForm& numbers)
 {
+    const auto isNumber = [&](const std::string& field)
+    { return !std::isnan(numbers.Parse(field)) && !IsIdentifier(field); };
+    fAreNumbers = column.order.empty() && std::all_of(column.categories.begin(), column.categories.end(), isNumber);
     if (!column.order.empty())
         AddOrdered(column);
     else if (fAreNumbers)
-        AddNumbers(column);
+        AddNumbers(column, numbers);
     else
         AddTexts(column);
 }
@@ -43,10 +41,10 @@ std::optional<double> Categories::FindCode(std::string_view field)
     return found == fCodes.end() ? std::nullopt : std::optional(found->second);
 }
 
-void Categories::AddNumbers(const Column& column)
+void Categories::AddNumbers(const Column& column, const NumberForm& numbers)
 {
     std::map<double, std::vector<std::string>> fieldsByNumber;
-    for (const std::string& field : column.categories) fieldsByNumber[*ParseNumber(field)].push_back(field);
+    for (const std::string& field : column.categories) fieldsByNumber[numbers.Parse(field)].push_back(field);
     for (const auto& [number, fields] : fieldsByNumber)
     {
         const bool isMissing = column.IsMissing(number);

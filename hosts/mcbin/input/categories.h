@@ -7,6 +7,7 @@
 #include <unordered_map>
 #include <vector>
 
+class NumberForm;
 struct Column;
 
 /// The categories of a column, and which of them each of its fields is.
@@ -18,7 +19,8 @@ class Categories
 {
 public:
     /// The column's fields have all been read. \throw Failure if the order of the column lacks a field.
-    explicit Categories(const Column& column);
+    /// `numbers` is how numbers are written.
+    Categories(const Column& column, const NumberForm& numbers);
 
     bool AreNumbers() const { return fAreNumbers; }
 
@@ -30,11 +32,11 @@ public:
     std::optional<double> FindCode(std::string_view field);
 
 private:
-    void AddNumbers(const Column& column);
+    void AddNumbers(const Column& column, const NumberForm& numbers);
     void AddTexts(const Column& column);
     void AddOrdered(const Column& column);
 
-    bool fAreNumbers;
+    bool fAreNumbers = false;
     std::vector<std::string> fNames;
     std::unordered_map<std::string, double> fCodes; ///< by field
     std::string fKey;                               ///< kept for its memory

@@ -15,17 +15,17 @@ namespace
 {
 
 /// Whether the categories of an attribute have no order of their own. Categories that are numbers have one.
-bool IsUnordered(const Column& column)
+bool IsUnordered(const Column& column, const NumberForm& numbers)
 {
     return column.isAttribute && !column.isTarget && column.kind == ColumnKind::kCategorical && column.order.empty() &&
-           !Categories(column).AreNumbers();
+           !Categories(column, numbers).AreNumbers();
 }
 
 /// The plan with the columns alone that have to be counted, and the targets and the weight. Numbers need not be parsed.
 ColumnPlan MakeCountPlan(const ColumnPlan& plan)
 {
     ColumnPlan counted = plan;
-    for (Column& column : counted.columns) column.isAttribute = IsUnordered(column);
+    for (Column& column : counted.columns) column.isAttribute = IsUnordered(column, plan.numbers);
     return counted;
 }
 

@@ -338,6 +338,7 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     ColumnPlan plan;
     plan.missingTexts = options.missingText;
     plan.isBadMissing = options.isBadMissing;
+    plan.numbers = table.GetNumberForm();
     plan.areTextsBinned = options.areTextsBinned;
     plan.isByRate = options.areTextsBinned;
     plan.rareShare = options.rareShare;

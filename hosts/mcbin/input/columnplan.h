@@ -2,6 +2,7 @@
 #define MCBIN_COLUMNPLAN_H
 
 #include "bins/bins.h"
+#include "bins/numberform.h"
 #include "bins/weightgrid.h"
 
 #include <cstddef>
@@ -74,6 +75,7 @@ struct ColumnPlan
     bool areTextsBinned = false; ///< columns of text are attributes though they are not named, if they can be
     double rareShare = 0.0;      ///< categories of less than this share of the weight have a code together
     bool isByRate = false;       ///< categories that have no order are ordered by the rate of the target
+    NumberForm numbers;          ///< how they are written
     bool isBadMissing = false;
     long numRows = 0;
     WeightTally weights;       ///< of all rows, if a column holds weights

@@ -74,12 +74,12 @@ void CsvReader::ParserDeleter::operator()(csv_parser* parser) const
     delete parser;
 }
 
-CsvReader::CsvReader(InputFile file, char delimiter, char comment)
+CsvReader::CsvReader(InputFile file, char delimiter, bool hasCommasInNumbers, char comment)
     : fFile(std::move(file)), fDelimiter(delimiter), fComment(comment), fBuffer(kBufferSize), fRows(1)
 {
     ReadBeginning();
     if (fDelimiter == '\0')
-        fDelimiter = DetectDelimiter(WithoutComments(MakeView(fBegin, fEnd), fComment));
+        fDelimiter = DetectDelimiter(WithoutComments(MakeView(fBegin, fEnd), fComment), hasCommasInNumbers);
     fParser.reset(MakeParser(fDelimiter));
 }
 

@@ -49,7 +49,7 @@ class CsvReader
 public:
     /// A `delimiter` of '\0' stands for the one that the beginning of the file shows. Lines that begin with `comment` are
     /// dropped; '\0' stands for none.
-    CsvReader(InputFile file, char delimiter, char comment);
+    CsvReader(InputFile file, char delimiter, bool hasCommasInNumbers, char comment);
 
     /// The next row, which stays the reader's and is good until the next call, or null at the end.
     /// \throw Failure for a bad row, once all rows before it have been handed out, or if the file can't be read.

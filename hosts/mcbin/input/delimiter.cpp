@@ -46,7 +46,7 @@ std::vector<Counts> CountInLines(std::string_view text)
 
 } // namespace
 
-char DetectDelimiter(std::string_view text)
+char DetectDelimiter(std::string_view text, bool hasCommasInNumbers)
 {
     const std::vector<Counts> lines = CountInLines(text);
     const Counts& header = lines.front();
@@ -55,7 +55,9 @@ char DetectDelimiter(std::string_view text)
     for (std::size_t i = 0; i < kDelimiters.size(); ++i)
     {
         const auto isAlike = [&](const Counts& line) { return line[i] == header[i]; };
-        const std::pair<long, long> rank(std::count_if(lines.begin(), lines.end(), isAlike), header[i]);
+        const bool isInNumbers = hasCommasInNumbers && kDelimiters[i] == ',';
+        const std::pair<long, long> rank(isInNumbers ? 0 : std::count_if(lines.begin(), lines.end(), isAlike),
+                                         header[i]);
         if (header[i] > 0 && rank > bestRank)
             std::tie(best, bestRank) = std::pair(kDelimiters[i], rank);
     }

@@ -1,6 +1,5 @@
 #include "hosts/mcbin/input/recordsource.h"
 
-#include "bins/numbers.h"
 #include "hosts/mcbin/input/columnplan.h"
 #include "hosts/mcbin/input/tableprofile.h"
 #include "hosts/mcbin/input/tablereader.h"
@@ -59,7 +58,7 @@ double TableRecordSource::Convert(Field& field, std::string_view text, InfiniteV
         return MCMV::gMissingValue;
     if (field.categories)
         return ConvertCategory(field, text);
-    const double number = ParseNumberOrNaN(text);
+    const double number = fPlan.numbers.Parse(text);
     if (!std::isnan(number))
     {
         field.merges.Look(text, number);

@@ -28,7 +28,7 @@ RowWeights::RowWeights(TableReader& table, const Variable& weight, const std::ve
     : fTable(&table), fPosition(table.FindColumn(weight.name)), fIsBadMissing(isBadMissing),
       fAsAttribute(MakeAttribute(weight))
 {
-    fBinner.emplace(fAsAttribute, missingTexts);
+    fBinner.emplace(fAsAttribute, missingTexts, table.GetNumberForm());
     WeightTally tally;
     tally.rounding = weight.rounding;
     progress.BeginRows("reading the weights");

@@ -40,12 +40,12 @@ void LearnCategory(Column& column, std::string_view field)
         column.isBinary = true;
 }
 
-void ProfileNumber(Column& column, std::string_view field, long line, Care care)
+void ProfileNumber(Column& column, const NumberForm& numbers, std::string_view field, long line, Care care)
 {
     constexpr long kManyNumbers = 1000;
     if (column.kind == ColumnKind::kUnknown)
         LearnCategory(column, field);
-    if (ParseNumber(field))
+    if (!std::isnan(numbers.Parse(field)))
     {
         ++column.numNumbers;
         column.isBelieved = care == Care::kHasty && column.numTexts == 0 && column.numNumbers >= kManyNumbers;
@@ -58,7 +58,7 @@ void ProfileNumber(Column& column, std::string_view field, long line, Care care)
 void ProfileWeight(const TableReader& table, ColumnPlan& plan, std::size_t position, std::string_view field, long line)
 {
     Column& column = plan.columns[position];
-    const double weight = ParseNumberOrNaN(field);
+    const double weight = plan.numbers.Parse(field);
     if (ColumnPlan::IsWeight(column, weight))
     {
         plan.weights.Add(weight);
@@ -113,7 +113,7 @@ void ProfileField(const TableReader& table, ColumnPlan& plan, std::size_t positi
     else if (column.kind == ColumnKind::kCategorical)
         ProfileCategory(table, column, position, field, line);
     else
-        ProfileNumber(column, field, line, care);
+        ProfileNumber(column, plan.numbers, field, line, care);
 }
 
 /// Why a column of text is no attribute; empty if it is one, as one that was asked for by its name is.

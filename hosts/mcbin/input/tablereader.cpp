@@ -4,22 +4,36 @@
 #include "hosts/mcbin/text.h"
 
 #include <algorithm>
+#include <stdexcept>
 #include <utility>
 
 namespace
 {
 
-CsvReader Open(const TableOptions& options)
+NumberForm MakeNumberForm(const TableOptions& options)
+{
+    try
+    {
+        return NumberForm(options.decimal, options.thousands);
+    }
+    catch (const std::invalid_argument& error)
+    {
+        throw Failure(std::string("--thousands: ") + error.what());
+    }
+}
+
+CsvReader Open(const TableOptions& options, const NumberForm& numbers)
 {
     InputFile file(options.file);
     if (options.isReadTwice)
         file.MakeRewindable(options.spoolDirectory);
-    return CsvReader(std::move(file), options.delimiter, options.comment);
+    return CsvReader(std::move(file), options.delimiter, numbers.HasCommas(), options.comment);
 }
 
 } // namespace
 
-TableReader::TableReader(const TableOptions& options) : fReader(Open(options)), fHasHeader(options.hasHeader)
+TableReader::TableReader(const TableOptions& options)
+    : fNumbers(MakeNumberForm(options)), fReader(Open(options, fNumbers)), fHasHeader(options.hasHeader)
 {
     if (options.comment != '\0' && options.comment == fReader.GetDelimiter())
         throw MakeFailure("--comment: " + Quote(std::string(1, options.comment)) + " separates the fields");
@@ -114,13 +128,15 @@ Failure TableReader::MakeNotANumber(long line, std::size_t column, std::string_v
 {
     std::vector<std::string> ornaments;
     for (const char c : FindOrnaments(field)) ornaments.push_back(c == ',' ? "a comma" : "a " + std::string(1, c));
-    return MakeFailure(
-        line, column,
-        Quote(Shorten(field)) +
-            (ornaments.empty()
-                 ? " is not a number; if it stands for a missing value, say so with --missing-text, and "
-                   "with --bad missing for all such fields"
-                 : " is not a number: it has " + Join(ornaments, " and ") + ", and numbers are written as in 1234.5"));
+    const bool hasComma = std::find(ornaments.begin(), ornaments.end(), "a comma") != ornaments.end();
+    const std::string advice = hasComma ? ", unless --decimal and --thousands say otherwise" : "";
+    return MakeFailure(line, column,
+                       Quote(Shorten(field)) +
+                           (ornaments.empty()
+                                ? " is not a number; if it stands for a missing value, say so with --missing-text, and "
+                                  "with --bad missing for all such fields"
+                                : " is not a number: it has " + Join(ornaments, " and ") +
+                                      ", and numbers are written as in 1234.5" + advice));
 }
 
 Failure TableReader::MakeNotAWeight(long line, std::size_t column, std::string_view field, double weight) const

@@ -1,6 +1,7 @@
 #ifndef MCBIN_TABLEREADER_H
 #define MCBIN_TABLEREADER_H
 
+#include "bins/numberform.h"
 #include "hosts/mcbin/failure.h"
 #include "hosts/mcbin/input/csvreader.h"
 
@@ -13,8 +14,10 @@
 /// Where a table is and how it is written.
 struct TableOptions
 {
-    std::string file;           ///< "-" for standard input
-    char delimiter = '\0';      ///< '\0' for finding it
+    std::string file;      ///< "-" for standard input
+    char delimiter = '\0'; ///< '\0' for finding it
+    char decimal = '.';    ///< of numbers, as NumberForm takes it, and so is the next
+    char thousands = '\0';
     char comment = '\0';        ///< what a line begins with that is none of the table; '\0' for nothing
     bool hasHeader = true;      ///< the first row names the columns
     bool isReadTwice = false;   ///< or more often: Rewind() will be called
@@ -41,6 +44,7 @@ public:
     /// What ends the first row; LF if nothing does.
     const std::string& GetLineEnd() const { return fLineEnd; }
     char GetDelimiter() const { return fReader.GetDelimiter(); }
+    const NumberForm& GetNumberForm() const { return fNumbers; }
     const std::string& GetName() const { return fReader.GetName(); }
 
     /// The position of the column, from 0. \throw Failure, which tells what columns there are, if there is none of the
@@ -68,6 +72,7 @@ public:
 private:
     void NameColumns(const CsvRow& header);
 
+    NumberForm fNumbers;
     CsvReader fReader;
     bool fHasHeader;
     const CsvRow* fFirstRow = nullptr; ///< of a table without a header, until it is handed out

@@ -146,7 +146,7 @@ Variables MakeVariables(const ColumnPlan& plan)
         variables.columns.push_back(i);
         std::optional<Categories>& categories = variables.categories.emplace_back();
         if (column.kind == ColumnKind::kCategorical && !column.isWeight)
-            categories.emplace(column);
+            categories.emplace(column, plan.numbers);
         const Categories* const known = categories ? &*categories : nullptr;
         variableOfColumn[i] = AddVariable(variables.list, column, known, !plan.pairs.empty());
         DeclareMissing(variables.list, variableOfColumn[i], column, known);

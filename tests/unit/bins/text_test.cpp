@@ -1,3 +1,4 @@
+#include "bins/numberform.h"
 #include "bins/numbers.h"
 #include "bins/text.h"
 #include "bins/utf8.h"
@@ -7,6 +8,7 @@
 #include <clocale>
 #include <cmath>
 #include <limits>
+#include <stdexcept>
 
 namespace
 {
@@ -48,6 +50,44 @@ TEST(Numbers, AreReadWithADecimalPointAndNothingElse)
         EXPECT_EQ(std::nullopt, ParseNumber(text)) << text;
         EXPECT_TRUE(std::isnan(ParseNumberOrNaN(text))) << text;
     }
+}
+
+TEST(Numbers, AreReadInTheFormOfAnotherCountry)
+{
+    const NumberForm german(',', '.');
+    const NumberForm french(',', ' ');
+    struct Case
+    {
+        NumberForm form;
+        const char* text;
+        double value;
+    };
+    const Case cases[] = {{german, "1,5", 1.5},
+                          {german, " -1.234.567,25 ", -1234567.25},
+                          {german, "1234567,25", 1234567.25},
+                          {german, "1.234", 1234},
+                          {german, ",5", 0.5},
+                          {german, "5,", 5},
+                          {german, "2,5e-3", 0.0025},
+                          {german, "-inf", -kInfinity},
+                          {french, "1 234,5", 1234.5},
+                          {french,
+                           "12\xc2\xa0"
+                           "345\xe2\x80\xaf"
+                           "678,5",
+                           12345678.5},
+                          {NumberForm('.', '\''), "1'234.5", 1234.5},
+                          {NumberForm('.', ','), "1,234.5", 1234.5}};
+    for (const Case& c : cases) EXPECT_EQ(c.value, c.form.Parse(c.text)) << c.text;
+    for (const char* const text : {"", " ", "1.5", "1.50", "1.2345", "12.34.567", ".234", "1.234.", "1.234,567.8",
+                                   "1234.567", "1,2,3", "1,5.0", "x", ",", "nan"})
+    {
+        EXPECT_TRUE(std::isnan(german.Parse(text))) << text;
+    }
+    EXPECT_TRUE(std::isnan(NumberForm(',', '\0').Parse("1.5")));
+    EXPECT_THROW(NumberForm(',', ','), std::invalid_argument);
+    EXPECT_THROW(NumberForm(';', '\0'), std::invalid_argument);
+    EXPECT_THROW(NumberForm('.', '5'), std::invalid_argument);
 }
 
 TEST(Numbers, AreWrittenInAsFewDigitsAsReadBack)
