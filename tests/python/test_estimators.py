@@ -138,7 +138,6 @@ def test_polars_output_has_the_names_of_the_columns(mixed):
             dict(X=pa.table({"x": WITH_GAP[:, 0]}).to_reader(), y=TWO_CLASSES[:-1]),
             "has at least 24 rows, but there are 23",
         ),
-        (dict(X=pd.DataFrame({"t": ["a", "b"] * 12}), y=TWO_CLASSES), "column 't': the column holds texts"),
         (dict(X=np.arange(24).astype("m8[s]")[:, None], y=TWO_CLASSES), "column 'x0': .*duration"),
         (
             dict(X=WITH_GAP, y=TWO_CLASSES, sample_weight=[1.0] * 23 + [pd.NA]),

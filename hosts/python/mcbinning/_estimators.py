@@ -20,11 +20,13 @@ from ._errors import BinningError, DataError
 from ._opening import is_table, open_source
 from ._outcome import make_result
 from ._outputs import Form, centres
+from ._plan import check_categories, check_order, name_orders, named_in
 from ._progress import Progress, reporting
 from ._result import BinningResult
-from ._settings import check_settings, directory_of
-from ._sources import Source
-from ._types import Closed, Drop, Encode, MissingOutput, Rounding
+from ._settings import check_settings, check_share, directory_of
+from ._sources import Column, Source
+from ._transform import add_variable
+from ._types import CategoryOrder, Closed, Drop, Encode, MissingOutput, Rounding, Unseen
 from ._values import Floats
 
 _ALL_ROWS = 2**62
@@ -44,6 +46,10 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
     rounding: Rounding
     temp_dir: str | os.PathLike[str] | None
     progress: Progress
+
+    unseen: Unseen = "error"
+    _cuts_categories = False
+    """Whether features of text are cut between sets of their categories."""
 
     result_: BinningResult
     n_features_in_: int
@@ -82,9 +88,10 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
 
     def _fit(self, X: Any, codes: npt.NDArray[np.uint8] | None, classes: npt.NDArray[Any], sample_weight: Any) -> None:
         self._form.check()
-        feed, names, rows = self._open(X, reset=True)
+        feed, columns, rows = self._open(X, reset=True)
         if rows == 0:
             raise DataError("the data have no rows")
+        names = [column.name for column in columns]
         if codes is not None:
             if rows is not None:
                 check_consistent_length(np.empty(rows), codes)
@@ -95,6 +102,7 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
             array = _check_weights(sample_weight, rows)
             feed.add_field("sample_weight", "weight", array=array, rounding=self.rounding)
             names = [*names, "sample_weight"]
+        self._code_categories(feed, columns)
         with reporting(self.progress, names, self.n_features_in_, rows) as report:
             bins = self._run(feed, list(range(self.n_features_in_)), report)
         self.result_ = make_result(bins, stacklevel=4)
@@ -105,22 +113,25 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         self.bin_tables_ = [found.to_pandas() for found in self.result_.bins]
         self.statuses_ = [found.status for found in self.result_.bins]
 
+    def _code_categories(self, feed: _core.Feed, columns: Sequence[Column]) -> None:
+        """Gives the categories of the features their codes, in the order in which they are cut."""
+
     def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> _core.Bins:
         raise NotImplementedError
 
-    def _open(self, X: Any, reset: bool) -> tuple[_core.Feed, list[str], int | None]:
-        """A feed of the columns of `X`, read where they lie; their names; and how many rows there are, if that is
+    def _open(self, X: Any, reset: bool) -> tuple[_core.Feed, Sequence[Column], int | None]:
+        """A feed of the columns of `X`, read where they lie; what they are; and how many rows there are, if that is
         known."""
         if is_table(X):
             return self._open_table(X, reset)
         X = self._check(X, reset)
         if X.dtype.kind in "mM":
-            return self._open_times(X)
+            return self._open_times(X, reset)
         feed = _core.Feed(None)
         names = self._names(X)
         for i, name in enumerate(names):
             feed.add_field(name, "attribute", array=X[:, i])
-        return feed, names, X.shape[0]
+        return feed, [Column(name, "float") for name in names], X.shape[0]
 
     def _names(self, X: npt.NDArray[Any]) -> list[str]:
         return list(map(str, getattr(self, "feature_names_in_", [f"x{i}" for i in range(X.shape[1])])))
@@ -133,43 +144,63 @@ class _Binner(TransformerMixin, BaseEstimator):  # type: ignore[misc]
         # Numbers of 128 bits or in the other byte order are the only ones that the feed can't read where they lie.
         return array if array.dtype.itemsize <= 8 and array.dtype.isnative else array.astype(np.float64)
 
-    def _open_times(self, X: npt.NDArray[Any]) -> tuple[_core.Feed, list[str], int | None]:
+    def _open_times(self, X: npt.NDArray[Any], reset: bool) -> tuple[_core.Feed, Sequence[Column], int | None]:
         # Of the units Arrow has days and those from the second down.
         if X.dtype.kind == "M" and np.datetime_data(X.dtype)[0] in ("Y", "M", "W", "h", "m"):
             X = X.astype("M8[s]")
         columns = [pa.array(np.ascontiguousarray(X[:, i])) for i in range(X.shape[1])]
-        return self._feed_table(open_source(pa.Table.from_arrays(columns, names=self._names(X))))
+        return self._feed_table(open_source(pa.Table.from_arrays(columns, names=self._names(X))), reset)
 
-    def _open_table(self, X: Any, reset: bool) -> tuple[_core.Feed, list[str], int | None]:
+    def _open_table(self, X: Any, reset: bool) -> tuple[_core.Feed, Sequence[Column], int | None]:
         source = open_source(X)
         named = X if isinstance(X, pd.DataFrame) else pd.DataFrame(columns=[column.name for column in source.columns])
         validate_data(self, named, reset=reset, skip_check_array=True)
         if not source.columns:
             raise DataError("there are no columns")
-        return self._feed_table(source)
+        return self._feed_table(source, reset)
 
-    def _feed_table(self, source: Source) -> tuple[_core.Feed, list[str], int | None]:
-        feed = _core.Feed(source.open(None))
+    def _feed_table(self, source: Source, reset: bool) -> tuple[_core.Feed, Sequence[Column], int | None]:
+        table = source.open(None)
+        feed = _core.Feed(table)
         for i, column in enumerate(source.columns):
             if column.is_ordered and column.kind != "text":
                 raise DataError("the column holds ordered categories, not numbers", column.name)
-            feed.add_field(column.name, "attribute", column=i)
-        return feed, [column.name for column in source.columns], source.rows
+            if not reset and self.result_.bins[i].variable.is_categorical:
+                add_variable(feed, table, self.result_.bins[i].variable, column.name, [], self.unseen)
+                continue
+            is_category = reset and self._cuts_categories and column.kind == "text"
+            feed.add_field(column.name, "category" if is_category else "attribute", column=i)
+        return feed, source.columns, source.rows
 
     def _read_columns(self, X: Any) -> Sequence[Floats]:
         if is_table(X):
             return self._open_table(X, reset=False)[0].read(_ALL_ROWS)
         X = self._check(X, reset=False)
+        for found in self.result_.bins:
+            if found.variable.is_categorical:
+                raise DataError("the column held texts in fit, so a table has to give it", found.attribute)
         if X.dtype.kind in "mM":
-            return self._open_times(X)[0].read(_ALL_ROWS)
+            return self._open_times(X, reset=False)[0].read(_ALL_ROWS)
         return list(X.T)
 
 
 class SupervisedBinner(_Binner):
-    """Cuts each feature where that best separates the categories of `y`, by entropy and description length.
+    """Cuts each feature where that best separates the categories of `y`, by entropy and description length. Those that
+    are columns of text in a table are cut between sets of their categories, of which there are from 2 to 256.
 
     Parameters
     ----------
+    category_order : {"rate", "text"} or dict, default="rate"
+        In which order the categories of a feature are cut that have none of their own, as those of an ordered
+        categorical have. "rate": by the share of the second class, or with several along the first principal direction
+        of their shares. "text": by their bytes. A dict tells by column all categories in their order; the others follow
+        their rate.
+    rare : float, default=0.0
+        Categories with less than this share of the weight, 0 to 1, that have no order of their own become one,
+        "(rare)", to which `transform` counts categories that were never seen, too.
+    unseen : {"error", "missing"}, default="error"
+        What a category is to `transform` that `fit` has not seen, where there are no rare ones: a `DataError`, or
+        missing.
     max_distinct : int, default=None
         A feature with more distinct values than this, at least 1, is pre-binned into `n_bins` bins of equal frequency,
         between which it is then cut. None: never.
@@ -229,9 +260,14 @@ class SupervisedBinner(_Binner):
     [['(26, +inf)'], ['(-inf, 26]']]
     """
 
+    _cuts_categories = True
+
     def __init__(
         self,
         *,
+        category_order: CategoryOrder = "rate",
+        rare: float = 0.0,
+        unseen: Unseen = "error",
         max_distinct: int | None = None,
         n_bins: int = 1000,
         closed: Closed = "right",
@@ -246,6 +282,9 @@ class SupervisedBinner(_Binner):
         temp_dir: str | os.PathLike[str] | None = None,
         progress: Progress = False,
     ) -> None:
+        self.category_order = category_order
+        self.rare = rare
+        self.unseen = unseen
         self.max_distinct = max_distinct
         self.n_bins = n_bins
         self.closed = closed
@@ -270,6 +309,9 @@ class SupervisedBinner(_Binner):
             rounding=self.rounding,
             smoothing=self.smoothing,
         )
+        check_share("rare", self.rare)
+        if self.unseen not in ("error", "missing"):
+            raise ValueError(f"unseen must be 'error' or 'missing', not {self.unseen!r}")
         if y is None:
             raise ValueError(f"{type(self).__name__} requires y to be passed, but the target y is None")
         self.classes_, codes = _code_target(y)
@@ -282,6 +324,34 @@ class SupervisedBinner(_Binner):
         tags = super().__sklearn_tags__()
         tags.target_tags.required = True
         return tags
+
+    def _code_categories(self, feed: _core.Feed, columns: Sequence[Column]) -> None:
+        order = name_orders(self.category_order)
+        declared: Any = {} if isinstance(order, str) else order
+        names = [column.name for column in columns]
+        texts = [i for i, column in enumerate(columns) if column.kind == "text"]
+        for name in named_in(order):
+            if name not in names:
+                raise DataError("there is no such column", name)
+            if names.index(name) not in texts:
+                raise DataError("only the categories of a column of text can be given an order", name)
+        if not texts:
+            return
+        # The categories are known, and can be counted, only when all records have been read.
+        feed.spool(directory_of(self.temp_dir))
+        for i in texts:
+            check_categories(names[i], feed.categories(i))
+        by_rate = order != "text"
+        unordered = [i for i in texts if names[i] not in declared and not columns[i].is_ordered]
+        counted = feed.count_categories([(i, len(columns)) for i in unordered], rare=self.rare, by_rate=by_rate)
+        for i, codes in zip(unordered, counted):
+            check_categories(names[i], codes.names)
+            kind, target = ("rate", "y") if by_rate else ("text", "")
+            feed.set_codes(i, codes, rare=self.rare, order=kind, target=target)
+        for i in set(texts) - set(unordered):
+            given = declared.get(names[i], feed.categories(i))
+            check_order(names[i], given, feed.categories(i))
+            feed.set_codes(i, _core.CategoryCodes(list(map(str, given))), order="declared")
 
     def _run(self, feed: _core.Feed, attributes: list[int], report: Any) -> _core.Bins:
         return feed.bin(

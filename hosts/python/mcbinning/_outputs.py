@@ -151,5 +151,7 @@ def _as_codes(column: Floats, found: AttributeBins) -> Codes:
 def centres(found: AttributeBins) -> Floats:
     """A value for each bin: the middle of its ends, of which the outer ones are the least and the largest value seen;
     and NaN for a missing value."""
+    if found.variable.is_categorical:
+        raise ValueError(f"the bins of {found.attribute!r} are sets of categories, for which no value stands")
     borders = np.concatenate([[found.minimum], found.cut_points, [found.maximum]])
     return np.append((borders[:-1] + borders[1:]) / 2, np.nan)

@@ -62,6 +62,23 @@ def named_in(category_order: CategoryOrder) -> list[str]:
     return [] if isinstance(category_order, str) else list(map(name_of, category_order))
 
 
+def check_order(name: str, order: Sequence[Any], categories: Sequence[Any]) -> None:
+    """The order that was given names each category of the column once."""
+    if len(set(order)) < len(order):
+        raise DataError("the order of the categories names one of them twice", name)
+    lacking = [category for category in categories if category not in order]
+    if lacking:
+        raise DataError(f"the order of the categories lacks {lacking[0]!r}", name)
+
+
+def check_categories(name: str, categories: Sequence[Any]) -> None:
+    """The column has two categories at least."""
+    if len(categories) == 0:
+        raise DataError("no row has a category: the data are empty, or all is missing", name)
+    if len(categories) == 1:
+        raise DataError(f"there is a single category, {categories[0]!r}; at least 2 are needed", name)
+
+
 def name_missing(missing: Missing | None) -> dict[str, Any]:
     return {name_of(column): declared for column, declared in (missing or {}).items()}
 
@@ -246,15 +263,8 @@ class Plan:
             return
         for name, order in self.category_order.items():
             if name in names:
-                self._check_order(name, order, feed.categories(names.index(name)))
+                check_order(name, order, feed.categories(names.index(name)))
                 feed.set_codes(names.index(name), _core.CategoryCodes(list(order)), order="declared")
-
-    def _check_order(self, name: str, order: Sequence[Any], categories: Sequence[Any]) -> None:
-        if len(set(order)) < len(order):
-            raise DataError("the order of the categories names one of them twice", name)
-        lacking = [category for category in categories if category not in order]
-        if lacking:
-            raise DataError(f"the order of the categories lacks {lacking[0]!r}", name)
 
     @property
     def categorical(self) -> list[str]:
@@ -297,9 +307,7 @@ class Plan:
         return feed
 
     def check_categories(self, name: str, categories: list[Any]) -> None:
-        if len(categories) == 0:
-            raise DataError("no row has a category: the data are empty, or all is missing", name)
-        if len(categories) == 1:
-            column = self.column(name)
-            category = categories[0] if column.kind == "text" else _values.decode(categories[0], column.kind)
-            raise DataError(f"there is a single category, {category!r}; at least 2 are needed", name)
+        kind = self.column(name).kind
+        if kind != "text" and len(categories) == 1:
+            categories = [_values.decode(categories[0], kind)]
+        check_categories(name, categories)
