@@ -3,6 +3,8 @@
 #include "bins/text.h"
 #include "hosts/mcbin/commandline/toolhelp.h"
 
+#include <fmt/format.h>
+
 #include <vector>
 
 namespace
@@ -89,7 +91,7 @@ std::string MakeBashCases(const CommandHelp& command)
                 continue;
             const std::string how = IsDirectory(option) ? "-d" : "-W '" + FindChoices(option) + "'";
             for (const std::string& name : FindNames(option))
-                cases += "        '" + command.name + " " + name + "') _mcbin_offer " + how + "; return ;;\n";
+                cases += fmt::format("        '{} {}') _mcbin_offer {}; return ;;\n", command.name, name, how);
         }
     }
     return cases;
