@@ -52,7 +52,7 @@ Spool::Spool(BlockSource& source, const std::vector<Field>& fields, const std::s
     for (const Field& field : fields)
     {
         std::vector<double> newCodes;
-        if (field.use == Field::Use::kCategory)
+        if (field.use == Field::Use::kCategory && !field.isComplete)
         {
             for (const std::size_t rank : field.GetRanks()) newCodes.push_back(static_cast<double>(rank));
         }
