@@ -72,6 +72,7 @@ struct Variable
     std::optional<RareCategories> rare;              ///< of a categorical variable that has such
     std::string orderTarget;                         ///< of CategoryOrder::kRate: the name of the target
     WeightRounding rounding = WeightRounding::kNone; ///< of a weight
+    bool isScaledToRecords = false;   ///< of a weight: it sums to the number of records that have one above 0
     std::optional<double> weightGrid; ///< of a weight: of what its values were made multiples, if one had to move
     std::vector<std::string>
         missingTexts; ///< of a string-categorical variable all; of others those that are no numbers

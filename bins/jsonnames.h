@@ -35,6 +35,9 @@ inline constexpr Names<BinRow::Kind, 4> kRowNames = {{"bin", BinRow::Kind::kBin}
                                                      {"unseen", BinRow::Kind::kUnseen},
                                                      {"total", BinRow::Kind::kTotal}};
 
+/// What weights are scaled to; what is not has no name.
+inline constexpr Names<bool, 1> kScaleNames = {{"rows", true}};
+
 /// Whether cut points are rounded; those that are not have no name.
 inline constexpr Names<bool, 1> kRoundNames = {{"auto", true}};
 

@@ -92,6 +92,8 @@ private:
                 name.Refuse(Quote(Shorten(name.GetString())) + " is not known here");
             variable.rounding = *rounding;
         }
+        if (const auto scale = json.Find("scale"); scale && !scale->IsNull())
+            variable.isScaledToRecords = scale->Choose(kScaleNames);
         if (const auto grid = json.Find("grid"))
             variable.weightGrid = grid->GetNumber();
     }

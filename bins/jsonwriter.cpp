@@ -89,7 +89,7 @@ JsonValue ToValue(const Variable& variable)
 {
     const bool isWeight = variable.role == VariableRole::kWeight;
     const char* const valueKind = GetName(kValueKindNames, variable.valueKind);
-    return Object{{"name", variable.name},
+    Object object{{"name", variable.name},
                   {"label", variable.label},
                   {"kind", GetName(kKindNames, variable.kind)},
                   {"role", GetName(kRoleNames, variable.role)},
@@ -102,6 +102,9 @@ JsonValue ToValue(const Variable& variable)
                   {"missing", MakeMissing(variable)},
                   {"value_kind", valueKind ? JsonValue(valueKind) : JsonValue()},
                   {"time_zone", variable.timeZone}};
+    if (variable.isScaledToRecords)
+        object.push_back({"scale", GetName(kScaleNames, true)});
+    return object;
 }
 
 JsonValue ToValue(const std::optional<Evidence>& evidence, double Evidence::*figure)

@@ -50,7 +50,8 @@ int ComputeExponent(const WeightTally& tally)
     constexpr int kBitsOfSum = 52;
     if (tally.numPositive <= 0)
         return kLeastExponent;
-    const int exponent = CeilLog2OfProduct(static_cast<double>(tally.numPositive), tally.largest) - kBitsOfSum;
+    const int exponent =
+        CeilLog2OfProduct(static_cast<double>(tally.numPositive), tally.largest * tally.scale) - kBitsOfSum;
     return std::clamp(exponent, kLeastExponent, std::numeric_limits<double>::max_exponent - 1);
 }
 
@@ -80,7 +81,13 @@ void WeightTally::Add(double weight)
     largest = std::max(largest, rounded);
 }
 
-WeightGrid::WeightGrid(const WeightTally& tally) : fRounding(tally.rounding)
+void WeightTally::ScaleToRecords(double total)
+{
+    if (total > 0.0)
+        scale = static_cast<double>(numPositive) / total;
+}
+
+WeightGrid::WeightGrid(const WeightTally& tally) : fRounding(tally.rounding), fScale(tally.scale)
 {
     const int exponent = ComputeExponent(tally);
     const int exponents[] = {exponent / 2, exponent - exponent / 2};
@@ -96,14 +103,15 @@ double WeightGrid::Round(double weight)
     const double rounded = RoundToWhole(weight, fRounding);
     if (!(rounded > 0.0))
         return 0.0;
+    const double scaled = rounded * fScale;
     // In units of g a weight is at most 2^52, and from 2^52 on doubles are whole, so adding 2^52 rounds as nearbyint
     // does, in a fraction of its time. Where a product is a denormal and loses digits, it is far below half a unit.
     constexpr double kWholeFrom = 4503599627370496.0;
-    const double units = std::max(1.0, rounded * fInverses[0] * fInverses[1] + kWholeFrom - kWholeFrom);
+    const double units = std::max(1.0, scaled * fInverses[0] * fInverses[1] + kWholeFrom - kWholeFrom);
     double onGrid = units * fFactors[0] * fFactors[1];
     if (std::isinf(onGrid)) // the largest doubles lie nearest to 2^1024, which is none
         onGrid = (units - 1.0) * fFactors[0] * fFactors[1];
-    fHasMoved = fHasMoved || onGrid != rounded;
+    fHasMoved = fHasMoved || onGrid != scaled;
     return onGrid;
 }
 

@@ -27,14 +27,19 @@ struct WeightTally
     WeightRounding rounding = WeightRounding::kNone;
     std::int64_t numPositive = 0; ///< records whose weight, rounded, is above 0
     double largest = 0.0;         ///< of the rounded weights
+    double scale = 1.0;           ///< by which the rounded weights are multiplied before they are put on the grid
 
     /// `weight` is finite, not rounded yet, and not missing.
     void Add(double weight);
+
+    /// Scales the weights to sum to the number of records whose weight is above 0, but for the last digits.
+    /// \param total the sum of all weights on the grid that they have before they are scaled.
+    void ScaleToRecords(double total);
 };
 
 /// Rounds weights so that every sum of them is exact, in whatever order it is made.
 ///
-/// With n records whose weight is above 0, and a largest weight w, the grid holds the multiples of
+/// With n records whose weight is above 0, and a largest weight w, once they are scaled, the grid holds the multiples of
 ///
 ///     g = 2^(ceil(log2(n w)) - 52)
 ///
@@ -51,8 +56,8 @@ public:
     /// The grid for the weights that were tallied. Without a positive weight among them no weight moves.
     explicit WeightGrid(const WeightTally& tally);
 
-    /// The weight that the library is to count: rounded as the tally says, and then to the nearest multiple of g, of
-    /// two equally near ones to the even one. `weight` is finite, at least 0, and one of those tallied.
+    /// The weight that the library is to count: rounded and scaled as the tally says, and then to the nearest multiple
+    /// of g, of two equally near ones to the even one. `weight` is finite, at least 0, and one of those tallied.
     double Round(double weight);
 
     /// g, if a weight has moved because of it; nothing as long as all weights lay on the grid.
@@ -63,6 +68,7 @@ public:
 
 private:
     WeightRounding fRounding;
+    double fScale;
     // g as the product of two powers of two, which are in the middle of the range of doubles, and so are their
     // inverses.
     double fFactors[2];

@@ -169,6 +169,7 @@ private:
         weight->kind = VariableKind::kWeight;
         weight->role = VariableRole::kWeight;
         weight->rounding = fOptions.columns.rounding;
+        weight->isScaledToRecords = fOptions.columns.isWeightScaled;
         return weight;
     }
 

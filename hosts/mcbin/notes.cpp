@@ -36,7 +36,7 @@ std::string DescribeWeights(double weight, long records)
 {
     return fmt::format("note: {} records have weights that sum to {}, and the criterion takes a weight as a number of "
                        "records, so it cuts {} readily than {} records would justify; where the weights are no such "
-                       "numbers, scale them to a sum of {}",
+                       "numbers, --weight-scale rows makes them sum to {}",
                        records, FormatWeight(weight), weight > static_cast<double>(records) ? "more" : "less", records,
                        records);
 }

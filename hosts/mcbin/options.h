@@ -17,6 +17,7 @@ struct ColumnOptions
     std::string target; ///< a name, not a pattern; empty without one
     std::string weight; ///< a name, not a pattern; empty without one
     WeightRounding rounding = WeightRounding::kNone;
+    bool isWeightScaled = false;         ///< to sum to the number of rows with a weight
     std::vector<std::string> attributes; ///< empty: all columns of numbers
     std::vector<std::string> exclude;
     std::vector<std::string> categorical;

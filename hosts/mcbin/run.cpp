@@ -64,6 +64,7 @@ Outcome FindBins(TableReader& table, const BinOptions& options, Progress& progre
 {
     ColumnPlan plan = PlanColumns(table, options.columns);
     ProfileTable(table, plan, progress, care);
+    ScaleWeights(table, plan, progress);
     OrderCategories(table, plan, progress);
     Variables variables = MakeVariables(plan);
     Outcome outcome;

@@ -136,7 +136,7 @@ TEST_F(McbinMessages, WeightsFarFromTheNumberOfRecordsGetANote)
     EXPECT_EQ("", RunOn(data, "supervised", "--target y --weight w").err);
     EXPECT_EQ("mcbin: note: 5 records have weights that sum to 13, and the criterion takes a weight as a number of "
               "records, so it cuts more readily than 5 records would justify; where the weights are no such numbers, "
-              "scale them to a sum of 5\n",
+              "--weight-scale rows makes them sum to 5\n",
               RunOn(data, "supervised", "--target y --weight v").err);
     EXPECT_EQ("", RunOn(data, "equal-frequency", "--bins 2 --weight v").err);
     EXPECT_EQ("", RunOn("x,w,y\n1,1,a\n2,1,a\n3,.5,b\n4,.5,b\n5,1,b\n", "supervised", "--target y --weight w").err);

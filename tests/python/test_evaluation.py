@@ -23,7 +23,8 @@ def people() -> pd.DataFrame:
     rng = np.random.default_rng(5)
     age = rng.integers(18, 80, 3000).astype(float)
     frame = pd.DataFrame({"age": age, "town": rng.choice(["north", "south", "west"], 3000), "w": rng.random(3000)})
-    frame["y"] = np.where(age + 20 * rng.normal(size=3000) + 9 * (frame["town"] == "west") > 50, "yes", "no")
+    younger = 9 * (frame["town"] == "north")  # and so the order of the towns is not that of their names
+    frame["y"] = np.where(age + 20 * rng.normal(size=3000) - younger > 50, "yes", "no")
     frame.loc[::17, "age"] = np.nan
     frame["w"] = frame["w"].astype("Float64")
     frame.loc[::23, "w"] = pd.NA
@@ -225,3 +226,54 @@ def test_rounded_cut_points_move_no_record(people, closed, weight):
     assert equal.transform(people).equals(plain.transform(people)) and not same(equal["age"], plain["age"])
     with pytest.raises(ValueError, match="round must be 'auto' or None, not 'up'"):
         mb.supervised_bins(people, "y", round="up")
+
+
+def test_weights_that_are_scaled_sum_to_the_number_of_records(people, mcbin, tmp_path):
+    people["w"] *= 40.0
+    people["y"] = people["y"].map({"yes": "buys", "no": "stays"})  # DuckDB reads these in a file as truth values
+    people.loc[::31, "w"] = 0.0
+    path = tmp_path / "people.csv"
+    people.to_csv(path, index=False)
+    sources = {
+        **{name: form(people) for name, form in FORMS.items()},
+        "another order": people.sample(frac=1.0, random_state=1),
+        "a file": path,
+    }
+
+    def bin_scaled(data: object, **settings: object) -> mb.BinningResult:
+        return mb.supervised_bins(data, "y", ["age", "town"], "w", weight_scale="rows", **settings)
+
+    found = {name: bin_scaled(data) for name, data in sources.items()}
+    found["an engine"] = bin_scaled(sources["DuckDB"], reduce="engine")
+    heavy = mb.supervised_bins(people, "y", ["age", "town"], "w")
+    call = [mcbin, "supervised", path, "--target", "y", "--attributes", "age,town", "--weight", "w", "--format", "json"]
+    told = subprocess.run([*call, "--weight-scale", "rows"], capture_output=True, text=True, check=True)
+    assert told.stderr == "" and told.stdout == found["a file"].to_json()
+
+    for name, bins in found.items():
+        assert bins["age"].weight_with_missing == pytest.approx((people["w"] > 0).sum(), rel=1e-12), name
+        assert 1 < bins["age"].n_bins < heavy["age"].n_bins, name
+        assert same(bins["age"], found["pandas"]["age"]) and same(bins["town"], found["pandas"]["town"]), name
+        again = mb.BinningResult.from_json(bins.to_json())
+        assert [variable.weight_scale for variable in again.variables if variable.role == "weight"] == ["rows"]
+    for data in (
+        people,
+        FORMS["a stream"](people),
+        duckdb.from_df(people),
+        mb.query_source(duckdb_query(people), "duckdb", "people"),
+    ):
+        for key, evaluated in found["pandas"].evaluate(data).items():
+            assert same(evaluated.second, found["pandas"][key])
+    (tmp_path / "bins.json").write_text(told.stdout)
+    evaluated = subprocess.run([mcbin, "evaluate", tmp_path / "bins.json", path, "--save", tmp_path / "again.json"])
+    again = mb.BinningResult.from_json(tmp_path / "again.json")
+    assert evaluated.returncode == 0 and all(same(again[key], found["pandas"][key]) for key in again)
+    with pytest.raises(ValueError, match="weight_scale must be 'rows' or None, not 'cases'"):
+        mb.supervised_bins(people, "y", weight="w", weight_scale="cases")
+
+
+def duckdb_query(frame: pd.DataFrame):
+    """What runs a query over a table with the name people."""
+    connection = duckdb.connect()
+    connection.register("people", frame)
+    return lambda sql: connection.sql(sql).to_arrow_table()

@@ -34,6 +34,15 @@ void AddRounding(CLI::App& command, ColumnOptions& columns)
             ->option_text("none|truncate|closest")
             ->group(isTold ? "Columns" : "");
     }
+    command
+        .add_option_function<std::string>(
+            "--weight-scale", [&columns](const std::string&) { columns.isWeightScaled = true; },
+            "rows: weights are scaled to sum to the number of rows that have one above 0, so that the criterion sees "
+            "as "
+            "much evidence as there is; for those of a survey")
+        ->check(CLI::IsMember({"rows"}))
+        ->option_text("rows")
+        ->group("Columns");
 }
 
 } // namespace

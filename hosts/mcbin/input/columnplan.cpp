@@ -343,6 +343,7 @@ ColumnPlan PlanColumns(const TableReader& table, const ColumnOptions& options)
     plan.isByRate = options.areTextsBinned;
     plan.rareShare = options.rareShare;
     plan.weights.rounding = options.rounding;
+    plan.isWeightScaled = options.isWeightScaled;
     for (const std::string& name : table.GetColumnNames())
     {
         plan.columns.emplace_back();

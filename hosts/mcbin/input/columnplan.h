@@ -78,7 +78,8 @@ struct ColumnPlan
     NumberForm numbers;          ///< how they are written
     bool isBadMissing = false;
     long numRows = 0;
-    WeightTally weights;       ///< of all rows, if a column holds weights
+    WeightTally weights; ///< of all rows, if a column holds weights
+    bool isWeightScaled = false;
     long numWithoutWeight = 0; ///< rows whose weight is missing
 
     /// Whether the field stands for a missing value as text, before it is looked at as a number.

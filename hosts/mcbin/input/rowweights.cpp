@@ -40,6 +40,13 @@ RowWeights::RowWeights(TableReader& table, const Variable& weight, const std::ve
     }
     table.Rewind();
     fGrid.emplace(tally);
+    if (!weight.isScaledToRecords)
+        return;
+    double total = 0.0;
+    while (const CsvRow* const row = table.NextRow()) total += Get(*row).value_or(0.0);
+    table.Rewind();
+    tally.ScaleToRecords(total);
+    fGrid.emplace(tally);
 }
 
 std::optional<double> RowWeights::Get(const CsvRow& row)

@@ -11,6 +11,7 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <cmath>
 #include <string>
 #include <string_view>
@@ -165,4 +166,26 @@ void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care
         if (column.IsUsed())
             SettleKind(column, plan);
     }
+}
+
+void ScaleWeights(TableReader& table, ColumnPlan& plan, Progress& progress)
+{
+    const auto isWeight = [](const Column& column) { return column.isWeight; };
+    const auto column = std::find_if(plan.columns.begin(), plan.columns.end(), isWeight);
+    if (!plan.isWeightScaled || column == plan.columns.end())
+        return;
+    const auto position = static_cast<std::size_t>(column - plan.columns.begin());
+    WeightGrid grid(plan.weights);
+    double total = 0.0;
+    table.Rewind();
+    progress.BeginRows("summing the weights");
+    while (const CsvRow* const row = table.NextRow())
+    {
+        progress.CountRow();
+        const std::string_view field = (*row)[position];
+        const double weight = plan.IsMissing(*column, field) ? 0.0 : plan.numbers.Parse(field);
+        if (ColumnPlan::IsWeight(*column, weight))
+            total += grid.Round(weight);
+    }
+    plan.weights.ScaleToRecords(total);
 }

@@ -29,4 +29,7 @@ enum class Care
 ///        name and is text.
 void ProfileTable(TableReader& table, ColumnPlan& plan, Progress& progress, Care care);
 
+/// Reads the table once more for the scale of its weights, if they are to be scaled.
+void ScaleWeights(TableReader& table, ColumnPlan& plan, Progress& progress);
+
 #endif

@@ -100,7 +100,10 @@ Variable DescribeVariable(const Column& column, const Categories* categories, co
     variable.role = GetRole(column, !plan.pairs.empty());
     variable.kind = GetKind(column, categories);
     if (column.isWeight)
+    {
         variable.rounding = plan.weights.rounding;
+        variable.isScaledToRecords = plan.isWeightScaled;
+    }
     if (categories)
         variable.categories = categories->GetNames();
     if (variable.kind == VariableKind::kStringCategorical)

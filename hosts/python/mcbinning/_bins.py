@@ -52,6 +52,8 @@ class Variable:
     """The categories that share a code, as each has too little weight; unseen ones have it as well."""
     rare_code: int | None = None
     """That code; None where there is none."""
+    weight_scale: str | None = None
+    """Of a weight: `"rows"` if it is scaled to sum to the number of records."""
 
     @classmethod
     def from_core(cls, core: _core.Variable) -> Variable:
@@ -72,6 +74,7 @@ class Variable:
             core.order_target,
             tuple(core.rare),
             core.rare_code,
+            core.weight_scale,
         )
 
     @property

@@ -48,6 +48,7 @@ class Variable:
     time_zone: str
     categories: list[str] | list[float] | None
     rounding: str | None
+    weight_scale: str | None
     grid: float | None
     category_order: str | None
     order_target: str | None
@@ -185,6 +186,7 @@ class Feed:
         column: int = -1,
         array: npt.NDArray[Any] | None = None,
         rounding: str = "none",
+        scaled: bool = False,
         optional: bool = False,
     ) -> int:
         """The index of the field."""
@@ -206,7 +208,9 @@ class Feed:
     def categories(self, index: int) -> list[str] | list[float]: ...
     def learn(self) -> None: ...
     def weights(self) -> tuple[int, float]: ...
-    def set_weights(self, weights: tuple[int, float]) -> None: ...
+    def set_weights(self, weights: tuple[int, float], scale: float = 1.0) -> None: ...
+    def scale_weights(self) -> float:
+        """Reads the records, whose weights are known, and scales these to sum to the number of records."""
     def read(self, max_rows: int) -> list[_Floats]: ...
     def spool(self, directory: str) -> None: ...
     def count(

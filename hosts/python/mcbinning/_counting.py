@@ -101,15 +101,24 @@ class _Fields:
         weight = next((key for key in self._fields if key[0] == "weight"), None)
         if weight is None:
             return self._make_feed(self._fields)
+        is_scaled = self._fields[weight].weight_scale is not None
         if self._source.is_once:
             feed = self._make_feed(self._fields)
             feed.spool(directory)
+            if is_scaled:
+                feed.scale_weights()
             return feed
         weights = self._make_feed([weight])
         weights.learn()
+        scale = self._find_scale(weight, weights.weights()) if is_scaled else 1.0
         feed = self._make_feed(self._fields)
-        feed.set_weights(weights.weights())
+        feed.set_weights(weights.weights(), scale)
         return feed
+
+    def _find_scale(self, weight: tuple[str, str], known: tuple[int, float]) -> float:
+        feed = self._make_feed([weight])
+        feed.set_weights(known)
+        return feed.scale_weights()
 
     def _make_feed(self, keys: Any) -> _core.Feed:
         table = self._source.open(list(dict.fromkeys(name for _, name in keys)))

@@ -54,7 +54,9 @@ def _weights_of(weight: tuple[Variable, str] | None) -> Weights:
         return Weights(None)
     variable, name = weight
     rounding: Any = variable.rounding or "none"
-    return Weights(name, rounding, variable.missing_values, variable.missing_interval)
+    return Weights(
+        name, rounding, variable.missing_values, variable.missing_interval, variable.weight_scale is not None
+    )
 
 
 class _Counter:

@@ -15,7 +15,7 @@ from ._result import BinningResult
 from ._runs import run
 from ._settings import Reducing, RunSettings, check_settings, check_share, directory_of
 from ._sources import name_of
-from ._types import CategoryOrder, Closed, Distinct, MemoryLimit, Missing, Reduce, Round, Rounding
+from ._types import CategoryOrder, Closed, Distinct, MemoryLimit, Missing, Reduce, Round, Rounding, WeightScale
 
 
 def supervised_bins(
@@ -35,6 +35,7 @@ def supervised_bins(
     smoothing: float = 0.5,
     round: Round | None = None,
     rounding: Rounding = "none",
+    weight_scale: WeightScale | None = None,
     reduce: Reduce | None = None,
     max_groups: int = 20_000_000,
     distinct: Distinct = "exact",
@@ -98,6 +99,9 @@ def supervised_bins(
         Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
         two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
         Among a million records a weight moves by less than one part in 10^9 of the largest.
+    weight_scale : {"rows"}, default=None
+        "rows": the weights are scaled to sum to the number of records that have one above 0, so that the criterion sees
+        as much evidence as there is; for the weights of a survey. The weights are read once more for it.
     reduce : {"rows", "engine", "auto"}, default=None
         Where the records become groups of equal values, of which the bins are made; these are the same to the last bit.
         "rows": all rows are read, as they are by default. "engine": the engine of the data sums the weights of each
@@ -166,7 +170,16 @@ def supervised_bins(
         raise TypeError("either target or pairs must be given")
     if pairs is not None and attributes is not None:
         raise TypeError("pairs name the attributes, so attributes can't be given, too")
-    check_settings(closed, n_bins, max_distinct, small_bin_ratio, rounding=rounding, smoothing=smoothing, round=round)
+    check_settings(
+        closed,
+        n_bins,
+        max_distinct,
+        small_bin_ratio,
+        rounding=rounding,
+        smoothing=smoothing,
+        round=round,
+        weight_scale=weight_scale,
+    )
     order = name_orders(category_order)
     check_share("rare", rare)
     reducing = Reducing(reduce, max_groups, distinct)
@@ -186,6 +199,7 @@ def supervised_bins(
         rounding,
         optional=frozenset() if is_chosen else texts_of(source, [target, weight, *named_in(order)]),
         category_order=order,
+        weight_scale=weight_scale,
         rare=rare,
         left_out={} if is_chosen else columns_left_out(source, [target, weight], True),
     )
@@ -207,6 +221,7 @@ def equal_frequency_bins(
     closed: Closed = "right",
     round: Round | None = None,
     rounding: Rounding = "none",
+    weight_scale: WeightScale | None = None,
     reduce: Reduce | None = None,
     max_groups: int = 20_000_000,
     distinct: Distinct = "exact",
@@ -248,6 +263,8 @@ def equal_frequency_bins(
         Whether weights become whole numbers, and how. "none": they count with their fractions, but for a last digit or
         two, as they are put on a grid on which every sum is exact. So the order of the records makes no difference.
         Among a million records a weight moves by less than one part in 10^9 of the largest.
+    weight_scale : {"rows"}, default=None
+        "rows": the weights are scaled to sum to the number of records that have one above 0.
     reduce : {"rows", "engine", "auto"}, default=None
         Whether an engine reduces the records; see `supervised_bins`.
     max_groups : int, default=20000000
@@ -291,7 +308,7 @@ def equal_frequency_bins(
     >>> bins["income"].weights.tolist()
     [25.0, 25.0, 25.0, 25.0]
     """
-    check_settings(closed, n_bins, rounding=rounding, round=round)
+    check_settings(closed, n_bins, rounding=rounding, round=round, weight_scale=weight_scale)
     check_share("rare", rare)
     reducing = Reducing(reduce, max_groups, distinct)
     source = open_source(data, Reading(memory_limit=memory_limit, threads=threads, temp_dir=temp_dir))
@@ -305,6 +322,7 @@ def equal_frequency_bins(
         name_missing(missing),
         rounding,
         category_order="text" if category_order is None else name_orders(category_order),
+        weight_scale=weight_scale,
         rare=rare,
         left_out=columns_left_out(source, [weight], False) if attributes is None else {},
     )

@@ -11,7 +11,7 @@ import numpy as np
 from . import _core, _values
 from ._errors import DataError
 from ._sources import Column, Source, check_names, name_of
-from ._types import CategoryOrder, Missing, Rounding
+from ._types import CategoryOrder, Missing, Rounding, WeightScale
 
 
 def names_to_bin(source: Source, attributes: Any, others: Sequence[str | None], has_target: bool) -> list[str]:
@@ -118,6 +118,7 @@ class Plan:
     optional: frozenset[str] = frozenset()
     """Columns of text that nobody has named. They are binned if they can be."""
     category_order: CategoryOrder = "rate"
+    weight_scale: WeightScale | None = None
     rare: float = 0.0
     """Categories that have no order of their own, and less than this share of the weight, have a code together."""
     left_out: Mapping[str, str] = field(default_factory=dict)
@@ -161,6 +162,8 @@ class Plan:
         if self.source.is_once:
             feed = self._feed_columns(self.names)
             feed.spool(directory)
+            if self.is_scaled:
+                feed.scale_weights()
             plan = self.settle({name: feed.describe_unusable(self.names.index(name)) for name in self.optional})
             self._drop(feed, plan)
             for name in plan.categorical:
@@ -172,12 +175,13 @@ class Plan:
         else:
             known = self._feed_columns(to_learn)
             known.learn()
+            scale = self._find_scale(known.weights()) if self.is_scaled else 1.0
             plan = self.settle({name: known.describe_unusable(categorical.index(name)) for name in self.optional})
             categories = {name: known.categories(categorical.index(name)) for name in plan.categorical}
 
             def feed_columns(names: list[str]) -> _core.Feed:
                 feed = plan._feed_columns(names)
-                feed.set_weights(known.weights())
+                feed.set_weights(known.weights(), scale)
                 for name, found in categories.items():
                     if name in names:
                         feed.set_categories(names.index(name), found)
@@ -191,6 +195,16 @@ class Plan:
             feed = feed_columns(plan.names)
         plan.set_codes(feed, plan.names, codes)
         return plan, feed
+
+    @property
+    def is_scaled(self) -> bool:
+        return self.weight is not None and self.weight_scale is not None
+
+    def _find_scale(self, weights: tuple[int, float]) -> float:
+        assert self.weight is not None
+        feed = self._feed_columns([self.weight])
+        feed.set_weights(weights)
+        return feed.scale_weights()
 
     def _drop(self, feed: _core.Feed, kept: Plan) -> None:
         """Leaves out of a feed of the plan's columns what another plan lacks."""
@@ -299,6 +313,7 @@ class Plan:
                 self._use(name),
                 column=positions.index(name),
                 rounding=self.rounding,
+                scaled=self.is_scaled and name == self.weight,
                 optional=name in self.optional,
             )
             values, interval = self.missing_of(name)

@@ -137,7 +137,7 @@ def _reporting_progress(engine: Engine, report: Report | None) -> Iterator[None]
 def _tally(plan: Plan, queries: CountedQueries) -> Tally:
     if plan.weight is None:
         return tally_weights(Weights(None), queries)
-    return tally_weights(Weights(plan.weight, plan.rounding, *plan.missing_of(plan.weight)), queries)
+    return tally_weights(Weights(plan.weight, plan.rounding, *plan.missing_of(plan.weight), plan.is_scaled), queries)
 
 
 @dataclass(frozen=True)

@@ -60,6 +60,7 @@ def check_settings(
     rounding: str = "none",
     smoothing: float = 0.5,
     round: str | None = None,
+    weight_scale: str | None = None,
 ) -> None:
     if closed not in ("right", "left"):
         raise ValueError(f"closed must be 'right' or 'left', not {closed!r}")
@@ -71,6 +72,8 @@ def check_settings(
         raise ValueError(f"smoothing must be a finite number of at least 0, not {smoothing}")
     if round not in (None, "auto"):
         raise ValueError(f"round must be 'auto' or None, not {round!r}")
+    if weight_scale not in (None, "rows"):
+        raise ValueError(f"weight_scale must be 'rows' or None, not {weight_scale!r}")
     if rounding not in ("none", "truncate", "closest"):
         raise ValueError(f"rounding must be 'none', 'truncate' or 'closest', not {rounding!r}")
 

@@ -60,6 +60,10 @@ class Weights:
     rounding: Rounding = "none"
     missing_values: Sequence[float] = ()
     missing_interval: tuple[float, float] | None = None
+    is_scaled: bool = False
+    """To sum to the number of rows that count."""
+    scale: float = 1.0
+    """By which they are, once it is known."""
     grid: tuple[float, float] | None = None
     """The step of the grid as the product of two powers of two; None where no weight has to move."""
 
@@ -84,13 +88,17 @@ class Weights:
         return f"CASE WHEN {self.raw} < {double(2.0**52)} THEN CAST(FLOOR({down}) AS DOUBLE) ELSE {self.raw} END"
 
     @property
+    def scaled(self) -> str:
+        return self.rounded if self.scale == 1.0 else f"({self.rounded}) * {double(self.scale)}"
+
+    @property
     def on_grid(self) -> str:
         """As WeightGrid::Round() in C++ has it: the nearest multiple of the step, of two the even one, and never 0."""
         if self.grid is None:
-            return self.rounded
+            return self.scaled
         coarse, fine = self.grid
         whole_from = double(2.0**52)
-        units = f"({self.rounded}) * {double(1.0 / coarse)} * {double(1.0 / fine)} + {whole_from} - {whole_from}"
+        units = f"({self.scaled}) * {double(1.0 / coarse)} * {double(1.0 / fine)} + {whole_from} - {whole_from}"
         # The largest doubles lie nearest to 2^1024, which is none.
         most = 2.0**52 if 2.0**52 * coarse * fine <= LARGEST else 2.0**52 - 1.0
         return f"LEAST(GREATEST({units}, {double(1.0)}), {double(most)}) * {double(coarse)} * {double(fine)}"
@@ -128,7 +136,7 @@ def check_weights(weights: Weights) -> str:
 
 def sum_weights(weights: Weights) -> str:
     """A row with the sum of all weights, and the number of those that the grid has moved."""
-    moved = f"SUM(CASE WHEN {weights.on_grid} <> {weights.rounded} THEN 1 ELSE 0 END)"
+    moved = f"SUM(CASE WHEN {weights.on_grid} <> {weights.scaled} THEN 1 ELSE 0 END)"
     return f"SELECT SUM({weights.on_grid}) AS total, {moved} AS moved FROM {ROWS} WHERE {weights.counts}"
 
 

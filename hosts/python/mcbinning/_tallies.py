@@ -4,6 +4,7 @@ from __future__ import annotations
 
 import math
 from dataclasses import dataclass, replace
+from typing import Any
 
 import pyarrow as pa
 
@@ -40,15 +41,26 @@ def tally_weights(weights: Weights, queries: CountedQueries) -> Tally:
         if found[fault]:
             number = int(found[fault])
             raise DataError(f"{number} weights are {words}" if number > 1 else f"one weight is {words}", weights.column)
-    grid = _core.grid_factors(int(found["positive"]), float(found["largest"]))
-    on_grid = replace(weights, grid=grid if found["positive"] else None)
-    sums = queries.row(_shapes.sum_weights(on_grid))
+    on_grid, sums = _sum_on_grid(weights, found, queries)
+    if weights.is_scaled and found["positive"]:
+        weights = replace(weights, scale=int(found["positive"]) / float(sums["total"]))
+        on_grid, sums = _sum_on_grid(weights, found, queries)
     if not math.isfinite(sums["total"]):
         raise DataError("the weights sum to more than any number", weights.column)
     counts = int(found["records"]), int(found["without_weight"])
     if not sums["moved"]:
         return Tally(*counts, float(sums["total"]), weights, None)
-    return Tally(*counts, float(sums["total"]), on_grid, grid[0] * grid[1])
+    assert on_grid.grid is not None
+    return Tally(*counts, float(sums["total"]), on_grid, math.prod(on_grid.grid))
+
+
+def _sum_on_grid(weights: Weights, found: dict[str, Any], queries: CountedQueries) -> tuple[Weights, dict[str, Any]]:
+    """The weights, of which `check_weights` has told, on their grid, and what `sum_weights` tells of them."""
+    if not found["positive"]:
+        return weights, queries.row(_shapes.sum_weights(weights))
+    grid = _core.grid_factors(int(found["positive"]), float(found["largest"]) * weights.scale)
+    on_grid = replace(weights, grid=grid)
+    return on_grid, queries.row(_shapes.sum_weights(on_grid))
 
 
 def number_of(attribute: str, schema: pa.Schema, engine: Engine) -> str | None:

@@ -271,6 +271,7 @@ void BindVariable(nb::module_& module)
                          return self.role == VariableRole::kWeight ? std::optional<std::string>(GetName(self.rounding))
                                                                    : std::nullopt;
                      })
+        .def_prop_ro("weight_scale", [](const Variable& self) { return GetName(kScaleNames, self.isScaledToRecords); })
         .def_ro("grid", &Variable::weightGrid)
         .def_ro("missing_texts", &Variable::missingTexts)
         .def_ro("missing_numbers", &Variable::missingNumbers)

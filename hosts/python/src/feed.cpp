@@ -134,10 +134,12 @@ WeightTally Tally(BlockSource& source, std::vector<Field>& fields)
 } // namespace
 
 std::size_t Feed::AddField(const std::string& name, const std::string& use, int column,
-                           const std::optional<Array>& array, const std::string& rounding, bool isOptional)
+                           const std::optional<Array>& array, const std::string& rounding, bool isScaled,
+                           bool isOptional)
 {
     Field field;
     field.isOptional = isOptional;
+    field.isScaledToRecords = isScaled;
     field.name = name;
     field.use = UseOf(use);
     field.column = array ? -1 : column;
@@ -264,9 +266,32 @@ std::pair<std::int64_t, double> Feed::GetWeights() const
     return {fWeights.value().numPositive, fWeights.value().largest};
 }
 
-void Feed::SetWeights(const std::pair<std::int64_t, double>& weights)
+void Feed::SetWeights(const std::pair<std::int64_t, double>& weights, double scale)
 {
-    fWeights = WeightTally{WeightRounding::kNone, weights.first, weights.second};
+    fWeights = WeightTally{WeightRounding::kNone, weights.first, weights.second, scale};
+}
+
+double Feed::ScaleWeights()
+{
+    const std::size_t index = FindWeight(fFields).value();
+    std::optional<TableBlocks> table;
+    LibraryBlocks blocks(OpenBlocks(table), fFields, GetTally());
+    double total = 0.0;
+    {
+        const nb::gil_scoped_release released;
+        PolledBlocks polled(blocks);
+        Block block(fFields.size());
+        while (polled.Next(block))
+        {
+            for (std::size_t row = 0; row < block.numRows; ++row)
+            {
+                const double weight = block.At(index, row);
+                total += weight == MCMV::gMissingValue ? 0.0 : weight;
+            }
+        }
+    }
+    fWeights->ScaleToRecords(total);
+    return fWeights->scale;
 }
 
 void Feed::Learn()

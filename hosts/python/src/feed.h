@@ -39,7 +39,7 @@ public:
     /// categories than a run takes are no error.
     /// \return its index.
     std::size_t AddField(const std::string& name, const std::string& use, int column, const std::optional<Array>& array,
-                         const std::string& rounding, bool isOptional);
+                         const std::string& rounding, bool isScaled, bool isOptional);
 
     void DeclareMissing(std::size_t index, const std::vector<double>& values,
                         std::optional<std::pair<double, double>> interval, const std::vector<std::string>& texts);
@@ -76,7 +76,11 @@ public:
     /// How many weights are above 0, and the largest. Known once the records have been read for it, and where they
     /// were read by another feed, from there.
     std::pair<std::int64_t, double> GetWeights() const;
-    void SetWeights(const std::pair<std::int64_t, double>& weights);
+    void SetWeights(const std::pair<std::int64_t, double>& weights, double scale);
+
+    /// Scales the weights, whose tally is known, to the number of records that have one above 0, for which it reads
+    /// all records. \return the scale.
+    double ScaleWeights();
 
     /// Reads the records for their categories and weights alone.
     void Learn();

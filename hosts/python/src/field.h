@@ -71,6 +71,7 @@ struct Field
 
     /// Of a weight.
     WeightRounding rounding = WeightRounding::kNone;
+    bool isScaledToRecords = false; ///< a weight
 
     BINNumericUserMissing missingNumbers;
     /// That of `missingNumbers` as it was declared: the library has the largest double for an infinite end.

@@ -66,6 +66,7 @@ std::shared_ptr<Variable> MakeVariable(const Field& field, bool isTarget)
     for (const double number : field.numbers.GetKeys(field.isComplete))
         variable->categories.push_back(FormatCategoryNumber(number));
     variable->rounding = field.rounding;
+    variable->isScaledToRecords = field.isScaledToRecords;
     variable->missingTexts = field.missingTexts.GetDiscreteValues();
     variable->missingNumbers = field.missingNumbers.GetDiscreteValues();
     variable->missingInterval = field.missingInterval;
